@@ -1,0 +1,35 @@
+# How the project's own code is compiled.
+
+function(kx_warnings target)
+    target_compile_options(${target} PRIVATE -Wall -Wextra -Wpedantic -Wshadow -Wconversion)
+    if(KX_WARNINGS_AS_ERRORS)
+        target_compile_options(${target} PRIVATE -Werror)
+    endif()
+endfunction()
+
+# Code that is built for the target too: C++98, nothing exported but what a header exports.
+function(kx_library_code target)
+    kx_warnings(${target})
+    set_target_properties(${target} PROPERTIES
+        CXX_STANDARD 98
+        CXX_STANDARD_REQUIRED ON
+        CXX_EXTENSIONS OFF
+        CXX_VISIBILITY_PRESET hidden
+        VISIBILITY_INLINES_HIDDEN ON)
+endfunction()
+
+# Code for the host alone: tools, tests.
+function(kx_host_code target)
+    kx_warnings(${target})
+    set_target_properties(${target} PROPERTIES
+        CXX_STANDARD 17
+        CXX_STANDARD_REQUIRED ON
+        CXX_EXTENSIONS OFF)
+endfunction()
+
+# Exports from a shared library what the version script names, and nothing else: hidden visibility alone
+# lets weak instances of standard templates out.
+function(kx_exports target script)
+    target_link_options(${target} PRIVATE LINKER:--version-script=${script} LINKER:--no-undefined)
+    set_property(TARGET ${target} APPEND PROPERTY LINK_DEPENDS ${script})
+endfunction()

@@ -1,0 +1,34 @@
+# Sourced by the other scripts: installs Debian packages that are missing, and only those.
+
+# need PACKAGE... — silent when all of them are there.
+need() {
+    local missing=()
+    local package
+    for package in "$@"; do
+        [ "$(dpkg-query -W -f '${db:Status-Status}' "$package" 2>/dev/null)" = installed ] ||
+            missing+=("$package")
+    done
+    [ ${#missing[@]} -gt 0 ] || return 0
+
+    local as_root=()
+    if [ "$(id -u)" -ne 0 ]; then
+        command -v sudo >/dev/null || {
+            echo "missing packages, and neither root nor sudo to install them: ${missing[*]}" >&2
+            return 1
+        }
+        as_root=(sudo)
+    fi
+    echo "installing: ${missing[*]}" >&2
+    local log
+    log=$(mktemp)
+    if ! { "${as_root[@]}" apt-get update -qq &&
+        "${as_root[@]}" env DEBIAN_FRONTEND=noninteractive \
+            apt-get install -qq -y --no-install-recommends "${missing[@]}"; } >"$log" 2>&1; then
+        cat "$log" >&2
+        rm -f "$log"
+        return 1
+    fi
+    rm -f "$log"
+}
+
+build_packages=(g++ cmake ninja-build libxml2-dev libcli11-dev)

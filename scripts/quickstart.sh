@@ -1,0 +1,44 @@
+#!/usr/bin/env bash
+# From a bare Debian 12 to values read out of a configuration file: installs what is missing, builds the
+# library and its command-line client, and shows both at work, with the commands that it runs.
+set -euo pipefail
+cd "$(dirname "$0")/.."
+. scripts/packages.sh
+
+need "${build_packages[@]}"
+
+# show COMMAND... — prints the command as one would type it, then runs it.
+show() {
+    printf '\n$'
+    local word
+    for word in "$@"; do
+        case $word in
+            *[!A-Za-z0-9_./=:-]*) printf " '%s'" "$word" ;;
+            *) printf ' %s' "$word" ;;
+        esac
+    done
+    printf '\n'
+    "$@"
+}
+
+# build — only what goes wrong is worth reading.
+quietly() {
+    local log=build/quickstart.log
+    mkdir -p build
+    printf '\n$ %s\n' "$*"
+    "$@" >"$log" 2>&1 || { cat "$log" >&2; exit 1; }
+}
+
+kxconfig=build/release/tools/kxconfig
+file=examples/data/gateway.xml
+
+quietly cmake --preset release
+quietly cmake --build --preset release
+
+show "$kxconfig" get "$file" gateway.name
+show "$kxconfig" get "$file" gateway.network.interface.address
+show "$kxconfig" get "$file" gateway.network.interface@name=eth1.address
+show "$kxconfig" get "$file" 'gateway.channels.channel@id=1|id=2.limit@level=alarm'
+show "$kxconfig" --log-mask value get "$file" gateway.time.zone
+
+printf '\nThe file is %s; try other keys, or %s --help.\n' "$file" "$kxconfig"

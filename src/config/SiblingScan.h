@@ -1,0 +1,44 @@
+#ifndef KX_CONFIG_SIBLINGSCAN_H
+#define KX_CONFIG_SIBLINGSCAN_H
+
+#include "Condition.h"
+#include "KeyPath.h"
+
+namespace kx
+{
+
+/**
+ * Visits the element children of @p node that @p segment selects, in document order.
+ *
+ * This is one level of every lookup; what becomes of an element that was selected is the visitor's
+ * affair: it is called as visitor.Accept(child).
+ *
+ * An element of another name suspends the condition: the next element that matches by name is
+ * taken as it is, and only then is the condition in force again. Clients rely on it.
+ */
+template <class Visitor>
+void ScanSiblings(const xmlNode* node, const Segment& segment, Visitor& visitor)
+{
+    bool suspended = segment.condition.IsEmpty();
+    for (xmlNode* child = node->children; child != 0; child = child->next)
+    {
+        if (child->type != XML_ELEMENT_NODE)
+        {
+            continue;
+        }
+        if (!segment.Names(child))
+        {
+            suspended = true;
+            continue;
+        }
+        if (suspended || ConditionHolds(segment.condition, child))
+        {
+            visitor.Accept(child);
+        }
+        suspended = segment.condition.IsEmpty();
+    }
+}
+
+} // namespace kx
+
+#endif

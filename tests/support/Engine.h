@@ -1,0 +1,52 @@
+#ifndef KX_TESTS_SUPPORT_ENGINE_H
+#define KX_TESTS_SUPPORT_ENGINE_H
+
+// What the library asks of the engine: the test program stands in front of some engine calls,
+// notes them and passes them on.
+
+#include <libxml/tree.h>
+
+#include <cstddef>
+#include <string>
+#include <vector>
+
+namespace kxtest
+{
+
+/** Notes engine calls from construction to destruction. */
+class EngineCalls
+{
+public:
+    EngineCalls();
+    ~EngineCalls();
+    EngineCalls(const EngineCalls&) = delete;
+    EngineCalls& operator=(const EngineCalls&) = delete;
+
+    /** @return how often xmlFreeDoc was called for @p document, null included. */
+    std::size_t Freed(const void* document) const;
+
+    /** @return how often xmlFreeDoc was called. */
+    std::size_t Frees() const;
+
+    /** @return the paths given to xmlParseFile. */
+    const std::vector<std::string>& Parsed() const;
+
+    /** @return the names given to xmlGetProp. */
+    const std::vector<std::string>& PropertiesRead() const;
+};
+
+/** Parses a document from memory, blanks kept; the caller frees it. */
+xmlDocPtr ParseText(const std::string& xml);
+
+/** @return the text that the engine saves for @p document: encoding UTF-8, without formatting. */
+std::string Serialized(xmlDocPtr document);
+
+/** @return the engine's complaints about the last parse, collected instead of printed. */
+std::string TakeEngineErrors();
+
+/** Called by main(): collects the engine's complaints. */
+void CollectEngineErrors();
+
+} // namespace kxtest
+
+#endif
