@@ -39,6 +39,12 @@ show "$kxconfig" get "$file" gateway.name
 show "$kxconfig" get "$file" gateway.network.interface.address
 show "$kxconfig" get "$file" gateway.network.interface@name=eth1.address
 show "$kxconfig" get "$file" 'gateway.channels.channel@id=1|id=2.limit@level=alarm'
+
+# The sample itself stays as it is: changes go into a copy.
+copy=build/gateway.xml
+show cp "$file" "$copy"
+show "$kxconfig" set "$copy" gateway.log.level debug
+show "$kxconfig" get "$copy" gateway.log.level
 show "$kxconfig" --log-mask value get "$file" gateway.time.zone
 
 printf '\nThe file is %s; try other keys, or %s --help.\n' "$file" "$kxconfig"

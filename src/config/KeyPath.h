@@ -83,6 +83,8 @@ struct KeySplit
 /** A segment split at its first "@" into an element name and a condition. */
 struct Segment
 {
+    Segment() {}
+
     explicit Segment(const TextView& text)
     {
         const size_t at = text.Find('@');

@@ -1,5 +1,7 @@
 #include "support/Engine.h"
 
+#include "support/Memory.h"
+
 #include <libxml/parser.h>
 #include <libxml/xmlerror.h>
 
@@ -17,6 +19,8 @@ std::vector<const void*> g_freed;
 std::vector<std::string> g_parsed;
 std::vector<std::string> g_properties;
 std::string g_engineErrors;
+bool g_answerSaves = false;
+int g_saveResult = 0;
 
 template <class Function>
 Function* Next(Function*, const char* name)
@@ -26,6 +30,10 @@ Function* Next(Function*, const char* name)
 
 void CollectError(void*, const char* format, ...)
 {
+    if (kxtest::EngineMemory::Failed())
+    {
+        return; // short of memory, the engine complains with text that it has freed
+    }
     char text[1024];
     va_list arguments;
     va_start(arguments, format);
@@ -66,6 +74,12 @@ extern "C" xmlChar* xmlGetProp(const xmlNode* node, const xmlChar* name)
     return engine(node, name);
 }
 
+extern "C" int xmlSaveFileEnc(const char* path, xmlDocPtr document, const char* encoding)
+{
+    static const auto engine = Next(&xmlSaveFileEnc, "xmlSaveFileEnc");
+    return g_answerSaves ? g_saveResult : engine(path, document, encoding);
+}
+
 namespace kxtest
 {
 
@@ -80,6 +94,7 @@ EngineCalls::EngineCalls()
 EngineCalls::~EngineCalls()
 {
     g_noting = false;
+    g_answerSaves = false;
 }
 
 std::size_t EngineCalls::Freed(const void* document) const
@@ -98,6 +113,12 @@ const std::vector<std::string>& EngineCalls::Parsed() const
 const std::vector<std::string>& EngineCalls::PropertiesRead() const
 {
     return g_properties;
+}
+
+void EngineCalls::AnswerSavesWith(int result)
+{
+    g_answerSaves = true;
+    g_saveResult = result;
 }
 
 xmlDocPtr ParseText(const std::string& xml)

@@ -33,6 +33,9 @@ public:
 
     /** @return the names given to xmlGetProp. */
     const std::vector<std::string>& PropertiesRead() const;
+
+    /** Makes xmlSaveFileEnc save nothing and answer with @p result, as long as the object lives. */
+    void AnswerSavesWith(int result);
 };
 
 /** Parses a document from memory, blanks kept; the caller frees it. */

@@ -8,4 +8,16 @@
 /** kxconfig get: prints the value or values under @p key in @p file, one on a line. */
 ExitStatus Get(const std::string& file, const std::string& key);
 
+struct SetArguments
+{
+    std::string file;
+    std::string key;
+    std::string value;
+    std::string output;  ///< where to save; empty: over the file
+    bool dryRun = false; ///< show what would change, and save nothing
+};
+
+/** kxconfig set: replaces text by key, prints each element that changed, and saves. */
+ExitStatus Set(const SetArguments& arguments);
+
 #endif

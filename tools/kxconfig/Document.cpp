@@ -5,7 +5,9 @@
 
 #include <cerrno>
 #include <cstring>
+#include <iomanip>
 #include <iostream>
+#include <sstream>
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -54,6 +56,13 @@ std::string WhyNotRead(const std::string& path)
     return S_ISREG(status.st_mode) && status.st_size == 0 ? "The file is empty" : "";
 }
 
+/** @return the name of the root element of @p document (an xmlDocPtr). */
+std::string RootName(void* document)
+{
+    const xmlNode* const root = xmlDocGetRootElement(static_cast<xmlDoc*>(document));
+    return reinterpret_cast<const char*>(root->name);
+}
+
 } // namespace
 
 void Complain(const std::string& message)
@@ -66,23 +75,78 @@ void CollectEngineComplaints()
     xmlSetStructuredErrorFunc(nullptr, KeepFirstComplaint);
 }
 
-std::string WhyNotLoaded(const std::string& path)
+std::unique_ptr<CXMLReader> LoadFile(const std::string& path, std::string& complaint)
 {
     const std::string reason = WhyNotRead(path);
     if (!reason.empty())
     {
-        return "cannot read " + path + ": " + reason;
+        complaint = "cannot read " + path + ": " + reason;
+        return nullptr;
     }
-    return path + ":" + (g_firstComplaint.empty() ? " not parsed" : g_firstComplaint);
+    g_firstComplaint.clear();
+    std::unique_ptr<CXMLReader> reader(GetCXMLReaderObject(path.c_str()));
+    if (reader == nullptr || reader->GetDataPtr() == nullptr)
+    {
+        complaint = path + ":" + (g_firstComplaint.empty() ? " not parsed" : g_firstComplaint);
+        return nullptr;
+    }
+    return reader;
 }
 
-std::string RootName(const void* document)
+std::unique_ptr<CXMLReader> LoadFile(const std::string& path)
 {
-    const xmlNode* const root = xmlDocGetRootElement(static_cast<const xmlDoc*>(document));
-    return root == nullptr ? "" : reinterpret_cast<const char*>(root->name);
+    std::string complaint;
+    std::unique_ptr<CXMLReader> reader = LoadFile(path, complaint);
+    if (reader == nullptr)
+    {
+        Complain(complaint);
+    }
+    return reader;
 }
 
-std::string RootNameOf(const std::string& key)
+ExitStatus CheckKey(const std::string& file, const std::string& key, CXMLReader& reader)
 {
-    return key.substr(0, key.find('.'));
+    const std::string::size_type dot = key.find('.');
+    if (dot == std::string::npos)
+    {
+        Complain("malformed key " + Quoted(key) +
+                 ": it names the root element and at least one more, as in root.name");
+        return ExitStatus::BadUsage;
+    }
+    const std::string root = RootName(reader.GetDataPtr());
+    if (key.substr(0, dot) != root)
+    {
+        Complain("nothing found: the key starts with " + Quoted(key.substr(0, dot)) +
+                 ", but the root element of " + file + " is " + Quoted(root));
+        return ExitStatus::NothingFound;
+    }
+    return ExitStatus::Done;
+}
+
+std::string Quoted(const std::string& text)
+{
+    std::ostringstream quoted;
+    quoted << '"';
+    for (const char c : text)
+    {
+        const auto byte = static_cast<unsigned char>(c);
+        if (c == '"' || c == '\\')
+        {
+            quoted << '\\' << c;
+        }
+        else if (c == '\n')
+        {
+            quoted << "\\n";
+        }
+        else if (byte < 0x20 || byte == 0x7F)
+        {
+            quoted << "\\x" << std::hex << std::setw(2) << std::setfill('0') << unsigned{byte};
+        }
+        else
+        {
+            quoted << c;
+        }
+    }
+    quoted << '"';
+    return quoted.str();
 }

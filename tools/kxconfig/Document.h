@@ -1,21 +1,40 @@
 #ifndef KX_TOOLS_DOCUMENT_H
 #define KX_TOOLS_DOCUMENT_H
 
+#include "ExitStatus.h"
+
+#include "CXMLReader.h"
+
+#include <memory>
 #include <string>
 
 /** Prints "kxconfig: " and @p message as one line on standard error. */
 void Complain(const std::string& message);
 
-/** Keeps the engine from printing its complaints, so that WhyNotLoaded() can tell the first. */
+/** Keeps the engine from printing its complaints: LoadFile() tells the first of them instead. */
 void CollectEngineComplaints();
 
-/** @return one line that says why the engine made no document of the file at @p path. */
-std::string WhyNotLoaded(const std::string& path);
+/**
+ * Loads a file of this machine; URLs and other names that the engine would fetch are not files.
+ *
+ * @param complaint  receives why there is no document: one line, with the line number if the file
+ * is not well-formed.
+ * @return a reader that holds a document, or null.
+ */
+std::unique_ptr<CXMLReader> LoadFile(const std::string& path, std::string& complaint);
 
-/** @return the name of the root element of @p document (an xmlDocPtr), or an empty string. */
-std::string RootName(const void* document);
+/** The same, complaining at once. */
+std::unique_ptr<CXMLReader> LoadFile(const std::string& path);
 
-/** @return the part of @p key that names the root element. */
-std::string RootNameOf(const std::string& key);
+/**
+ * Complains if @p key cannot be one, or starts with another name than the root of @p reader, which
+ * the library itself takes for success.
+ *
+ * @return Done if there is nothing to complain of.
+ */
+ExitStatus CheckKey(const std::string& file, const std::string& key, CXMLReader& reader);
+
+/** @return @p text in double quotes and on one line: control characters are written as escapes. */
+std::string Quoted(const std::string& text);
 
 #endif

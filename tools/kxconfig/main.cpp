@@ -13,13 +13,6 @@
 namespace
 {
 
-struct Arguments
-{
-    std::string file;
-    std::string key;
-    std::string logMask;
-};
-
 const char* const kFooter =
     "Examples:\n"
     "  kxconfig get device.xml cfg.name               print a value\n"
@@ -27,10 +20,14 @@ const char* const kFooter =
     "line\n"
     "  kxconfig get device.xml 'cfg.net@id=2.ip'      of the net whose attribute id is 2\n"
     "  kxconfig get device.xml 'cfg.net@id=1|id=2.ip' of either\n"
+    "  kxconfig set --dry-run device.xml cfg.name box show what would change\n"
+    "  kxconfig set device.xml cfg.name box           change it and save the file\n"
+    "  kxconfig set device.xml cfg.offset -- -5       a value that starts with a dash\n"
     "\n"
     "Exit status:\n"
-    "  0 found, 1 nothing found, 2 bad usage or malformed key, 3 file unreadable or not "
-    "well-formed\n"
+    "  0 done, 1 nothing found, 2 bad usage or malformed key, 3 file unreadable or not "
+    "well-formed,\n"
+    "  4 saving failed: the file is as it was\n"
     "\n"
     "The library's log records go to standard error. kxconfig asks for none unless --log-mask or\n"
     "the environment variable KX_LOG_MASK says otherwise.";
@@ -57,18 +54,22 @@ std::string CheckLogMask(const std::string& text)
                : "\"" + text + "\" is not a log mask; it is " + g_LogMaskHelp;
 }
 
-std::string RefuseStandardInput(const std::string& file)
+/** To the engine "-" is standard input or output; whoever writes it here means something else. */
+std::string RefuseStandardStreams(const std::string& file)
 {
-    return file == "-" ? "\"-\" would read standard input; name a file" : std::string();
+    return file == "-" ? "\"-\" is no file; name one" : std::string();
 }
 
-CLI::App* AddFileCommand(CLI::App& app, const char* name, const char* description,
-                         Arguments& arguments)
+/** A subcommand whose first two arguments are a file and a key. */
+CLI::App* AddKeyCommand(CLI::App& app, const char* name, const char* description,
+                        SetArguments& arguments)
 {
     CLI::App* const command = app.add_subcommand(name, description);
     command->add_option("FILE", arguments.file, "an XML file")
         ->required()
-        ->check(CLI::Validator(RefuseStandardInput, ""));
+        ->check(CLI::Validator(RefuseStandardStreams, ""));
+    command->add_option("KEY", arguments.key, "a key path: root.element@attribute=value.element")
+        ->required();
     return command;
 }
 
@@ -85,23 +86,30 @@ ExitStatus ReportUsage(const CLI::App& app, const CLI::ParseError& error)
 
 ExitStatus Run(int argc, char** argv)
 {
-    Arguments arguments;
+    SetArguments arguments; // "get" uses the first two
+    std::string logMask;
     std::function<ExitStatus()> command;
 
-    CLI::App app("Reads values of XML configuration files by key path.", "kxconfig");
+    CLI::App app("Reads and changes values of XML configuration files by key path.", "kxconfig");
     app.set_version_flag("--version", "kxconfig " KX_VERSION);
     app.footer(kFooter);
     app.require_subcommand(1);
     app.fallthrough();
-    app.add_option("--log-mask", arguments.logMask, std::string("log mask: ") + g_LogMaskHelp)
+    app.add_option("--log-mask", logMask, std::string("log mask: ") + g_LogMaskHelp)
         ->type_name("MASK")
         ->check(CLI::Validator(CheckLogMask, ""));
 
-    CLI::App* const get =
-        AddFileCommand(app, "get", "print the value or values under a key path", arguments);
-    get->add_option("KEY", arguments.key, "a key path: root.element@attribute=value.element")
-        ->required();
-    get->callback([&] { command = [&] { return Get(arguments.file, arguments.key); }; });
+    AddKeyCommand(app, "get", "print the value or values under a key path", arguments)
+        ->callback([&] { command = [&] { return Get(arguments.file, arguments.key); }; });
+
+    CLI::App* const set = AddKeyCommand(
+        app, "set", "replace the text under a key path, print what changed, and save", arguments);
+    set->add_option("VALUE", arguments.value, "the new text, as XML: write & as &amp;")->required();
+    set->add_flag("--dry-run", arguments.dryRun, "show what would change and save nothing");
+    set->add_option("--output", arguments.output, "save to this file instead")
+        ->type_name("FILE")
+        ->check(CLI::Validator(RefuseStandardStreams, ""));
+    set->callback([&] { command = [&] { return Set(arguments); }; });
 
     try
     {
@@ -111,7 +119,7 @@ ExitStatus Run(int argc, char** argv)
     {
         return ReportUsage(app, error);
     }
-    SetLogMask(arguments.logMask);
+    SetLogMask(logMask);
     CollectEngineComplaints();
     return command();
 }
@@ -124,7 +132,7 @@ int main(int argc, char** argv)
     if (!std::cout.flush())
     {
         Complain("cannot write to standard output");
-        return static_cast<int>(ExitStatus::BadFile);
+        return static_cast<int>(ExitStatus::NotSaved);
     }
     return static_cast<int>(status);
 }

@@ -1,0 +1,20 @@
+#ifndef KX_CONFIG_KEYPATHUPDATE_H
+#define KX_CONFIG_KEYPATHUPDATE_H
+
+#include "KeyPath.h"
+
+namespace kx
+{
+
+/**
+ * Replaces the text of the elements below @p top that @p key addresses by @p value, and then sets
+ * @p updated to 1.
+ *
+ * A null node or an empty key changes nothing. @p key and @p value are zero-terminated.
+ * @return the status of the last descent.
+ */
+int UpdateValues(xmlNode* top, const TextView& key, const char* value, unsigned int& updated);
+
+} // namespace kx
+
+#endif

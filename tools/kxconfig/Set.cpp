@@ -1,0 +1,100 @@
+#include "Commands.h"
+#include "Document.h"
+#include "Save.h"
+#include "Texts.h"
+
+#include <iostream>
+
+namespace
+{
+
+/** A writer on the document of a reader, which keeps owning it. */
+class GuestWriter
+{
+public:
+    explicit GuestWriter(CXMLReader& reader) { m_writer.SetDataPtr(reader.GetDataPtr()); }
+    ~GuestWriter() { m_writer.SetDataPtr(nullptr); }
+    GuestWriter(const GuestWriter&) = delete;
+    GuestWriter& operator=(const GuestWriter&) = delete;
+
+    CXMLWriter& Get() { return m_writer; }
+
+private:
+    CXMLWriter m_writer;
+};
+
+ExitStatus Update(CXMLWriter& writer, const SetArguments& arguments)
+{
+    const int status = writer.SetValue(arguments.key, arguments.value);
+    if (status == 0)
+    {
+        return ExitStatus::Done;
+    }
+    if (status == -2)
+    {
+        Complain("nothing found: no element of " + arguments.file +
+                 " has text that can be replaced under " + Quoted(arguments.key));
+        return ExitStatus::NothingFound;
+    }
+    Complain("malformed key " + Quoted(arguments.key) + ": it ends in \".\"");
+    return ExitStatus::BadUsage;
+}
+
+void Print(const std::vector<ChangedText>& changes)
+{
+    for (const ChangedText& change : changes)
+    {
+        std::cout << change.location << ": " << Quoted(change.before) << " -> "
+                  << Quoted(change.after) << '\n';
+    }
+    if (changes.empty())
+    {
+        std::cout << "nothing changed: the text is the same already\n";
+    }
+}
+
+ExitStatus SaveUnlessAsked(CXMLWriter& writer, const SetArguments& arguments, bool changed)
+{
+    const bool elsewhere = !arguments.output.empty();
+    if (arguments.dryRun || (!changed && !elsewhere))
+    {
+        return ExitStatus::Done;
+    }
+    const std::string complaint = Save(writer, elsewhere ? arguments.output : arguments.file);
+    if (!complaint.empty())
+    {
+        Complain(complaint);
+        return ExitStatus::NotSaved;
+    }
+    return ExitStatus::Done;
+}
+
+} // namespace
+
+ExitStatus Set(const SetArguments& arguments)
+{
+    const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file);
+    if (reader == nullptr)
+    {
+        return ExitStatus::BadFile;
+    }
+    ExitStatus status = CheckKey(arguments.file, arguments.key, *reader);
+    if (status != ExitStatus::Done)
+    {
+        return status;
+    }
+    const Texts texts(reader->GetDataPtr());
+    GuestWriter writer(*reader);
+    status = Update(writer.Get(), arguments);
+    if (status != ExitStatus::Done)
+    {
+        return status;
+    }
+    const std::vector<ChangedText> changes = texts.Changes();
+    status = SaveUnlessAsked(writer.Get(), arguments, !changes.empty());
+    if (status == ExitStatus::Done)
+    {
+        Print(changes);
+    }
+    return status;
+}
