@@ -69,8 +69,8 @@ struct _xmlNode;
  * Holds one XML configuration document and answers key paths on it.
  *
  * A reader is used by one thread at a time; readers are independent of each other. It cannot be
- * copied. Memory exhausted in string handling leaves any operation as std::bad_alloc; nothing else
- * is thrown.
+ * copied. It throws nothing of its own; only what string handling throws when memory or lengths are
+ * exhausted (std::bad_alloc, std::length_error) leaves an operation.
  *
  * @code
  * CXMLReader* reader = GetCXMLReaderObject("/etc/device.xml");
@@ -92,7 +92,11 @@ public:
      * Makes a reader of the file at @p path.
      *
      * The reader is complete in any case: if the file is missing, unreadable or not well-formed, it
-     * holds no document, which GetDataPtr() tells.
+     * holds no document, which GetDataPtr() tells, and the engine prints its own diagnosis to
+     * standard error. The path is the engine's to interpret: it reads gzip transparently, takes "-"
+     * for standard input and fetches URLs if it was built to.
+     *
+     * @param path  a file's path.
      *
      * Logs "File Path %s" with the path (level 11) in place of "+" and no "-"; on failure also
      * "Pointer to document structure is NULL" (level 9).
@@ -113,9 +117,9 @@ public:
      * whether or not the new file parses. Clients parse once per reader, or keep the earlier
      * pointer from GetDataPtr() and free it with xmlFreeDoc() themselves.
      *
+     * @param path  a file's path, as for the constructor.
      * @return 0, or 22 if the file is missing, unreadable or not well-formed: then no document is
-     *         held and "Pointer to document structure is NULL" (level 9) is logged. The engine
-     *         prints its own diagnosis of a malformed file to standard error.
+     *         held and "Pointer to document structure is NULL" (level 9) is logged.
      */
     virtual int ParseFile(const std::string& path);
 
@@ -123,10 +127,12 @@ public:
      * Looks up @p key and returns what it finds.
      *
      * Values found under one parent on the last level run together without a separator; values
-     * found through different branches are separated by "\n". For cfg.net.ip, two ip elements with
-     * the texts 1 and 2 in a single net yield "12", in two nets "1\n2". The two-argument form
-     * separates every value.
+     * found through different branches are separated by "\n"; the own value of an element in the
+     * middle of the path joins what its level has found so far without one. For cfg.net.ip, two ip
+     * elements with the texts 1 and 2 in a single net yield "12", in two nets "1\n2". The
+     * two-argument form separates every value.
      *
+     * @param key  the key path.
      * @return the value or values, or an empty string: no document, an empty or malformed key, a
      *         foreign root name and no match look the same.
      *
@@ -170,7 +176,9 @@ public:
      * Looks up @p key, the rest of a key path, below @p node; the worker of the one-argument
      * GetValue().
      *
-     * @param node  the element whose children the key's first segment names; may be null.
+     * @param node  the element or document node whose children the key's first segment names; may
+     * be null.
+     * @param key   the rest of a key path.
      * @return the value or values as GetValue() returns them; empty for a null node or an empty
      * key. Logs nothing.
      */
@@ -180,7 +188,8 @@ public:
      * Looks up @p key, the rest of a key path, below @p node and appends what it finds to @p value;
      * the worker of the two-argument GetValue().
      *
-     * @param node   the element whose children the key's first segment names; may be null.
+     * @param node   the element or document node whose children the key's first segment names; may
+     *               be null.
      * @param key    the rest of a key path.
      * @param value  as in GetValue().
      * @param found  set to 1 if a value was appended, otherwise unchanged; this is what tells.
@@ -204,9 +213,9 @@ private:
  * Makes a reader of the file at @p path.
  *
  * @param path  a file's path; zero-terminated.
- * @return the reader, which the caller destroys with delete, or null if @p path is null or memory
- *         is short. A file that cannot be parsed yields a reader without a document: GetDataPtr()
- *         answers null and GetValue() 22. Logs nothing itself.
+ * @return the reader, which the caller destroys with delete, or null if @p path is null or the
+ *         object cannot be allocated. A file that cannot be parsed yields a reader without a
+ * document: GetDataPtr() answers null and GetValue() 22. Logs nothing itself.
  */
 extern "C" CXMLReader* GetCXMLReaderObject(const char* path);
 

@@ -45,8 +45,9 @@ struct _xmlNode;
  * Only SetDataPtr() drops a document without freeing it.
  *
  * A writer is used by one thread at a time; writers that hold different documents are independent
- * of each other. It cannot be copied. Memory exhausted in string handling leaves any operation as
- * std::bad_alloc; nothing else is thrown.
+ * of each other. It cannot be copied. It throws nothing of its own; only what string handling
+ * throws when memory or lengths are exhausted (std::bad_alloc, std::length_error) leaves an
+ * operation.
  *
  * @code
  * CXMLWriter* writer = GetCXMLWriterObject("/etc/device.xml");
@@ -69,6 +70,8 @@ public:
      * The writer is complete in any case: if the file is missing, unreadable or not well-formed, it
      * holds no document.
      *
+     * @param path  a file's path, which the engine interprets when it parses and when it saves.
+     *
      * Logs "File Path %s" with the path (level 11) in place of "+" and no "-"; on failure also
      * "Pointer to document structure is NULL" (level 9).
      */
@@ -87,6 +90,7 @@ public:
      * The path is set through the virtual SetPath(), so that a derived class's is honoured. The
      * earlier document is gone also when the new file does not parse.
      *
+     * @param path  a file's path.
      * @return 0, or 22 if the file is missing, unreadable or not well-formed, or the path is empty:
      *         then no document is held and "Pointer to document structure is NULL" (level 9) is
      *         logged. An empty path leaves the path to save to as it was; another failed path does
@@ -156,6 +160,7 @@ public:
     /**
      * Names the file that SaveData() writes; neither parses nor touches the document.
      *
+     * @param path  a file's path; the engine decodes escapes such as %20 in it when it saves.
      * @return 0, or 7 if @p path is empty: then the path stays as it was. Logs nothing.
      */
     virtual int SetPath(const std::string& path);
@@ -185,7 +190,8 @@ public:
      * Replaces the text of the elements that @p key, the rest of a key path, addresses below
      * @p node; the worker of SetValue(), which tells the reach.
      *
-     * @param node     the element whose children the key's first segment names; may be null.
+     * @param node     the element or document node whose children the key's first segment names;
+     * may be null.
      * @param key      the rest of a key path.
      * @param value    the new text; not changed.
      * @param updated  set to 1 by every update, otherwise unchanged; this is what tells.
@@ -210,17 +216,17 @@ private:
  * Makes a writer of the file at @p path.
  *
  * @param path  a file's path; zero-terminated.
- * @return the writer, which the caller destroys with delete, or null if @p path is null or memory
- *         is short. A file that cannot be parsed yields a writer without a document, whose
- *         SetValue() answers 7. Logs nothing itself.
+ * @return the writer, which the caller destroys with delete, or null if @p path is null or the
+ *         object cannot be allocated. A file that cannot be parsed yields a writer without a
+ * document, whose SetValue() answers 7. Logs nothing itself.
  */
 extern "C" CXMLWriter* GetCXMLWriterObject(const char* path);
 
 /**
  * Makes a writer without document and path.
  *
- * @return the writer, which the caller destroys with delete, or null if memory is short. Logs
- *         nothing itself.
+ * @return the writer, which the caller destroys with delete, or null if the object cannot be
+ *         allocated. Logs nothing itself.
  */
 extern "C" CXMLWriter* GetCXMLWriterObjectNoParam();
 

@@ -21,7 +21,7 @@ show() {
     "$@"
 }
 
-# build — only what goes wrong is worth reading.
+# quietly COMMAND... — for building, of which only what goes wrong is worth reading.
 quietly() {
     local log=build/quickstart.log
     mkdir -p build

@@ -14,6 +14,7 @@
 #include <time.h>
 #include <unistd.h>
 
+#include <exception>
 #include <string>
 
 // The mask word's place is part of the platform's binary interface.
@@ -70,12 +71,12 @@ void WriteToStandardError(const char* data, size_t size)
     while (size != 0)
     {
         const ssize_t written = write(STDERR_FILENO, data, size);
-        if (written >= 0)
+        if (written > 0)
         {
             data += written;
             size -= static_cast<size_t>(written);
         }
-        else if (errno != EINTR)
+        else if (written == 0 || errno != EINTR)
         {
             if (errno == EPIPE)
             {
@@ -154,7 +155,17 @@ __attribute__((constructor)) void TakeMaskFromEnvironment()
     {
         return;
     }
-    fprintf(stderr, "KX_LOG_MASK: \"%s\" is not a log mask; it is %s\n", text, g_LogMaskHelp);
+    try
+    {
+        std::string complaint = "KX_LOG_MASK: \"";
+        AppendOnOneLine(complaint, text);
+        complaint = complaint + "\" is not a log mask; it is " + g_LogMaskHelp + '\n';
+        WriteToStandardError(complaint.data(), complaint.size());
+    }
+    catch (const std::exception&)
+    {
+        // Out of memory: the mask stays as it was, unexplained.
+    }
 }
 
 } // namespace
@@ -180,7 +191,7 @@ extern "C" int KxLog(int line, int level, const char* tag, const char* format, .
         text.resize(needed);
         WriteRecord(line, level, tag, text);
     }
-    catch (...)
+    catch (const std::exception&) // not the unwinding of a thread that is cancelled
     {
         // Out of memory: the record is lost, the caller goes on.
     }

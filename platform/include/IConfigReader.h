@@ -20,10 +20,18 @@ public:
     IConfigReader();
     virtual ~IConfigReader();
 
-    /** Loads the configuration file at @p path. @return a status code, 0 for success. */
+    /**
+     * Loads a configuration file.
+     * @param path  the file's path.
+     * @return a status code, 0 for success.
+     */
     virtual int ParseFile(const std::string& path) = 0;
 
-    /** @return the value or values under @p key, or an empty string. */
+    /**
+     * Looks up a value.
+     * @param key  the key.
+     * @return the value or values, or an empty string.
+     */
     virtual std::string GetValue(const std::string& key) = 0;
 
     /** Appends the value or values under @p key to @p value. @return a status code, 0 for success.

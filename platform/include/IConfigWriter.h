@@ -20,19 +20,35 @@ public:
     IConfigWriter();
     virtual ~IConfigWriter();
 
-    /** Loads the configuration file at @p path. @return a status code, 0 for success. */
+    /**
+     * Loads a configuration file.
+     * @param path  the file's path.
+     * @return a status code, 0 for success.
+     */
     virtual int ParseFile(const std::string& path) = 0;
 
-    /** Replaces the text under @p key with @p value. @return a status code, 0 for success. */
+    /**
+     * Replaces text.
+     * @param key    the key.
+     * @param value  the new text.
+     * @return a status code, 0 for success.
+     */
     virtual int SetValue(const std::string& key, std::string value) = 0;
 
     /** Writes the configuration to its path. @return a status code, 0 for success. */
     virtual int SaveData() = 0;
 
-    /** Names the file that SaveData() writes. @return a status code, 0 for success. */
+    /**
+     * Names the file that SaveData() writes.
+     * @param path  the file's path.
+     * @return a status code, 0 for success.
+     */
     virtual int SetPath(const std::string& path) = 0;
 
-    /** Adopts @p document, untyped, in place of the one held. */
+    /**
+     * Adopts a document in place of the one held.
+     * @param document  untyped; may be null.
+     */
     virtual void SetDataPtr(void* document) = 0;
 };
 

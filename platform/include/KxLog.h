@@ -22,9 +22,11 @@ extern "C"
      */
     struct LumLogParams
     {
+        /** Belongs to others. */
         unsigned char reservedHead[0x2F14];
         /** Log mask word of libKX_XMLConfigParser: bit (1 << level) enables a level. */
         unsigned int xmlConfigParserMask;
+        /** Belongs to others. */
         unsigned char reservedTail[0xE8];
     };
 

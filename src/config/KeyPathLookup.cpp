@@ -10,7 +10,7 @@ namespace kx
 namespace
 {
 
-/** The text of @p element, whose only child is @p text, as the engine holds it; never null. */
+/** The value that @p text holds; never null. */
 const char* ContentOf(const xmlNode* text)
 {
     return text->content != 0 ? reinterpret_cast<const char*>(text->content) : "";

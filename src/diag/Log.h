@@ -13,7 +13,8 @@
  * any time.
  *
  * The operation's bare name is the record's tag. A gate takes it from the function that it stands
- * in; a function that works on behalf of several operations is given the tag and uses the _AS form.
+ * in; a function that works on behalf of another operation uses the _AS form, which is given the
+ * tag. The _OF form takes the one argument that its format asks for.
  *
  * An operation that traces logs KX_TRACE("+") first and KX_TRACE("-") last on each return path. "-"
  * is written out instead of left to a destructor because a call that an exception leaves logs none,

@@ -23,6 +23,8 @@ const char* const kNets = "<cfg>"
                           "<name>box</name>"
                           "</cfg>";
 
+const unsigned kMasks[] = {kMaskNone, kMaskError, kMaskTrace, kMaskValue, kMaskXPath, kMaskAll};
+
 struct Answer
 {
     std::string text;     // of the one-argument form
@@ -82,6 +84,28 @@ protected:
     xmlNodePtr Root() const
     {
         return xmlDocGetRootElement(static_cast<xmlDocPtr>(m_reader->GetDataPtr()));
+    }
+
+    /**
+     * Expects that both forms find nothing and answer so, with these records under every mask.
+     */
+    static void ExpectMissing(CXMLReader& reader, const std::string& key,
+                              const Records& oneArgument, const Records& twoArguments)
+    {
+        for (const unsigned mask : kMasks)
+        {
+            SCOPED_TRACE(mask);
+            LogRecorder log(mask);
+            const unsigned long calls = LogRecorder::Calls();
+            std::string value = "old";
+            EXPECT_EQ("", reader.GetValue(key));
+            EXPECT_EQ(Under(mask, oneArgument), log.Take());
+            EXPECT_EQ(22, reader.GetValue(key, value));
+            EXPECT_EQ(Under(mask, twoArguments), log.Take());
+            EXPECT_EQ("old", value);
+            EXPECT_EQ(Under(mask, oneArgument).size() + Under(mask, twoArguments).size(),
+                      LogRecorder::Calls() - calls);
+        }
     }
 
     TemporaryFolder m_folder;
@@ -567,14 +591,15 @@ TEST_F(LookupTest, LeavesTheCallersStringAloneWhenNothingIsFound)
 
 TEST_F(LookupTest, KeyAndValueMayBeOneString)
 {
+    Load("<cfg><net><ip>" + std::string(100, 'a') + "</ip></net><net><ip>b</ip></net></cfg>");
     std::string both = "cfg.net.ip";
     EXPECT_EQ(0, m_reader->GetValue(both, both));
-    EXPECT_EQ("cfg.net.ip\n10.0.0.1\n10.0.0.2", both);
+    EXPECT_EQ("cfg.net.ip\n" + std::string(100, 'a') + "\nb", both);
 
     std::string rest = "net.ip";
     unsigned found = 0;
     EXPECT_EQ(-2, m_reader->XMLGetValue(Root(), rest, rest, found));
-    EXPECT_EQ("net.ip\n10.0.0.1\n10.0.0.2", rest);
+    EXPECT_EQ("net.ip\n" + std::string(100, 'a') + "\nb", rest);
     EXPECT_EQ(1u, found);
 }
 
@@ -583,29 +608,15 @@ TEST_F(LookupTest, KeyAndValueMayBeOneString)
 TEST_F(LookupTest, WithoutADocumentIsMissing)
 {
     CXMLReader reader;
-    LogRecorder log;
-    std::string value = "old";
-    EXPECT_EQ("", reader.GetValue("cfg.name"));
-    EXPECT_EQ(Records({Trace("GetValue", "Key cfg.name"), Error("GetValue", kNoDocument)}),
-              log.Take());
-    EXPECT_EQ(22, reader.GetValue("cfg.name", value));
-    EXPECT_EQ(
-        Records({Trace("GetValue", "+"), Error("GetValue", kNoDocument), Trace("GetValue", "-")}),
-        log.Take());
-    EXPECT_EQ("old", value);
+    ExpectMissing(reader, "cfg.name",
+                  {Trace("GetValue", "Key cfg.name"), Error("GetValue", kNoDocument)},
+                  {Trace("GetValue", "+"), Error("GetValue", kNoDocument), Trace("GetValue", "-")});
 }
 
 TEST_F(LookupTest, EmptyKeyIsMissing)
 {
-    LogRecorder log;
-    std::string value = "old";
-    EXPECT_EQ("", m_reader->GetValue(""));
-    EXPECT_EQ(Records({Trace("GetValue", "Key "), Error("GetValue", kNoDocument)}), log.Take());
-    EXPECT_EQ(22, m_reader->GetValue("", value));
-    EXPECT_EQ(
-        Records({Trace("GetValue", "+"), Error("GetValue", kNoDocument), Trace("GetValue", "-")}),
-        log.Take());
-    EXPECT_EQ("old", value);
+    ExpectMissing(*m_reader, "", {Trace("GetValue", "Key "), Error("GetValue", kNoDocument)},
+                  {Trace("GetValue", "+"), Error("GetValue", kNoDocument), Trace("GetValue", "-")});
 }
 
 TEST_F(LookupTest, WithoutARootElementIsMissing)
@@ -613,17 +624,15 @@ TEST_F(LookupTest, WithoutARootElementIsMissing)
     const xmlNodePtr root = Root();
     xmlUnlinkNode(root);
     xmlFreeNode(root);
-    LogRecorder log;
-    std::string value = "old";
-    EXPECT_EQ("", m_reader->GetValue("cfg.name"));
-    EXPECT_EQ(Records({Trace("GetValue", "Key cfg.name"), Value("GetValue", "Parsed Value :: ")}),
-              log.Take());
-    EXPECT_EQ(22, m_reader->GetValue("cfg", value));
-    EXPECT_EQ(Records({Trace("GetValue", "+"), Value("GetValue", "Key is cfg"),
-                       Error("GetValue", "Root Node ptr is NULL"),
-                       Value("GetValue", "Parsed Value :: old"), Trace("GetValue", "-")}),
-              log.Take());
-    EXPECT_EQ("old", value);
+    for (const char* const key : {"cfg.name", "cfg"})
+    {
+        ExpectMissing(
+            *m_reader, key,
+            {Trace("GetValue", std::string("Key ") + key), Value("GetValue", "Parsed Value :: ")},
+            {Trace("GetValue", "+"), Value("GetValue", std::string("Key is ") + key),
+             Error("GetValue", "Root Node ptr is NULL"), Value("GetValue", "Parsed Value :: old"),
+             Trace("GetValue", "-")});
+    }
 }
 
 // --- Records
@@ -725,9 +734,8 @@ TEST_F(LookupTest, KeyAndValueReachTheLogAsArgumentsOnly)
     EXPECT_EQ(-2, m_reader->GetValue("cfg.%s%s%s.%n", value));
 }
 
-TEST_F(LookupTest, AMaskThatChangesDuringAnOperationTakesEffectAtTheNextGate)
+TEST_F(LookupTest, AMaskThatChangesTakesEffectAtTheNextOperation)
 {
-    // Opened by the platform between two operations of one object.
     LogRecorder log(kMaskNone);
     m_reader->GetValue("cfg.name");
     EXPECT_EQ(Records(), log.Take());
@@ -740,20 +748,23 @@ TEST_F(LookupTest, AMaskThatChangesDuringAnOperationTakesEffectAtTheNextGate)
 
 TEST_F(LookupTest, RecursionAnswersANullNodeOrAnEmptyKeyAtOnce)
 {
-    LogRecorder log;
-    EXPECT_EQ("", m_reader->XMLGetValue(nullptr, "name"));
-    EXPECT_EQ("", m_reader->XMLGetValue(Root(), ""));
-    EXPECT_EQ(Records(), log.Take());
-
-    std::string value = "old";
-    unsigned found = 5;
     const Records traceOnly = {Trace("XMLGetValue", "+"), Trace("XMLGetValue", "-")};
-    EXPECT_EQ(22, m_reader->XMLGetValue(nullptr, "name", value, found));
-    EXPECT_EQ(traceOnly, log.Take());
-    EXPECT_EQ(22, m_reader->XMLGetValue(Root(), "", value, found));
-    EXPECT_EQ(traceOnly, log.Take());
-    EXPECT_EQ("old", value);
-    EXPECT_EQ(5u, found);
+    for (const unsigned mask : kMasks)
+    {
+        LogRecorder log(mask);
+        EXPECT_EQ("", m_reader->XMLGetValue(nullptr, "name"));
+        EXPECT_EQ("", m_reader->XMLGetValue(Root(), ""));
+        EXPECT_EQ(Records(), log.Take());
+
+        std::string value = "old";
+        unsigned found = 5;
+        EXPECT_EQ(22, m_reader->XMLGetValue(nullptr, "name", value, found));
+        EXPECT_EQ(Under(mask, traceOnly), log.Take());
+        EXPECT_EQ(22, m_reader->XMLGetValue(Root(), "", value, found));
+        EXPECT_EQ(Under(mask, traceOnly), log.Take());
+        EXPECT_EQ("old", value);
+        EXPECT_EQ(5u, found);
+    }
 }
 
 TEST_F(LookupTest, RecursionSearchesBelowAnyNode)
@@ -836,6 +847,21 @@ TEST_F(LookupTest, KeysOfAMegabyteGetTheirAnswer)
     EXPECT_EQ(Nothing(-2), Ask("cfg.net@" + std::string(size, 'n') + "=1.ip"));
     EXPECT_EQ(Nothing(-2), Ask("cfg.net@" + std::string(size, '|') + ".ip"));
     EXPECT_EQ(Found("10.0.0.1"), Ask("cfg.net@" + std::string(size, '|') + "id=1.ip"));
+}
+
+TEST_F(LookupTest, KeysOfAMegabyteAreNotCopied)
+{
+    const std::size_t size = 1 << 20;
+    const std::string keys[] = {
+        "cfg." + std::string(size, 'x'), "cfg.net@" + std::string(size, '&') + ".ip",
+        "cfg.net@id=" + std::string(size, 'v') + ".ip", "cfg." + std::string(size, '.')};
+    for (const std::string& key : keys)
+    {
+        std::string value;
+        const NewCounter heap;
+        m_reader->GetValue(key, value);
+        EXPECT_EQ(0u, heap.Requests()) << key.substr(0, 12);
+    }
 }
 
 TEST_F(LookupTest, DepthOfTheParsersLimitIsReached)

@@ -10,7 +10,8 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
-#include <cerrno>
+#include <libxml/parser.h>
+
 #include <memory>
 #include <type_traits>
 
@@ -303,21 +304,65 @@ TEST_F(ReaderTest, EmptyPathGivesNoDocument)
 TEST_F(ReaderTest, TheEnginesOwnDiagnosisIsLeftAsItIs)
 {
     TakeEngineErrors();
-    CXMLReader reader(m_folder.Write("bad.xml", "<cfg><a></cfg>"));
+    const std::string bad = m_folder.Write("bad.xml", "<cfg><a></cfg>");
+    CXMLReader reader(bad);
+    EXPECT_NE(std::string::npos, TakeEngineErrors().find("bad.xml"));
+    reader.ParseFile(bad);
     EXPECT_NE(std::string::npos, TakeEngineErrors().find("bad.xml"));
 }
 
-TEST_F(ReaderTest, FailedParseChangesNothingElseInTheProcess)
+TEST_F(ReaderTest, TheEnginesDefaultsAreLeftAsTheyAre)
 {
-    const CXMLReader untouched(m_file);
-    const int blanks = xmlKeepBlanksDefault(1);
-    xmlKeepBlanksDefault(blanks);
-    errno = 0;
+    // Each asks for the present value by setting another, and puts it back.
+    const auto defaults = []
+    {
+        const int blanks = xmlKeepBlanksDefault(1);
+        xmlKeepBlanksDefault(blanks);
+        const int entities = xmlSubstituteEntitiesDefault(0);
+        xmlSubstituteEntitiesDefault(entities);
+        const int lines = xmlLineNumbersDefault(0);
+        xmlLineNumbersDefault(lines);
+        return std::vector<int>({blanks, entities, lines});
+    };
+    const xmlGenericErrorFunc errors = xmlGenericError;
+    const std::vector<int> before = defaults();
     CXMLReader reader(m_missing);
-    EXPECT_EQ(blanks, xmlKeepBlanksDefault(blanks));
+    reader.ParseFile(m_file);
+    reader.GetValue("cfg.name");
+    xmlFreeDoc(static_cast<xmlDocPtr>(reader.GetDataPtr()));
+    reader.ParseFile(m_missing);
+    EXPECT_EQ(before, defaults());
+    EXPECT_EQ(errors, xmlGenericError);
+}
+
+TEST_F(ReaderTest, FailedParseLeavesOtherReadersAlone)
+{
+    CXMLReader untouched(m_file);
+    CXMLReader reader(m_missing);
     CXMLReader after(m_other);
     EXPECT_EQ("lid", after.GetValue("cfg.name"));
-    EXPECT_EQ("box", const_cast<CXMLReader&>(untouched).GetValue("cfg.name"));
+    EXPECT_EQ("box", untouched.GetValue("cfg.name"));
+}
+
+TEST_F(ReaderTest, RecordsSurroundTheEnginesWork)
+{
+    EngineCalls calls;
+    calls.ShowAmongRecords();
+    LogRecorder log;
+    void* first = nullptr;
+    {
+        CXMLReader reader(m_file);
+        first = reader.GetDataPtr();
+        reader.ParseFile(m_missing);
+        reader.ParseFile(m_file);
+    }
+    EXPECT_EQ(Records({Trace("CXMLReader", "File Path " + m_file), Engine("xmlParseFile"),
+                       Trace("ParseFile", "+"), Engine("xmlParseFile"),
+                       Error("ParseFile", kNoDocument), Trace("ParseFile", "-"),
+                       Trace("ParseFile", "+"), Engine("xmlParseFile"), Trace("ParseFile", "-"),
+                       Trace("~CXMLReader", "Destructor"), Engine("xmlFreeDoc")}),
+              log.Take());
+    xmlFreeDoc(static_cast<xmlDocPtr>(first));
 }
 
 // --- GetDataPtr
@@ -409,6 +454,13 @@ TEST_F(ReaderTest, FactoryOnAMissingFileYieldsAReaderWithoutDocument)
     EXPECT_EQ(nullptr, reader->GetDataPtr());
     std::string value;
     EXPECT_EQ(22, reader->GetValue("cfg.name", value));
+}
+
+TEST_F(ReaderTest, FactoryGivenAnEmptyPathYieldsAReaderWithoutDocument)
+{
+    const std::unique_ptr<CXMLReader> reader(GetCXMLReaderObject(""));
+    ASSERT_NE(nullptr, reader);
+    EXPECT_EQ(nullptr, reader->GetDataPtr());
 }
 
 TEST_F(ReaderTest, FactoryYieldsNullWhenTheObjectCannotBeAllocated)

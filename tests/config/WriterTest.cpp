@@ -514,6 +514,26 @@ TEST_F(WriterTest, RecordsFollowTheMask)
     }
 }
 
+TEST_F(WriterTest, RecordsSurroundTheEnginesWork)
+{
+    EngineCalls calls;
+    calls.ShowAmongRecords();
+    LogRecorder log;
+    {
+        CXMLWriter writer(m_file);
+        writer.ParseFile(m_missing);
+        writer.ParseFile(m_file);
+        writer.SaveData();
+    }
+    EXPECT_EQ(Records({Trace("CXMLWriter", "File Path " + m_file), Engine("xmlParseFile"),
+                       Trace("ParseFile", "+"), Engine("xmlFreeDoc"), Engine("xmlParseFile"),
+                       Error("ParseFile", kNoDocument), Trace("ParseFile", "-"),
+                       Trace("ParseFile", "+"), Engine("xmlParseFile"), Trace("ParseFile", "-"),
+                       Trace("SaveData", "+"), Engine("xmlSaveFileEnc"),
+                       Trace("~CXMLWriter", "Destructor"), Engine("xmlFreeDoc")}),
+              log.Take());
+}
+
 // --- The interface's table
 
 TEST_F(WriterTest, TheTableKeepsTheSlotOrder)

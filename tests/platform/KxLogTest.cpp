@@ -56,8 +56,11 @@ TEST(KxLog, KeepsBytesBeyondAscii)
 
 TEST(KxLog, WritesLongRecordsWhole)
 {
-    EXPECT_THAT(RunProgram({kProbe, "long"}).err,
-                testing::EndsWith(" error Tag:1 " + std::string(100000, 'x') + "\n"));
+    for (const std::size_t length : {255u, 256u, 257u, 100000u})
+    {
+        EXPECT_THAT(RunProgram({kProbe, "long", std::to_string(length)}).err,
+                    testing::EndsWith(" error Tag:1 " + std::string(length, 'x') + "\n"));
+    }
 }
 
 TEST(KxLog, NeverFailsTheCallerWhenTheRecordCannotBeWritten)
@@ -68,6 +71,37 @@ TEST(KxLog, NeverFailsTheCallerWhenTheRecordCannotBeWritten)
         EXPECT_EQ(0, outcome.status) << how;
         EXPECT_EQ("alive\n", outcome.out) << how;
     }
+}
+
+TEST(KxLog, NeverFailsTheCallerWhenMemoryIsShort)
+{
+    const Outcome outcome = RunProgram({kProbe, "memory"});
+    EXPECT_EQ(0, outcome.status);
+    EXPECT_EQ("alive\n", outcome.out);
+}
+
+TEST(KxLog, TakesBackOnlyTheSignalThatItRaised)
+{
+    EXPECT_EQ(0, RunProgram({kProbe, "pending"}).status);
+}
+
+TEST(KxLog, WritesOnAfterPartialAndInterruptedWrites)
+{
+    const Outcome outcome = RunProgram({kProbe, "piecemeal"});
+    EXPECT_EQ(0, outcome.status);
+    EXPECT_THAT(outcome.out, testing::EndsWith(" error Tag:1 " + std::string(300000, 'x') + "\n"));
+}
+
+TEST(LogMaskOfTheEnvironment, BadValueNeverFailsTheProcess)
+{
+    const std::string command = std::string(kProbe) + " mask 2>&1 1>&3 3>&- | true";
+    const Outcome outcome = RunProgram(
+        {"/bin/bash", "-c", "set -o pipefail; exec 3>&1; " + command}, {"KX_LOG_MASK=a\nb"});
+    EXPECT_EQ(0, outcome.status);
+    EXPECT_EQ("0x00000300\n", outcome.out);
+    EXPECT_EQ(
+        0u,
+        RunProgram({kProbe, "mask"}, {"KX_LOG_MASK=a\nb"}).err.find("KX_LOG_MASK: \"a\\nb\" is"));
 }
 
 TEST(LogMaskOfTheEnvironment, StartsAtWarningsAndErrors)

@@ -1,5 +1,6 @@
 #include "support/Engine.h"
 
+#include "support/Log.h"
 #include "support/Memory.h"
 
 #include <libxml/parser.h>
@@ -19,6 +20,7 @@ std::vector<const void*> g_freed;
 std::vector<std::string> g_parsed;
 std::vector<std::string> g_properties;
 std::string g_engineErrors;
+bool g_showing = false;
 bool g_answerSaves = false;
 int g_saveResult = 0;
 
@@ -26,6 +28,14 @@ template <class Function>
 Function* Next(Function*, const char* name)
 {
     return reinterpret_cast<Function*>(dlsym(RTLD_NEXT, name));
+}
+
+void Show(const char* call)
+{
+    if (g_showing)
+    {
+        kxtest::LogRecorder::Note(kxtest::Engine(call));
+    }
 }
 
 void CollectError(void*, const char* format, ...)
@@ -50,6 +60,7 @@ extern "C" void xmlFreeDoc(xmlDocPtr document)
     if (g_noting)
     {
         g_freed.push_back(document);
+        Show("xmlFreeDoc");
     }
     engine(document);
 }
@@ -60,6 +71,7 @@ extern "C" xmlDocPtr xmlParseFile(const char* path)
     if (g_noting)
     {
         g_parsed.push_back(path);
+        Show("xmlParseFile");
     }
     return engine(path);
 }
@@ -77,6 +89,7 @@ extern "C" xmlChar* xmlGetProp(const xmlNode* node, const xmlChar* name)
 extern "C" int xmlSaveFileEnc(const char* path, xmlDocPtr document, const char* encoding)
 {
     static const auto engine = Next(&xmlSaveFileEnc, "xmlSaveFileEnc");
+    Show("xmlSaveFileEnc");
     return g_answerSaves ? g_saveResult : engine(path, document, encoding);
 }
 
@@ -95,6 +108,12 @@ EngineCalls::~EngineCalls()
 {
     g_noting = false;
     g_answerSaves = false;
+    g_showing = false;
+}
+
+void EngineCalls::ShowAmongRecords()
+{
+    g_showing = true;
 }
 
 std::size_t EngineCalls::Freed(const void* document) const

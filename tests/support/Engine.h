@@ -34,6 +34,10 @@ public:
     /** @return the names given to xmlGetProp. */
     const std::vector<std::string>& PropertiesRead() const;
 
+    /** From now on xmlParseFile, xmlFreeDoc and xmlSaveFileEnc stand among the records of the log.
+     */
+    void ShowAmongRecords();
+
     /** Makes xmlSaveFileEnc save nothing and answer with @p result, as long as the object lives. */
     void AnswerSavesWith(int result);
 };

@@ -104,6 +104,13 @@ void LogRecorder::SetMask(unsigned mask)
 {
     g_LumLogParams.xmlConfigParserMask = mask;
 }
+void LogRecorder::Note(const Record& record)
+{
+    if (g_recording)
+    {
+        g_records.push_back(record);
+    }
+}
 unsigned long LogRecorder::Calls()
 {
     return g_calls;

@@ -52,6 +52,13 @@ inline Record XPath(std::string tag, std::string text)
     return {31, tag, text};
 }
 
+/** Stands in a sequence of records for a call of the engine: see EngineCalls::ShowAmongRecords().
+ */
+inline Record Engine(std::string call)
+{
+    return {0, "engine", call};
+}
+
 /** The records of @p all that a mask lets through: what an operation must log under that mask. */
 Records Under(unsigned mask, const Records& all);
 
@@ -72,6 +79,9 @@ public:
     static std::string LastFormat();
 
     static void SetMask(unsigned mask);
+
+    /** Puts a record of the test's own into the sequence, whatever the mask. */
+    static void Note(const Record& record);
 
     /** Number of KxLog calls in the life of the process, recorded or not. */
     static unsigned long Calls();

@@ -2,6 +2,7 @@
 
 #include "support/Files.h"
 
+#include <algorithm>
 #include <stdexcept>
 
 #include <fcntl.h>
@@ -25,29 +26,35 @@ void Redirect(int descriptor, const char* path, int flags)
     close(file);
 }
 
-} // namespace
+std::vector<std::string> EmulatorWords()
+{
+    std::vector<std::string> words;
+    const std::string emulator = KX_TEST_EMULATOR;
+    for (std::string::size_type begin = 0; begin < emulator.size();)
+    {
+        const auto end = std::min(emulator.find(';', begin), emulator.size());
+        words.push_back(emulator.substr(begin, end - begin));
+        begin = end + 1;
+    }
+    return words;
+}
 
-Outcome RunProgram(const std::vector<std::string>& command,
-                   const std::vector<std::string>& environment)
+void SetEnvironment(const std::vector<std::string>& settings)
+{
+    unsetenv("KX_LOG_MASK"); // whoever runs the tests may have set it
+    for (const std::string& setting : settings)
+    {
+        putenv(const_cast<char*>(setting.c_str()));
+    }
+}
+
+Outcome RunAsItIs(const std::vector<std::string>& command,
+                  const std::vector<std::string>& environment, unsigned user)
 {
     const TemporaryFolder folder;
     const std::string out = folder.Path("out");
     const std::string err = folder.Path("err");
-
-    // A program for another architecture needs its emulator in front.
     std::vector<const char*> arguments;
-    const std::string emulator = KX_TEST_EMULATOR;
-    std::vector<std::string> emulatorWords;
-    for (std::string::size_type begin = 0; begin < emulator.size();)
-    {
-        const auto end = std::min(emulator.find(';', begin), emulator.size());
-        emulatorWords.push_back(emulator.substr(begin, end - begin));
-        begin = end + 1;
-    }
-    for (const std::string& word : emulatorWords)
-    {
-        arguments.push_back(word.c_str());
-    }
     for (const std::string& word : command)
     {
         arguments.push_back(word.c_str());
@@ -64,9 +71,10 @@ Outcome RunProgram(const std::vector<std::string>& command,
         Redirect(STDIN_FILENO, "/dev/null", O_RDONLY);
         Redirect(STDOUT_FILENO, out.c_str(), O_WRONLY | O_CREAT);
         Redirect(STDERR_FILENO, err.c_str(), O_WRONLY | O_CREAT);
-        for (const std::string& setting : environment)
+        SetEnvironment(environment);
+        if (user != 0 && setuid(user) != 0)
         {
-            putenv(const_cast<char*>(setting.c_str()));
+            _exit(125);
         }
         execvp(arguments[0], const_cast<char* const*>(arguments.data()));
         _exit(127);
@@ -75,6 +83,31 @@ Outcome RunProgram(const std::vector<std::string>& command,
     waitpid(child, &status, 0);
     const int code = WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
     return {code, ReadFile(out), ReadFile(err)};
+}
+
+} // namespace
+
+Outcome RunProgram(const std::vector<std::string>& command,
+                   const std::vector<std::string>& environment, unsigned user)
+{
+    std::vector<std::string> words = EmulatorWords();
+    words.insert(words.end(), command.begin(), command.end());
+    return RunAsItIs(words, environment, user);
+}
+
+Outcome RunShell(const std::string& script, const std::vector<std::string>& environment)
+{
+    return RunAsItIs({"/bin/bash", "-c", script}, environment, 0);
+}
+
+std::string InShell(const std::string& program)
+{
+    std::string words;
+    for (const std::string& word : EmulatorWords())
+    {
+        words += "'" + word + "' ";
+    }
+    return words + "'" + program + "'";
 }
 
 } // namespace kxtest

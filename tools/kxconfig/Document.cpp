@@ -3,6 +3,7 @@
 #include <libxml/tree.h>
 #include <libxml/xmlerror.h>
 
+#include <algorithm>
 #include <cerrno>
 #include <cstring>
 #include <iomanip>
@@ -31,7 +32,8 @@ void KeepFirstComplaint(void*, EngineError error)
         return;
     }
     g_firstComplaint = error->message;
-    g_firstComplaint.erase(g_firstComplaint.find_last_not_of("\r\n") + 1);
+    g_firstComplaint.erase(
+        std::min(g_firstComplaint.find_first_of("\r\n"), g_firstComplaint.size()));
     if (error->line > 0)
     {
         g_firstComplaint = std::to_string(error->line) + ": " + g_firstComplaint;
@@ -53,7 +55,7 @@ std::string WhyNotRead(const std::string& path)
     {
         return std::strerror(EISDIR);
     }
-    return S_ISREG(status.st_mode) && status.st_size == 0 ? "The file is empty" : "";
+    return "";
 }
 
 /** @return the name of the root element of @p document (an xmlDocPtr). */
@@ -63,11 +65,34 @@ std::string RootName(void* document)
     return reinterpret_cast<const char*>(root->name);
 }
 
+/** @return @p text with its control characters written as escapes. */
+std::string OnOneLine(const std::string& text)
+{
+    std::ostringstream line;
+    for (const char c : text)
+    {
+        const auto byte = static_cast<unsigned char>(c);
+        if (c == '\n')
+        {
+            line << "\\n";
+        }
+        else if (byte < 0x20 || byte == 0x7F)
+        {
+            line << "\\x" << std::hex << std::setw(2) << std::setfill('0') << unsigned{byte};
+        }
+        else
+        {
+            line << c;
+        }
+    }
+    return line.str();
+}
+
 } // namespace
 
 void Complain(const std::string& message)
 {
-    std::cerr << "kxconfig: " + message + "\n";
+    std::cerr << "kxconfig: " + OnOneLine(message) + "\n";
 }
 
 void CollectEngineComplaints()
@@ -80,7 +105,7 @@ std::unique_ptr<CXMLReader> LoadFile(const std::string& path, std::string& compl
     const std::string reason = WhyNotRead(path);
     if (!reason.empty())
     {
-        complaint = "cannot read " + path + ": " + reason;
+        complaint = "cannot read " + (path.empty() ? Quoted(path) : path) + ": " + reason;
         return nullptr;
     }
     g_firstComplaint.clear();
@@ -125,28 +150,10 @@ ExitStatus CheckKey(const std::string& file, const std::string& key, CXMLReader&
 
 std::string Quoted(const std::string& text)
 {
-    std::ostringstream quoted;
-    quoted << '"';
+    std::string quoted = "\"";
     for (const char c : text)
     {
-        const auto byte = static_cast<unsigned char>(c);
-        if (c == '"' || c == '\\')
-        {
-            quoted << '\\' << c;
-        }
-        else if (c == '\n')
-        {
-            quoted << "\\n";
-        }
-        else if (byte < 0x20 || byte == 0x7F)
-        {
-            quoted << "\\x" << std::hex << std::setw(2) << std::setfill('0') << unsigned{byte};
-        }
-        else
-        {
-            quoted << c;
-        }
+        quoted += c == '"' || c == '\\' ? std::string("\\") + c : std::string(1, c);
     }
-    quoted << '"';
-    return quoted.str();
+    return OnOneLine(quoted + '"');
 }

@@ -8,7 +8,7 @@
 #include <memory>
 #include <string>
 
-/** Prints "kxconfig: " and @p message as one line on standard error. */
+/** Prints "kxconfig: " and @p message as one line, whatever it holds, on standard error. */
 void Complain(const std::string& message);
 
 /** Keeps the engine from printing its complaints: LoadFile() tells the first of them instead. */

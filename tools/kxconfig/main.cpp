@@ -32,6 +32,16 @@ const char* const kFooter =
     "The library's log records go to standard error. kxconfig asks for none unless --log-mask or\n"
     "the environment variable KX_LOG_MASK says otherwise.";
 
+const char* const kSeeHelp = " (kxconfig --help shows the usage)";
+
+std::string CheckLogMask(const std::string& text)
+{
+    unsigned int mask = 0;
+    return ParseLogMask(text.c_str(), mask)
+               ? std::string()
+               : "\"" + text + "\" is not a log mask; it is " + g_LogMaskHelp;
+}
+
 /** The library reports to kxconfig, and kxconfig to the user: records are for those who ask. */
 void SetLogMask(const std::string& mask)
 {
@@ -40,18 +50,10 @@ void SetLogMask(const std::string& mask)
     {
         ParseLogMask(mask.c_str(), g_LumLogParams.xmlConfigParserMask);
     }
-    else if (environment == nullptr || *environment == '\0')
+    else if (environment == nullptr || !CheckLogMask(environment).empty())
     {
         g_LumLogParams.xmlConfigParserMask = 0;
     }
-}
-
-std::string CheckLogMask(const std::string& text)
-{
-    unsigned int mask = 0;
-    return ParseLogMask(text.c_str(), mask)
-               ? std::string()
-               : "\"" + text + "\" is not a log mask; it is " + g_LogMaskHelp;
 }
 
 /** To the engine "-" is standard input or output; whoever writes it here means something else. */
@@ -80,7 +82,7 @@ ExitStatus ReportUsage(const CLI::App& app, const CLI::ParseError& error)
         app.exit(error); // --help, --version
         return ExitStatus::Done;
     }
-    Complain(std::string(error.what()) + " (kxconfig --help shows the usage)");
+    Complain(error.what() + std::string(kSeeHelp));
     return ExitStatus::BadUsage;
 }
 
@@ -93,7 +95,7 @@ ExitStatus Run(int argc, char** argv)
     CLI::App app("Reads and changes values of XML configuration files by key path.", "kxconfig");
     app.set_version_flag("--version", "kxconfig " KX_VERSION);
     app.footer(kFooter);
-    app.require_subcommand(1);
+    app.require_subcommand(0, 1); // so that an unknown one is named
     app.fallthrough();
     app.add_option("--log-mask", logMask, std::string("log mask: ") + g_LogMaskHelp)
         ->type_name("MASK")
@@ -118,6 +120,11 @@ ExitStatus Run(int argc, char** argv)
     catch (const CLI::ParseError& error)
     {
         return ReportUsage(app, error);
+    }
+    if (!command)
+    {
+        Complain("a command is required, get or set" + std::string(kSeeHelp));
+        return ExitStatus::BadUsage;
     }
     SetLogMask(logMask);
     CollectEngineComplaints();
