@@ -8,6 +8,12 @@
 /** kxconfig get: prints the value or values under @p key in @p file, one on a line. */
 ExitStatus Get(const std::string& file, const std::string& key);
 
+/** kxconfig find: prints each node that @p expression selects, or the value that it has. */
+ExitStatus Find(const std::string& file, const std::string& expression);
+
+/** kxconfig keys: prints every key path under which @p file holds a value, with that value. */
+ExitStatus Keys(const std::string& file);
+
 struct SetArguments
 {
     std::string file;

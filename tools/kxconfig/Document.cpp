@@ -25,6 +25,10 @@ using EngineError = const xmlError*;
 using EngineError = xmlErrorPtr;
 #endif
 
+void Ignore(void*, const char*, ...)
+{
+}
+
 void KeepFirstComplaint(void*, EngineError error)
 {
     if (!g_firstComplaint.empty() || error->level < XML_ERR_ERROR || error->message == nullptr)
@@ -56,6 +60,23 @@ std::string WhyNotRead(const std::string& path)
         return std::strerror(EISDIR);
     }
     return "";
+}
+
+/** @return whether @p path is a file that can be read; begins a new collection of complaints. */
+bool CanBeRead(const std::string& path, std::string& complaint)
+{
+    g_firstComplaint.clear();
+    const std::string reason = WhyNotRead(path);
+    if (!reason.empty())
+    {
+        complaint = "cannot read " + (path.empty() ? Quoted(path) : path) + ": " + reason;
+    }
+    return reason.empty();
+}
+
+std::string WhyNotParsed(const std::string& path)
+{
+    return path + ":" + (g_firstComplaint.empty() ? " not parsed" : g_firstComplaint);
 }
 
 /** @return the name of the root element of @p document (an xmlDocPtr). */
@@ -98,24 +119,43 @@ void Complain(const std::string& message)
 void CollectEngineComplaints()
 {
     xmlSetStructuredErrorFunc(nullptr, KeepFirstComplaint);
+    xmlSetGenericErrorFunc(nullptr, Ignore); // some of XPath's say the same in other words
 }
 
 std::unique_ptr<CXMLReader> LoadFile(const std::string& path, std::string& complaint)
 {
-    const std::string reason = WhyNotRead(path);
-    if (!reason.empty())
+    if (!CanBeRead(path, complaint))
     {
-        complaint = "cannot read " + (path.empty() ? Quoted(path) : path) + ": " + reason;
         return nullptr;
     }
-    g_firstComplaint.clear();
     std::unique_ptr<CXMLReader> reader(GetCXMLReaderObject(path.c_str()));
     if (reader == nullptr || reader->GetDataPtr() == nullptr)
     {
-        complaint = path + ":" + (g_firstComplaint.empty() ? " not parsed" : g_firstComplaint);
+        complaint = WhyNotParsed(path);
         return nullptr;
     }
     return reader;
+}
+
+bool LoadDocument(const std::string& path, CXmlParser& document)
+{
+    std::string complaint;
+    if (!CanBeRead(path, complaint))
+    {
+        Complain(complaint);
+        return false;
+    }
+    if (document.ParseXml(path) != 0)
+    {
+        Complain(WhyNotParsed(path));
+        return false;
+    }
+    return true;
+}
+
+std::string FirstComplaint(const std::string& before)
+{
+    return g_firstComplaint.empty() ? "" : before + g_firstComplaint;
 }
 
 std::unique_ptr<CXMLReader> LoadFile(const std::string& path)

@@ -4,6 +4,7 @@
 #include "ExitStatus.h"
 
 #include "CXMLReader.h"
+#include "CXmlParser.h"
 
 #include <memory>
 #include <string>
@@ -25,6 +26,13 @@ std::unique_ptr<CXMLReader> LoadFile(const std::string& path, std::string& compl
 
 /** The same, complaining at once. */
 std::unique_ptr<CXMLReader> LoadFile(const std::string& path);
+
+/** Loads a file in the same way into a document of the toolkit, and complains if it cannot. */
+bool LoadDocument(const std::string& path, CXmlParser& document);
+
+/** @return the engine's first complaint since the last load, after @p before; or an empty string.
+ */
+std::string FirstComplaint(const std::string& before);
 
 /**
  * Complains if @p key cannot be one, or starts with another name than the root of @p reader, which

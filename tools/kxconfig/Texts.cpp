@@ -1,24 +1,9 @@
 #include "Texts.h"
 
-#include <libxml/tree.h>
+#include "Nodes.h"
 
 namespace
 {
-
-/** @return a copy of @p text, which is freed; empty for null. */
-std::string Taken(xmlChar* text)
-{
-    const std::string copy = text == nullptr ? "" : reinterpret_cast<const char*>(text);
-    xmlFree(text);
-    return copy;
-}
-
-/** @return whether @p node can be changed by an update: an element that holds text and no more. */
-bool HoldsOnlyText(const xmlNode* node)
-{
-    return node->type == XML_ELEMENT_NODE && node->children != nullptr &&
-           node->children->type == XML_TEXT_NODE && node->children->next == nullptr;
-}
 
 /** @return the node after @p node in document order, or null. */
 xmlNode* NextInDocument(xmlNode* node)
@@ -41,9 +26,9 @@ Texts::Texts(void* document)
     xmlNode* node = xmlDocGetRootElement(static_cast<xmlDoc*>(document));
     for (; node != nullptr; node = NextInDocument(node))
     {
-        if (HoldsOnlyText(node))
+        if (node->type == XML_ELEMENT_NODE && OnlyTextOf(node) != nullptr)
         {
-            m_texts.push_back({node, Taken(xmlNodeGetContent(node))});
+            m_texts.push_back({node, ContentOf(node)});
         }
     }
 }
@@ -53,10 +38,10 @@ std::vector<ChangedText> Texts::Changes() const
     std::vector<ChangedText> changes;
     for (const Text& text : m_texts)
     {
-        const std::string now = Taken(xmlNodeGetContent(text.element));
+        const std::string now = ContentOf(text.element);
         if (now != text.content)
         {
-            changes.push_back({Taken(xmlGetNodePath(text.element)), text.content, now});
+            changes.push_back({LocationOf(text.element), text.content, now});
         }
     }
     return changes;

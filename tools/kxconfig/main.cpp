@@ -23,9 +23,11 @@ const char* const kFooter =
     "  kxconfig set --dry-run device.xml cfg.name box show what would change\n"
     "  kxconfig set device.xml cfg.name box           change it and save the file\n"
     "  kxconfig set device.xml cfg.offset -- -5       a value that starts with a dash\n"
+    "  kxconfig keys device.xml                       print all keys and values\n"
+    "  kxconfig find device.xml '//net[@id]'          print the nodes that XPath selects\n"
     "\n"
     "Exit status:\n"
-    "  0 done, 1 nothing found, 2 bad usage or malformed key, 3 file unreadable or not "
+    "  0 done, 1 nothing found, 2 bad usage, malformed key or expression, 3 file unreadable or not "
     "well-formed,\n"
     "  4 saving failed: the file is as it was\n"
     "\n"
@@ -62,14 +64,22 @@ std::string RefuseStandardStreams(const std::string& file)
     return file == "-" ? "\"-\" is no file; name one" : std::string();
 }
 
+/** A subcommand whose first argument is a file. */
+CLI::App* AddFileCommand(CLI::App& app, const char* name, const char* description,
+                         std::string& file)
+{
+    CLI::App* const command = app.add_subcommand(name, description);
+    command->add_option("FILE", file, "an XML file")
+        ->required()
+        ->check(CLI::Validator(RefuseStandardStreams, ""));
+    return command;
+}
+
 /** A subcommand whose first two arguments are a file and a key. */
 CLI::App* AddKeyCommand(CLI::App& app, const char* name, const char* description,
                         SetArguments& arguments)
 {
-    CLI::App* const command = app.add_subcommand(name, description);
-    command->add_option("FILE", arguments.file, "an XML file")
-        ->required()
-        ->check(CLI::Validator(RefuseStandardStreams, ""));
+    CLI::App* const command = AddFileCommand(app, name, description, arguments.file);
     command->add_option("KEY", arguments.key, "a key path: root.element@attribute=value.element")
         ->required();
     return command;
@@ -88,7 +98,8 @@ ExitStatus ReportUsage(const CLI::App& app, const CLI::ParseError& error)
 
 ExitStatus Run(int argc, char** argv)
 {
-    SetArguments arguments; // "get" uses the first two
+    SetArguments arguments; // the others use the first, or the first two
+    std::string expression;
     std::string logMask;
     std::function<ExitStatus()> command;
 
@@ -113,6 +124,16 @@ ExitStatus Run(int argc, char** argv)
         ->check(CLI::Validator(RefuseStandardStreams, ""));
     set->callback([&] { command = [&] { return Set(arguments); }; });
 
+    AddFileCommand(app, "keys", "print every key path under which the file holds a value",
+                   arguments.file)
+        ->callback([&] { command = [&] { return Keys(arguments.file); }; });
+
+    CLI::App* const find = AddFileCommand(
+        app, "find", "print the nodes that an XPath expression selects, or its value",
+        arguments.file);
+    find->add_option("XPATH", expression, "an XPath 1.0 expression")->required();
+    find->callback([&] { command = [&] { return Find(arguments.file, expression); }; });
+
     try
     {
         app.parse(argc, argv);
@@ -123,7 +144,7 @@ ExitStatus Run(int argc, char** argv)
     }
     if (!command)
     {
-        Complain("a command is required, get or set" + std::string(kSeeHelp));
+        Complain("a command is required: get, set, keys or find" + std::string(kSeeHelp));
         return ExitStatus::BadUsage;
     }
     SetLogMask(logMask);

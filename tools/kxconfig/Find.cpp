@@ -1,0 +1,135 @@
+#include "Commands.h"
+#include "Document.h"
+#include "Nodes.h"
+
+#include <libxml/xpath.h>
+
+#include <iostream>
+#include <memory>
+
+namespace
+{
+
+struct FreeResult
+{
+    void operator()(xmlXPathObject* result) const { xmlXPathFreeObject(result); }
+};
+using Result = std::unique_ptr<xmlXPathObject, FreeResult>;
+
+const char* TypeName(const xmlNode* node)
+{
+    switch (node->type)
+    {
+    case XML_ELEMENT_NODE:
+        return "element";
+    case XML_ATTRIBUTE_NODE:
+        return "attribute";
+    case XML_TEXT_NODE:
+        return "text";
+    case XML_CDATA_SECTION_NODE:
+        return "cdata";
+    case XML_PI_NODE:
+        return "processing-instruction";
+    case XML_COMMENT_NODE:
+        return "comment";
+    case XML_DOCUMENT_NODE:
+        return "document";
+    case XML_NAMESPACE_DECL:
+        return "namespace";
+    default:
+        return "node"; // nothing else is selected by an expression
+    }
+}
+
+/** A namespace is no node of the tree: in a result, its next is the element that it was found on.
+ */
+std::string LocationOfNamespace(const xmlNs* space)
+{
+    const auto element = reinterpret_cast<const xmlNode*>(space->next);
+    const std::string prefix = space->prefix == nullptr ? "" : Text(space->prefix);
+    return LocationOf(element) + "/namespace::" + prefix;
+}
+
+std::string Attributes(const xmlNode* element)
+{
+    std::string attributes;
+    for (const xmlAttr* attribute = element->properties; attribute != nullptr;
+         attribute = attribute->next)
+    {
+        const auto node = reinterpret_cast<const xmlNode*>(attribute);
+        attributes += " " + Text(attribute->name) + "=" + Quoted(ContentOf(node));
+    }
+    return attributes;
+}
+
+/** @return whether @p node is best described by its content: not if that is all below it. */
+bool ShowsContent(const xmlNode* node)
+{
+    return node->type != XML_DOCUMENT_NODE &&
+           (node->type != XML_ELEMENT_NODE || OnlyTextOf(node) != nullptr);
+}
+
+std::string Line(const xmlNode* node)
+{
+    if (node->type == XML_NAMESPACE_DECL)
+    {
+        const auto space = reinterpret_cast<const xmlNs*>(node);
+        return LocationOfNamespace(space) + " namespace " + Quoted(Text(space->href));
+    }
+    std::string line = LocationOf(node) + " " + TypeName(node);
+    if (node->type == XML_ELEMENT_NODE)
+    {
+        line += Attributes(node);
+    }
+    if (ShowsContent(node))
+    {
+        line += " " + Quoted(ContentOf(node));
+    }
+    return line;
+}
+
+/** @return the number of nodes printed. */
+int PrintNodes(const xmlNodeSet* nodes)
+{
+    const int count = nodes == nullptr ? 0 : nodes->nodeNr;
+    for (int i = 0; i < count; ++i)
+    {
+        std::cout << Line(nodes->nodeTab[i]) << '\n';
+    }
+    return count;
+}
+
+void PrintScalar(xmlXPathObject* result)
+{
+    std::cout << Taken(xmlXPathCastToString(result)) << '\n';
+}
+
+} // namespace
+
+ExitStatus Find(const std::string& file, const std::string& expression)
+{
+    CXmlParser document;
+    if (!LoadDocument(file, document))
+    {
+        return ExitStatus::BadFile;
+    }
+    const CXmlNode top = document.FindNode("/", CXmlNode());
+    // Not FindAllNodes(), which ends at 255 nodes.
+    const Result result(document.GetNodeSet(expression, top));
+    if (result == nullptr)
+    {
+        Complain("malformed expression " + Quoted(expression) + FirstComplaint(": "));
+        return ExitStatus::BadUsage;
+    }
+    if (result->type != XPATH_NODESET)
+    {
+        PrintScalar(result.get());
+        return ExitStatus::Done;
+    }
+    if (PrintNodes(result->nodesetval) == 0)
+    {
+        Complain("nothing found: " + Quoted(expression) + " selects no node of " + file);
+        return ExitStatus::NothingFound;
+    }
+    return ExitStatus::Done;
+}
