@@ -28,10 +28,10 @@ void Redirect(int descriptor, const char* path, int flags)
 } // namespace
 
 Outcome RunProgram(const std::vector<std::string>& command,
-                   const std::vector<std::string>& environment)
+                   const std::vector<std::string>& environment, const std::string& output)
 {
     const TemporaryFolder folder;
-    const std::string out = folder.Path("out");
+    const std::string out = folder.Write("out", "");
     const std::string err = folder.Path("err");
 
     // A program for another architecture needs its emulator in front.
@@ -40,7 +40,7 @@ Outcome RunProgram(const std::vector<std::string>& command,
     std::vector<std::string> emulatorWords;
     for (std::string::size_type begin = 0; begin < emulator.size();)
     {
-        const auto end = std::min(emulator.find(';', begin), emulator.size());
+        const auto end = std::min(emulator.find('|', begin), emulator.size());
         emulatorWords.push_back(emulator.substr(begin, end - begin));
         begin = end + 1;
     }
@@ -62,7 +62,7 @@ Outcome RunProgram(const std::vector<std::string>& command,
     if (child == 0)
     {
         Redirect(STDIN_FILENO, "/dev/null", O_RDONLY);
-        Redirect(STDOUT_FILENO, out.c_str(), O_WRONLY | O_CREAT);
+        Redirect(STDOUT_FILENO, output.empty() ? out.c_str() : output.c_str(), O_WRONLY | O_CREAT);
         Redirect(STDERR_FILENO, err.c_str(), O_WRONLY | O_CREAT);
         for (const std::string& setting : environment)
         {

@@ -18,9 +18,12 @@ struct Outcome
 /**
  * Runs @p command (program and arguments) with @p environment ("NAME=value") added to the
  * environment, standard input empty, and waits for its end.
+ *
+ * @param output  the file that takes standard output instead of the outcome; empty for none.
  */
 Outcome RunProgram(const std::vector<std::string>& command,
-                   const std::vector<std::string>& environment = {});
+                   const std::vector<std::string>& environment = {},
+                   const std::string& output = "");
 
 } // namespace kxtest
 

@@ -174,8 +174,7 @@ TEST_F(KxconfigGet, HelpShowsExamples)
 TEST_F(KxconfigGet, OutputThatCannotBeWrittenIsNoSuccess)
 {
     const Outcome outcome =
-        RunProgram({"/bin/sh", "-c",
-                    std::string(KX_CONFIG_TOOL) + " get " + kGateway + " gateway.name >/dev/full"});
+        RunProgram({KX_CONFIG_TOOL, "get", kGateway, "gateway.name"}, {}, "/dev/full");
     EXPECT_NE(0, outcome.status);
     EXPECT_EQ("kxconfig: cannot write to standard output\n", outcome.err);
 }
