@@ -10,6 +10,10 @@ need() {
     done
     [ ${#missing[@]} -gt 0 ] || return 0
 
+    command -v apt-get >/dev/null || {
+        echo "missing packages, and no apt-get to install them: ${missing[*]}" >&2
+        return 1
+    }
     local as_root=()
     if [ "$(id -u)" -ne 0 ]; then
         command -v sudo >/dev/null || {
@@ -32,3 +36,7 @@ need() {
 }
 
 build_packages=(g++ cmake ninja-build libxml2-dev libcli11-dev)
+
+# For the tests of any build; the last line: packages whose files the tests read.
+test_packages=(clang libgtest-dev libgmock-dev pkg-config groff-base
+    fontconfig-config shared-mime-info xkb-data)

@@ -1,13 +1,17 @@
 #!/usr/bin/env bash
-# Installs what is missing, builds everything and runs all tests.
+# Installs what is missing, builds and tests.
+# usage: test.sh [STAGE...]
+#
+#   fast     everything as built for daily work, and under the sanitizers; an outside project uses what is installed
+#   package  the Debian packages: installed into a scratch root, used from there, removed
+#   abi98    everything with the target's kind of standard library (shared strings, a linear list::size)
+#   engine   everything with the newest libxml2 that Debian has as a source package
+#   arm      everything for ARMv7-A, in both calling conventions, under qemu-arm; the library's size
+#   host     fast and package; what runs if no stage is named
+#   all      all of them; what CI runs
 set -euo pipefail
 cd "$(dirname "$0")/.."
 . scripts/packages.sh
-
-# The last line: packages whose files the tests read.
-need "${build_packages[@]}" \
-    clang libgtest-dev libgmock-dev \
-    fontconfig-config shared-mime-info xkb-data
 
 # run_preset NAME — configures, builds and tests by the preset; quiet until something fails.
 run_preset() {
@@ -22,5 +26,56 @@ run_preset() {
     tail -n 3 "$log"
 }
 
-run_preset dev
-run_preset asan
+stage_fast() {
+    need "${build_packages[@]}" "${test_packages[@]}"
+    run_preset dev
+    run_preset asan
+}
+
+stage_package() {
+    need "${build_packages[@]}" pkg-config dpkg-dev fakeroot file
+    run_preset package
+}
+
+stage_abi98() {
+    need "${build_packages[@]}" "${test_packages[@]}" googletest
+    run_preset abi98
+}
+
+stage_engine() {
+    need "${build_packages[@]}" "${test_packages[@]}" dpkg-dev zlib1g-dev
+    scripts/newest_engine.sh
+    run_preset engine
+}
+
+stage_arm() {
+    need "${build_packages[@]}" "${test_packages[@]}" googletest \
+        g++-arm-linux-gnueabihf g++-arm-linux-gnueabi qemu-user
+    local architecture
+    for architecture in armhf armel; do
+        scripts/arm_sysroot.sh $architecture
+        run_preset $architecture
+    done
+    scripts/arm_size.sh
+}
+
+stage_host() {
+    stage_fast
+    stage_package
+}
+
+stage_all() {
+    stage_host
+    stage_abi98
+    stage_engine
+    stage_arm
+}
+
+[ $# -gt 0 ] || set -- host
+for stage in "$@"; do
+    declare -F "stage_$stage" >/dev/null ||
+        { echo "$0: no stage \"$stage\"; there are fast, package, abi98, engine, arm, host, all" >&2; exit 2; }
+done
+for stage in "$@"; do
+    "stage_$stage"
+done

@@ -8,7 +8,7 @@ list=$2
 
 # Demangled, with the string type under its short name, so that one list serves every ABI.
 exported() {
-    nm -D --defined-only --demangle "$library" |
+    "${NM:-nm}" -D --defined-only --demangle "$library" |
         sed -E -e 's/^[0-9a-f]+ . //' \
             -e 's/std::(__cxx11::)?basic_string<char, std::char_traits<char>, std::allocator<char> ?>/std::string/g' \
             -e 's/std::__cxx11::list</std::list</g' |

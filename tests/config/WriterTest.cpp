@@ -534,64 +534,6 @@ TEST_F(WriterTest, RecordsSurroundTheEnginesWork)
               log.Take());
 }
 
-// --- The interface's table
-
-TEST_F(WriterTest, TheTableKeepsTheSlotOrder)
-{
-    CXMLWriter writer;
-    IConfigWriter* const interface = &writer;
-    void** const table = *reinterpret_cast<void***>(interface);
-    using OfText = int (*)(IConfigWriter*, const std::string&);
-    using OfNothing = int (*)(IConfigWriter*);
-    using OfPointer = void (*)(IConfigWriter*, void*);
-    using OfTexts = int (*)(IConfigWriter*, const std::string&, std::string*);
-
-    LogRecorder log;
-    EXPECT_EQ(0, reinterpret_cast<OfText>(table[2])(interface, m_file));
-    EXPECT_EQ(Trace("ParseFile", "+"), log.Take().front());
-    std::string value = "slot"; // a string by value is passed by the address of the caller's copy
-    EXPECT_EQ(0, reinterpret_cast<OfTexts>(table[3])(interface, "cfg.name", &value));
-    EXPECT_EQ(Trace("SetValue", "Key cfg.name"), log.Take().front());
-    EXPECT_EQ(0, reinterpret_cast<OfNothing>(table[4])(interface));
-    EXPECT_EQ(Records({Trace("SaveData", "+")}), log.Take());
-    EXPECT_EQ(kDeclaration + "<cfg><name>slot</name></cfg>\n", ReadFile(m_file));
-    EXPECT_EQ(7, reinterpret_cast<OfText>(table[5])(interface, ""));
-    EXPECT_EQ(Records(), log.Take());
-
-    const OwnedDocument document(Loose());
-    CXMLWriter other;
-    IConfigWriter* const otherInterface = &other;
-    log.Take();
-    reinterpret_cast<OfPointer>(table[6])(otherInterface, nullptr);
-    EXPECT_EQ(Records({Error("SetDataPtr", kNoData)}), log.Take());
-
-    using Destructor = void (*)(IConfigWriter*);
-    IConfigWriter* const owned = GetCXMLWriterObjectNoParam();
-    LogRecorder::SetMask(kMaskNone);
-    const NewCounter heap;
-    reinterpret_cast<Destructor>((*reinterpret_cast<void***>(owned))[1])(owned);
-    EXPECT_EQ(-1, heap.Live());
-
-    alignas(CXMLWriter) unsigned char storage[sizeof(CXMLWriter)];
-    IConfigWriter* const placed = new (storage) CXMLWriter;
-    const NewCounter heapOfPlaced;
-    reinterpret_cast<Destructor>((*reinterpret_cast<void***>(placed))[0])(placed);
-    EXPECT_EQ(0, heapOfPlaced.Live());
-}
-
-TEST_F(WriterTest, TheObjectIsItsTableItsDocumentAndItsPath)
-{
-    EXPECT_EQ(2 * sizeof(void*) + sizeof(std::string), sizeof(CXMLWriter));
-    const OwnedDocument document(Loose());
-    CXMLWriter writer(m_file);
-    const auto path = reinterpret_cast<std::string*>(reinterpret_cast<void**>(&writer) + 2);
-    EXPECT_EQ(m_file, *path);
-    CXMLWriter adopter;
-    adopter.SetDataPtr(document.get());
-    EXPECT_EQ(document.get(), reinterpret_cast<void**>(&adopter)[1]);
-    adopter.SetDataPtr(nullptr);
-}
-
 // --- The factories
 
 TEST_F(WriterTest, FactoryMakesAWriterOfTheFile)

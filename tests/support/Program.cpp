@@ -32,7 +32,7 @@ std::vector<std::string> EmulatorWords()
     const std::string emulator = KX_TEST_EMULATOR;
     for (std::string::size_type begin = 0; begin < emulator.size();)
     {
-        const auto end = std::min(emulator.find(';', begin), emulator.size());
+        const auto end = std::min(emulator.find('|', begin), emulator.size());
         words.push_back(emulator.substr(begin, end - begin));
         begin = end + 1;
     }

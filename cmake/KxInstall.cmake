@@ -1,0 +1,51 @@
+# What cmake --install puts where. Components: runtime (the libraries), development (what a client is built
+# with), tools (kxconfig).
+include(CMakePackageConfigHelpers)
+
+set(package_dir ${CMAKE_INSTALL_LIBDIR}/cmake/${PROJECT_NAME})
+set(pkgconfig_dir ${CMAKE_INSTALL_LIBDIR}/pkgconfig)
+
+# kx_install_library(<target> <folder of headers>): both for the export that the package config reads
+function(kx_install_library target headers)
+    install(TARGETS ${target} EXPORT ${PROJECT_NAME}Targets
+        LIBRARY DESTINATION ${CMAKE_INSTALL_LIBDIR} COMPONENT runtime NAMELINK_COMPONENT development
+        INCLUDES DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/${target})
+    install(DIRECTORY ${headers}/ DESTINATION ${CMAKE_INSTALL_INCLUDEDIR}/${target}
+        COMPONENT development FILES_MATCHING PATTERN "*.h")
+endfunction()
+
+kx_install_library(KX_XMLConfigParser ${PROJECT_SOURCE_DIR}/include)
+
+# A real platform brings its own headers and libraries; clients find them where this build did.
+if(KX_PLATFORM STREQUAL "external")
+    install(TARGETS KX_Platform EXPORT ${PROJECT_NAME}Targets)
+    string(REPLACE ";" " " pc_platform_libs "${KX_PLATFORM_LIBRARIES}")
+    set(pc_platform_cflags -I${KX_PLATFORM_INCLUDE_DIR})
+else()
+    kx_install_library(KX_Platform ${PROJECT_SOURCE_DIR}/platform/include)
+    set(pc_platform_libs -lKX_Platform)
+    set(pc_platform_cflags -I\${includedir}/KX_Platform)
+endif()
+
+install(EXPORT ${PROJECT_NAME}Targets NAMESPACE KX:: DESTINATION ${package_dir} COMPONENT development)
+configure_package_config_file(cmake/${PROJECT_NAME}Config.cmake.in ${PROJECT_NAME}Config.cmake
+    INSTALL_DESTINATION ${package_dir} NO_SET_AND_CHECK_MACRO)
+write_basic_package_version_file(${PROJECT_NAME}ConfigVersion.cmake COMPATIBILITY SameMajorVersion)
+install(FILES
+    ${PROJECT_BINARY_DIR}/${PROJECT_NAME}Config.cmake
+    ${PROJECT_BINARY_DIR}/${PROJECT_NAME}ConfigVersion.cmake
+    DESTINATION ${package_dir} COMPONENT development)
+
+# The file tells its prefix from its own place, so that it holds in any prefix and in a staged one.
+file(RELATIVE_PATH pc_to_prefix ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig ${CMAKE_INSTALL_PREFIX})
+string(REGEX REPLACE "/$" "" pc_to_prefix "${pc_to_prefix}")
+file(RELATIVE_PATH pc_libdir ${CMAKE_INSTALL_PREFIX} ${CMAKE_INSTALL_FULL_LIBDIR})
+file(RELATIVE_PATH pc_includedir ${CMAKE_INSTALL_PREFIX} ${CMAKE_INSTALL_FULL_INCLUDEDIR})
+configure_file(cmake/${PROJECT_NAME}.pc.in ${PROJECT_NAME}.pc @ONLY)
+install(FILES ${PROJECT_BINARY_DIR}/${PROJECT_NAME}.pc DESTINATION ${pkgconfig_dir} COMPONENT development)
+
+if(KX_BUILD_TOOLS)
+    install(TARGETS kxconfig DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT tools)
+    configure_file(tools/kxconfig/kxconfig.1.in kxconfig.1 @ONLY)
+    install(FILES ${PROJECT_BINARY_DIR}/kxconfig.1 DESTINATION ${CMAKE_INSTALL_MANDIR}/man1 COMPONENT tools)
+endif()
