@@ -14,11 +14,24 @@ using namespace kx;
 namespace
 {
 
-/** @return the nodes of @p result, at least one, or null: a number, say, or an empty selection. */
-const xmlNodeSet* NodesOf(const xmlXPathObject* result)
+/**
+ * @return the nodes of @p result, at least one, on behalf of the operation @p tag; or null, with
+ * the record that says why: no result, or a number, say, or an empty selection.
+ */
+const xmlNodeSet* NodesOf(const xmlXPathObject* result, const char* tag)
 {
+    if (result == 0)
+    {
+        KX_XPATH_AS(tag, "xmlXPathObjectPtr is NULL");
+        return 0;
+    }
     const xmlNodeSet* const nodes = result->nodesetval;
-    return nodes != 0 && nodes->nodeNr >= 1 ? nodes : 0;
+    if (nodes == 0 || nodes->nodeNr < 1)
+    {
+        KX_XPATH_AS(tag, "NodeSetVal is NULL");
+        return 0;
+    }
+    return nodes;
 }
 
 /** @return an entry, or null for a namespace: that is a copy which dies with the result. */
@@ -88,18 +101,8 @@ CXmlNode CXmlParser::FindNode(std::string expression, CXmlNode contextNode)
     KX_TRACE("+");
     CXmlNode first;
     xmlXPathObject* const result = GetNodeSet(expression, contextNode);
-    if (result == 0)
-    {
-        KX_XPATH("xmlXPathObjectPtr is NULL");
-        KX_TRACE("-");
-        return first;
-    }
-    const xmlNodeSet* const nodes = NodesOf(result);
-    if (nodes == 0)
-    {
-        KX_XPATH("NodeSetVal is NULL");
-    }
-    else
+    const xmlNodeSet* const nodes = NodesOf(result, "FindNode");
+    if (nodes != 0)
     {
         first.SetXmlNodePtr(EntryOf(nodes, 0));
     }
@@ -113,18 +116,8 @@ std::list<CXmlNode> CXmlParser::FindAllNodes(std::string expression, CXmlNode co
     KX_TRACE("+");
     std::list<CXmlNode> found;
     xmlXPathObject* const result = GetNodeSet(expression, contextNode);
-    if (result == 0)
-    {
-        KX_XPATH("xmlXPathObjectPtr is NULL");
-        KX_TRACE("-");
-        return found;
-    }
-    const xmlNodeSet* const nodes = NodesOf(result);
-    if (nodes == 0)
-    {
-        KX_XPATH("NodeSetVal is NULL");
-    }
-    else
+    const xmlNodeSet* const nodes = NodesOf(result, "FindAllNodes");
+    if (nodes != 0)
     {
         AppendEntries(nodes, found);
     }
