@@ -118,9 +118,8 @@ int CXmlNode::SetContent(std::string text)
 {
     KX_TRACE("+");
     int status = StatusMissing;
-    if (OwnsItsContent(m_pXmlNode))
+    if (OwnsItsContent(m_pXmlNode) && ReplaceContent(m_pXmlNode, text))
     {
-        ReplaceContent(m_pXmlNode, text);
         status = StatusOk;
     }
     KX_TRACE("-");
@@ -223,9 +222,8 @@ int CXmlNode::RemoveChildNode(std::string name)
     KX_TRACE("+");
     int status = StatusMissing;
     CXmlNode child = FindChildNode(name);
-    if (child.m_pXmlNode != 0)
+    if (child.m_pXmlNode != 0 && RemoveFromTree(child.m_pXmlNode))
     {
-        RemoveFromTree(child.m_pXmlNode);
         status = StatusOk;
     }
     KX_TRACE("-");

@@ -10,8 +10,7 @@
 
 #include <fstream>
 
-// Later engines call the blanks default deprecated; there is no other that acts on the whole
-// process.
+// Later engines call the blanks default deprecated; there is no other for parses by xmlParseFile.
 #pragma GCC diagnostic ignored "-Wdeprecated-declarations"
 
 using namespace kx;
@@ -56,7 +55,7 @@ void CleanUpEngine()
 CXmlParser::CXmlParser() : m_pXmlDoc(0)
 {
     KX_TRACE("+");
-    // Deliberately for every later parse of the process, the configuration reader's included.
+    // Deliberately for every later parse, the configuration reader's included.
     xmlKeepBlanksDefault(0);
     KX_TRACE("-");
 }

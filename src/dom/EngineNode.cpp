@@ -42,19 +42,22 @@ bool IsAttribute(const xmlNode* node)
  *
  * The engine's table of IDs finds an entry by the attribute's value: an attribute whose value was
  * changed would stay in the table after it is freed.
+ *
+ * @return false if the engine could not, for want of memory: then the value must stay as it is.
  */
-void ForgetId(xmlNode* node)
+bool ForgetId(xmlNode* node)
 {
     xmlNode* const owner = IsAttribute(node) ? node : LinkOf(node, &xmlNode::parent);
     if (!IsAttribute(owner))
     {
-        return;
+        return true;
     }
     xmlAttr* const attribute = reinterpret_cast<xmlAttr*>(owner);
     if (attribute->atype == XML_ATTRIBUTE_ID)
     {
         xmlRemoveID(attribute->doc, attribute);
     }
+    return attribute->atype != XML_ATTRIBUTE_ID;
 }
 
 /** Whether @p attribute has a name and, unless @p value is empty, a text. */
@@ -143,18 +146,27 @@ bool AddAttribute(xmlNode* node, const std::string& name, const std::string& val
     return attribute != 0;
 }
 
-void ReplaceContent(xmlNode* node, const std::string& text)
+bool ReplaceContent(xmlNode* node, const std::string& text)
 {
-    ForgetId(node);
+    if (!ForgetId(node))
+    {
+        return false;
+    }
     xmlNodeSetContent(node, ToEngine(text));
+    return true;
 }
 
-void RemoveChildren(xmlNode* node)
+bool RemoveChildren(xmlNode* node)
 {
-    while (LinkOf(node, &xmlNode::children) != 0)
+    if (IsAttribute(node) && !ForgetId(node))
+    {
+        return false;
+    }
+    while (node->children != 0)
     {
         RemoveFromTree(node->children);
     }
+    return true;
 }
 
 void RemoveAttributes(xmlNode* node)
@@ -167,14 +179,16 @@ void RemoveAttributes(xmlNode* node)
     }
 }
 
-void RemoveFromTree(xmlNode* node)
+bool RemoveFromTree(xmlNode* node)
 {
-    if (!IsAttribute(node))
+    // An attribute that goes as a whole is taken out of the table by the engine.
+    if (!IsAttribute(node) && !ForgetId(node))
     {
-        ForgetId(node);
+        return false;
     }
     xmlUnlinkNode(node);
     xmlFreeNode(node);
+    return true;
 }
 
 } // namespace kx

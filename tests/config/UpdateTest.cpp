@@ -337,6 +337,14 @@ TEST_F(UpdateTest, TrailingDotThatUpdatesNothingIsNotFound)
     EXPECT_EQ((Result{-2, "<cfg><b>1</b></cfg>"}), Set("<cfg><b>1</b></cfg>", "cfg.a.", "2"));
 }
 
+TEST_F(UpdateTest, TrailingDotLeavesAnEmptyNameForTheSiblings)
+{
+    EXPECT_EQ((Result{-2, "<cfg><b/><a>1</a></cfg>"}),
+              Set("<cfg><b/><a>1</a></cfg>", "cfg.a.", "2"));
+    EXPECT_EQ((Result{22, "<cfg><a>2</a><a>1</a></cfg>"}),
+              Set("<cfg><a>1</a><a>1</a></cfg>", "cfg.a.", "2"));
+}
+
 TEST_F(UpdateTest, StatusIsThatOfTheLastDescent)
 {
     // The last child is entered with "a." and has no element children, so it answers 0.
@@ -397,6 +405,21 @@ TEST_F(UpdateTest, LogsTheKeyOfEachLevelInDocumentOrder)
                        Value("XMLSetValue", "Key :: b"),   // below a
                        Value("XMLSetValue", "Key :: b"),   // below b
                        Value("XMLSetValue", "Key :: b")}), // below c
+              log.Take());
+    writer.SetDataPtr(nullptr);
+}
+
+TEST_F(UpdateTest, LogsTheKeyOfLevelsHoweverDeep)
+{
+    Load("<cfg><a><b><c><d><e/></d></c></b></a></cfg>");
+    CXMLWriter writer;
+    writer.SetDataPtr(m_document);
+    LogRecorder log;
+    EXPECT_EQ(-2, writer.SetValue("cfg.a.b.c", "2"));
+    EXPECT_EQ(Records({Trace("SetValue", "Key cfg.a.b.c"), Value("XMLSetValue", "Key :: a.b.c"),
+                       Value("XMLSetValue", "Key :: b.c"), Value("XMLSetValue", "Key :: c"),
+                       Value("XMLSetValue", "Key :: c"), Value("XMLSetValue", "Key :: c"),
+                       Value("XMLSetValue", "Key :: c")}),
               log.Take());
     writer.SetDataPtr(nullptr);
 }

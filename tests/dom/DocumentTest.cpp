@@ -568,6 +568,20 @@ TEST_F(DocumentTest, IsReadableLeavesNoFileOpen)
     EXPECT_EQ(before, open());
 }
 
+TEST_F(DocumentTest, LoadingReleasesTheDocumentHeldBeforeItLooksAtTheFile)
+{
+    CXmlParser parser;
+    ASSERT_EQ(0, parser.ParseXml(m_file));
+    EngineCalls calls;
+    calls.ShowAmongRecords();
+    LogRecorder log;
+    EXPECT_EQ(0, parser.ParseXml(m_other));
+    EXPECT_EQ(Traced("ParseXml", Records({Engine("xmlFreeDoc"), Engine("xmlCleanupParser")}) +
+                                     Traced("IsReadable") + Records({Engine("xmlParseFile")}) +
+                                     Traced("SetXmlNodePtr")),
+              log.Take());
+}
+
 // --- What a release does to others
 
 TEST_F(DocumentTest, DocumentsHeldElsewhereSurviveARelease)

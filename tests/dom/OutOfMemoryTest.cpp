@@ -160,6 +160,37 @@ TEST_F(OutOfMemoryTest, SettingContentLosesNoMemory)
         });
 }
 
+TEST_F(OutOfMemoryTest, AttributeStaysAnIdWhileItsValueCannotBeChanged)
+{
+    const auto changes = {+[](xmlNodePtr id) { return CXmlNode(id).SetContent("other"); },
+                          +[](xmlNodePtr id) { return CXmlNode(id).ClearNode(); },
+                          +[](xmlNodePtr id) { return CXmlNode(id->children).SetContent("other"); },
+                          +[](xmlNodePtr id)
+                          { return CXmlParser().RemoveNode(CXmlNode(id->children)); }};
+    for (const auto& change : changes)
+    {
+        FailInTurn(
+            [&](std::size_t n)
+            {
+                const xmlDocPtr document = Parse("<!DOCTYPE a [<!ATTLIST a id ID #IMPLIED>]><a "
+                                                 "id='a rather long value of it'/>");
+                const xmlNodePtr id = NodeOf(document, "/a/@id");
+                int status = -1;
+                const bool failed = Failing(n, [&] { status = change(id); });
+                EXPECT_TRUE(status == 0 || (failed && status == 22)) << status;
+                if (status == 22)
+                {
+                    EXPECT_EQ("<a id=\"a rather long value of it\"/>",
+                              TextOf(xmlDocGetRootElement(document)));
+                }
+                // Freed now, and the engine must not look at it again.
+                EXPECT_EQ(0, CXmlParser().RemoveNode(CXmlNode(id)));
+                EXPECT_EQ(nullptr, NodeOf(document, "id('a rather long value of it')"));
+                return failed;
+            });
+    }
+}
+
 TEST_F(OutOfMemoryTest, ContentIsReadOrEmpty)
 {
     CXmlNode node(Node("//name"));

@@ -457,3 +457,10 @@ TEST_F(QueryTest, NodeOfAnotherDocumentIsRemovedThere)
     EXPECT_EQ(0, m_empty.RemoveNode(Node("//net")));
     EXPECT_EQ(nullptr, Node("//net"));
 }
+
+TEST_F(QueryTest, NullContextIsNoElement)
+{
+    // Not the root element, whose children a relative expression would find.
+    EXPECT_TRUE(m_parser.FindNode("b", CXmlNode()).IsNull());
+    EXPECT_TRUE(m_parser.FindAllNodes("b", CXmlNode()).empty());
+}

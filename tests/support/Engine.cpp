@@ -135,6 +135,7 @@ extern "C" void xmlCleanupParser()
 {
     static const auto engine = Next(&xmlCleanupParser, "xmlCleanupParser");
     g_cleanups += g_noting;
+    Show("xmlCleanupParser");
     engine();
 }
 

@@ -35,7 +35,9 @@ public:
     /** @return the names given to xmlGetProp. */
     const std::vector<std::string>& PropertiesRead() const;
 
-    /** From now on xmlParseFile, xmlFreeDoc and xmlSaveFileEnc stand among the records of the log.
+    /**
+     * From now on xmlParseFile, xmlFreeDoc, xmlCleanupParser and xmlSaveFileEnc stand among the
+     * records of the log.
      */
     void ShowAmongRecords();
 
