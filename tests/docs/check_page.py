@@ -12,6 +12,7 @@ Each fenced block of the page is dealt with by its language, in the order of the
   console  lines after "$ " are commands, the lines below each are what it must print; "> " continues a command,
            a line "..." stands for any number of lines
   sh       must run without a failure
+  python   must be a program; commands run it
   text     a drawing; nothing is run
 
 Comments before a block say more of it:
@@ -207,6 +208,12 @@ class Checker:
 
     def check_sh(self, block, _):
         self.must_run(["bash", "-euo", "pipefail", "-c", block.text])
+
+    def check_python(self, block, _):
+        try:
+            compile(block.text, "block", "exec")
+        except SyntaxError as error:
+            raise Failure(str(error)) from None
 
     def check_text(self, block, _):
         """A drawing."""
