@@ -1,7 +1,10 @@
 #!/usr/bin/env python3
 """Runs what a page of the documentation shows, and fails where the page is wrong.
 
-usage: check_page.py --root FOLDER --build FOLDER --cxx COMPILER [--cxx-flags FLAGS] --engine FOLDER PAGE
+usage: check_page.py --root FOLDER --build FOLDER --cxx COMPILER [--cxx-flags FLAGS] --engine FOLDER [--update] PAGE
+
+With --update, what commands and programs print is written into the page where it differs; read it before you
+believe it.
 
 Each fenced block of the page is dealt with by its language, in the order of the page, in one scratch folder:
 
@@ -87,19 +90,13 @@ def matches(expected, actual):
     return bool(actual) and expected[0] == actual[0] and matches(expected[1:], actual[1:])
 
 
-def compare(what, expected, actual):
-    expected, actual = comparable(expected), comparable(actual)
-    if not matches(expected, actual):
-        difference = difflib.unified_diff(expected, actual, "the page", "what happens", lineterm="", n=99)
-        raise Failure(what + "\n" + "\n".join(difference))
-
-
 class Checker:
     def __init__(self, options, scratch):
         self.options = options
         self.scratch = scratch / "work"
         self.scratch.mkdir()
         self.programs = 0
+        self.corrections = {}  # of blocks, by line
         self.status = 0
         root, build = options.root, options.build
         self.includes = [f"-I{root}/include", f"-I{root}/platform/include", "-isystem", options.engine,
@@ -136,6 +133,27 @@ class Checker:
             raise Failure(f"status {status} of {' '.join(map(str, command))}\n{output}")
         return output
 
+    def compared(self, what, expected, actual):
+        """Returns what the page is to show, which is what it shows unless it is to be updated."""
+        wanted, happened = comparable(expected), comparable(actual)
+        if matches(wanted, happened):
+            return expected
+        if self.options.update:
+            return actual if actual.endswith("\n") or not actual else actual + "\n"
+        difference = difflib.unified_diff(wanted, happened, "the page", "what happens", lineterm="", n=99)
+        raise Failure(what + "\n" + "\n".join(difference))
+
+    def corrected(self):
+        """The page with the corrections."""
+        lines = self.options.page.read_text().splitlines(keepends=True)
+        for line, (old, new) in sorted(self.corrections.items(), reverse=True):
+            lines[line : line + old.count("\n")] = [new]
+        return "".join(lines)
+
+    def correct(self, block, text):
+        if text != block.text:
+            self.corrections[block.line] = (block.text, text)
+
     def check_all(self, blocks):
         for block, following in zip(blocks, blocks[1:] + [None]):
             where = f"{self.options.page}:{block.line}: "
@@ -169,7 +187,8 @@ class Checker:
                        *shlex.split(self.options.cxx_flags), *self.includes, str(source), "-o", str(binary),
                        *self.link])
         if following is not None and following.language == "output":
-            compare("the program prints something else", following.text, self.must_run([str(binary)]))
+            printed = self.must_run([str(binary)])
+            self.correct(following, self.compared("the program prints something else", following.text, printed))
 
     @staticmethod
     def program_around(block):
@@ -184,20 +203,21 @@ class Checker:
         """Compared with the block before it."""
 
     def check_console(self, block, _):
-        command, expected = None, ""
+        command, expected, shown = None, "", ""
         for line in block.text.splitlines() + ["$ "]:
             if line.startswith("$ "):
                 if command is not None:
-                    self.check_command(command, expected)
+                    shown += "$ " + command.replace("\n", "\n> ") + "\n" + self.check_command(command, expected)
                 command, expected = line[2:], ""
             elif line.startswith("> ") and not expected:
                 command += "\n" + line[2:]
             else:
                 expected += line + "\n"
+        self.correct(block, shown)
 
     def check_command(self, command, expected):
         self.status, output = self.run(["bash", "-c", self.in_session(command)])
-        compare("$ " + command, expected, output)
+        return self.compared("$ " + command, expected, output)
 
     def in_session(self, command):
         """The command with the status, the folder and the exported variables that the one before it left."""
@@ -226,12 +246,16 @@ def main():
     parser.add_argument("--cxx", required=True)
     parser.add_argument("--cxx-flags", default="")
     parser.add_argument("--engine", required=True)
+    parser.add_argument("--update", action="store_true")
     parser.add_argument("page", type=pathlib.Path)
     options = parser.parse_args()
     scratch = pathlib.Path(tempfile.mkdtemp(prefix="kx-docs-"))
     try:
         blocks = blocks_of(options.page)
-        Checker(options, scratch).check_all(blocks)
+        checker = Checker(options, scratch)
+        checker.check_all(blocks)
+        if checker.corrections:
+            options.page.write_text(checker.corrected())
     except Failure as failure:
         print(failure, file=sys.stderr)
         return 1
