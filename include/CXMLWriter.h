@@ -34,12 +34,11 @@ struct _xmlNode;
  * Holds one XML configuration document and the path that it is saved to, and replaces element text
  * addressed by key path.
  *
- * | state              | entered by                                          | SetValue() |
- * SaveData() | | ------------------ | --------------------------------------------------- |
- * ---------- | ---------- | | no document        | default constructor, a failed parse,
- * SetDataPtr(0)  | 7          | -2         | | document, no path  | SetDataPtr() on a writer
- * without a path             | works      | -2         | | document and path  | a successful parse;
- * SetDataPtr() and SetPath()      | works      | 0 or -2    |
+ * | state             | entered by                                       | SetValue | SaveData |
+ * | ----------------- | ------------------------------------------------ | -------- | -------- |
+ * | no document       | default constructor, failed parse, SetDataPtr(0) | 7        | -2       |
+ * | document, no path | SetDataPtr() on a writer without a path          | works    | -2       |
+ * | document and path | a successful parse; SetDataPtr() and SetPath()   | works    | 0 or -2  |
  *
  * The writer owns the document that it holds at any moment: its destructor and ParseFile() free it.
  * Only SetDataPtr() drops a document without freeing it.
@@ -120,13 +119,13 @@ public:
      *
      * @par What becomes of the value
      * The engine takes it as XML text in which entity references are recognised:
-     * | value                  | the element then holds                                          |
-     * | ---------------------- | --------------------------------------------------------------- |
-     * | a&lt;b                 | the text; the bracket is escaped when saved                     |
-     * | a&amp;amp;b            | the text a&amp;b; saved as a&amp;amp;b                          |
-     * | a&amp;b                | nothing, or what the engine's version makes of it: write &amp;amp;
-     * | | &amp;name; (undefined) | a reference; the file saves, but does not load any more | |
-     * empty                  | nothing: a later SetValue() does not reach the element any more |
+     * | value                  | the element then holds                                |
+     * | ---------------------- | ----------------------------------------------------- |
+     * | a&lt;b                 | the text; the bracket is escaped when saved           |
+     * | a&amp;amp;b            | the text a&amp;b; saved as a&amp;amp;b                |
+     * | a&amp;b                | nothing, or what the engine's version makes of it     |
+     * | &amp;name; (undefined) | a reference; the file saves, but does not load again  |
+     * | empty                  | nothing: a later SetValue() does not reach it         |
      *
      * Control characters other than tab, newline and carriage return save, but do not load again;
      * newer engines replace them when they save. A value is used up to its first NUL byte.

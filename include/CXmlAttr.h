@@ -30,7 +30,12 @@ public:
     /** Makes a pair of empty strings. Logs "+" and "-" (level 11, tag "CXmlAttr"). */
     CXmlAttr();
 
-    /** Makes a pair of @p name and @p value. Logs "+" and "-" (level 11, tag "CXmlAttr"). */
+    /**
+     * Makes a pair. Logs "+" and "-" (level 11, tag "CXmlAttr").
+     *
+     * @param name   the attribute's name.
+     * @param value  the attribute's value.
+     */
     CXmlAttr(std::string name, std::string value);
 
     /** Logs "+" and "-" (level 11, tag "~CXmlAttr"), then releases both strings. */

@@ -120,15 +120,20 @@ public:
     /** Makes a null handle. */
     CXmlNode();
 
-    /** Makes a handle on @p node (an xmlNodePtr), which may be null and is not validated. */
+    /**
+     * Makes a handle on a node.
+     *
+     * @param node  an xmlNodePtr; may be null, and is not validated.
+     */
     CXmlNode(_xmlNode* node);
 
     /** Releases nothing: neither the node nor its tree. */
     ~CXmlNode();
 
     /**
-     * Makes the handle designate @p node, which may be null and is not validated. The node that it
-     * designated before is left as it is.
+     * Makes the handle designate @p node. The node that it designated before is left as it is.
+     *
+     * @param node  an xmlNodePtr; may be null, and is not validated.
      */
     void SetXmlNodePtr(_xmlNode* node);
 
@@ -204,6 +209,7 @@ public:
      * handles on them dangle; an empty text leaves no child. A text, CDATA section, comment or
      * processing instruction gets @p text as its own.
      *
+     * @param text  the new content; may be empty.
      * @return 0; 22 for a null handle or a node that is refused.
      */
     int SetContent(std::string text);
@@ -223,7 +229,8 @@ public:
     std::list<CXmlNode> Children();
 
     /**
-     * @return a handle on the first child with exactly this @p name, or a null handle.
+     * @param name  the child's name.
+     * @return a handle on the first child with exactly this name, or a null handle.
      *
      * Under an element children of every kind are compared, each under the name that the engine
      * gives it: "text" finds the first text child, "comment" the first comment. Under a node that
@@ -231,7 +238,10 @@ public:
      */
     CXmlNode FindChildNode(std::string name);
 
-    /** @return handles on all children that FindChildNode() would accept, in document order. */
+    /**
+     * @param name  the children's name.
+     * @return handles on all children that FindChildNode() would accept, in document order.
+     */
     std::list<CXmlNode> FindAllChildNodes(std::string name);
 
     /**
@@ -267,6 +277,7 @@ public:
      * Removes and frees the first child that FindChildNode() finds under @p name, with all below
      * it. Handles on what was removed dangle.
      *
+     * @param name  the child's name.
      * @return 0, or 22 if there is no such child or this is a null handle.
      */
     int RemoveChildNode(std::string name);
@@ -281,6 +292,8 @@ public:
      * It is not checked whether there is one of this name: the element then has two, the saved file
      * does not load again, and GetAttributeValue() finds the first. Ask GetAttributeValue() before.
      *
+     * @param name   the attribute's name.
+     * @param value  its value, given plain: references are not recognised.
      * @return
      * - 0 if it was added,
      * - 22 for a null handle ("Node ptr is NULL", level 9),
@@ -315,14 +328,21 @@ public:
     std::list<CXmlAttr> GetAttributeItems();
 
     /**
-     * Does nothing and answers 0. Logs "RemoveAttribute feature is not available, Reason: This API
-     * is not supported by libxml2 present in QNX650" (level 8).
+     * Does nothing. Logs "RemoveAttribute feature is not available, Reason: This API is not
+     * supported by libxml2 present in QNX650" (level 8).
+     *
+     * @param name  not looked at.
+     * @return 0.
      */
     int RemoveAttribute(std::string name);
 
     /**
-     * Does nothing and answers 0. Logs "SetAttributeValue feature is not available, Reason: This
-     * API is not supported by libxml2 present in QNX650" (level 8).
+     * Does nothing. Logs "SetAttributeValue feature is not available, Reason: This API is not
+     * supported by libxml2 present in QNX650" (level 8).
+     *
+     * @param name   not looked at.
+     * @param value  not looked at.
+     * @return 0.
      */
     int SetAttributeValue(std::string name, std::string value);
     ///@}

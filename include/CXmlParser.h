@@ -91,6 +91,7 @@ public:
      * A document that was held is released first, whatever becomes of the load. The path is
      * recorded as the default target of SaveXml(), also when the load fails.
      *
+     * @param path  a file's path.
      * @return
      * - 0 if a document is held now, also one without a root element,
      * - 7 if the file cannot be opened for reading ("File not exists :: %s" with the path, level
@@ -121,6 +122,7 @@ public:
      * A document that was held is released first, whatever becomes of the call. There is no
      * recorded path: SaveXml() needs one.
      *
+     * @param rootName  the root element's name.
      * @return
      * - 0 if the document is held now,
      * - 7 for an empty name ("Invalid root node name :: %s" with the name, level 9); no document is
@@ -142,6 +144,7 @@ public:
     CXmlNode GetRootNode();
 
     /**
+     * @param path  a file's path.
      * @return whether the file at @p path can be opened for reading. Nothing is read, created or
      *         changed. A directory can be opened, too.
      */
@@ -160,6 +163,8 @@ public:
     /**
      * Evaluates @p expression from @p contextNode.
      *
+     * @param expression   an XPath expression.
+     * @param contextNode  where a relative expression starts; may be null.
      * @return the engine's result (an xmlXPathObjectPtr) of whatever type. The caller owns it and
      *         frees it with xmlXPathFreeObject(). Its nodes are the document's own, except for
      *         namespaces, which die with it. Null
@@ -171,6 +176,8 @@ public:
     _xmlXPathObject* GetNodeSet(std::string expression, CXmlNode contextNode);
 
     /**
+     * @param expression   an XPath expression.
+     * @param contextNode  where a relative expression starts; may be null.
      * @return a handle on the first node that @p expression selects, in document order. Null
      * - if GetNodeSet() answers null ("xmlXPathObjectPtr is NULL", level 31, after its own record),
      * - if the result is no node-set or an empty one ("NodeSetVal is NULL", level 31),
@@ -179,6 +186,8 @@ public:
     CXmlNode FindNode(std::string expression, CXmlNode contextNode);
 
     /**
+     * @param expression   an XPath expression.
+     * @param contextNode  where a relative expression starts; may be null.
      * @return handles on the nodes that @p expression selects, in document order; none in the cases
      *         in which FindNode() finds none, with the same records. A namespace is left out ("node
      *         pointer is NULL", level 31).
@@ -207,6 +216,9 @@ public:
      * Adds an element as the last child of @p parent, as CXmlNode::AddChildNode() does. The
      * document that is held does not matter: the element goes where the parent is.
      *
+     * @param parent   the element that gets the new one; may be null.
+     * @param name     its name; with an empty one nothing is created.
+     * @param content  its text, in which entity references are recognised; may be empty.
      * @return a handle on the new element, or what AddChildNode() answers when it fails; null for a
      *         null @p parent.
      */
@@ -217,6 +229,7 @@ public:
      * belong to the document that is held. Every handle on it or below it dangles, the caller's own
      * and the recorded root included.
      *
+     * @param node  what to remove; may be null.
      * @return 0, or 22 for a null handle or a kind of node that is refused (see CXmlNode.h);
      * nothing is logged.
      */

@@ -38,5 +38,5 @@ need() {
 build_packages=(g++ cmake ninja-build libxml2-dev libcli11-dev)
 
 # For the tests of any build; the last line: packages whose files the tests read.
-test_packages=(clang libgtest-dev libgmock-dev pkg-config groff-base
+test_packages=(clang python3 libgtest-dev libgmock-dev pkg-config groff-base
     fontconfig-config shared-mime-info xkb-data)

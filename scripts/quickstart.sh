@@ -48,3 +48,4 @@ show "$kxconfig" get "$copy" gateway.log.level
 show "$kxconfig" --log-mask value get "$file" gateway.time.zone
 
 printf '\nThe file is %s; try other keys, or %s --help.\n' "$file" "$kxconfig"
+printf 'For kxconfig in any folder: export PATH=%q:$PATH\n' "$PWD/${kxconfig%/*}"

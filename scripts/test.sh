@@ -7,6 +7,7 @@
 #   abi98    everything with the target's kind of standard library (shared strings, a linear list::size)
 #   engine   everything with the newest libxml2 that Debian has as a source package
 #   arm      everything for ARMv7-A, in both calling conventions, under qemu-arm; the library's size
+#   docs     the reference, built by Doxygen without a warning
 #   host     fast and package; what runs if no stage is named
 #   all      all of them; what CI runs
 set -euo pipefail
@@ -59,6 +60,10 @@ stage_arm() {
     scripts/arm_size.sh
 }
 
+stage_docs() {
+    scripts/reference.sh
+}
+
 stage_host() {
     stage_fast
     stage_package
@@ -66,6 +71,7 @@ stage_host() {
 
 stage_all() {
     stage_host
+    stage_docs
     stage_abi98
     stage_engine
     stage_arm
@@ -74,7 +80,7 @@ stage_all() {
 [ $# -gt 0 ] || set -- host
 for stage in "$@"; do
     declare -F "stage_$stage" >/dev/null ||
-        { echo "$0: no stage \"$stage\"; there are fast, package, abi98, engine, arm, host, all" >&2; exit 2; }
+        { echo "$0: no stage \"$stage\"; there are fast, package, abi98, engine, arm, docs, host, all" >&2; exit 2; }
 done
 for stage in "$@"; do
     "stage_$stage"

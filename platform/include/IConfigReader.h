@@ -34,7 +34,11 @@ public:
      */
     virtual std::string GetValue(const std::string& key) = 0;
 
-    /** Appends the value or values under @p key to @p value. @return a status code, 0 for success.
+    /**
+     * Looks up a value and appends it.
+     * @param key    the key.
+     * @param value  the value or values are appended to it.
+     * @return a status code, 0 for success.
      */
     virtual int GetValue(const std::string& key, std::string& value) = 0;
 

@@ -1,0 +1,47 @@
+#!/usr/bin/env python3
+"""Prints a page as Doxygen wants it; used by docs/Doxyfile.in.
+
+Headings get the names that links call them by. What is quoted as `CXMLReader::GetValue()` or `CXmlNode` becomes plain,
+so that it is linked to the reference. Other quotations are written so that Doxygen reads nothing into them.
+"""
+
+import html
+import pathlib
+import re
+import sys
+
+CLASSES = "CXMLReader|CXMLWriter|CXmlParser|CXmlNode|CXmlAttr|IConfigReader|IConfigWriter"
+FACTORIES = "GetCXMLReaderObject|GetCXMLWriterObject|GetCXMLWriterObjectNoParam"
+
+
+def name_of(page, heading):
+    plain = re.sub(r"[^\w\- ]", "", heading.lower()).replace(" ", "-")
+    return f"{pathlib.Path(page).stem.lower()}-{plain}"
+
+
+def quotation(text):
+    if re.fullmatch(rf"(?:{CLASSES})(?:::\w+(?:\(\))?)?|{FACTORIES}", text):
+        return text
+    if re.search("[&@<>%]", text):
+        escaped = re.sub(r"([\\@*_#%])", r"\\\1", html.escape(text)).replace("--", r"\--")
+        return f"<code>{escaped}</code>"
+    return f"``{text}``" if "'" in text else f"`{text}`"
+
+
+def filtered(page):
+    in_block, first = False, True
+    for line in pathlib.Path(page).read_text().splitlines():
+        if line.lstrip().startswith("```"):
+            in_block = not in_block
+        elif not in_block:
+            heading = re.match(r"(##+) (.*)", line)
+            if heading:
+                line += f" {{#{name_of(page, heading.group(2))}}}"
+            line = re.sub(r"\]\(#([\w-]+)\)", lambda link: f"](#{pathlib.Path(page).stem.lower()}-{link.group(1)})", line)
+            line = re.sub(r"\]\((?:\.\./)?([\w-]+)\.md#([\w-]+)\)", r"](#\1-\2)", line)
+            line = line.replace("](README.md)", "](index.html)").replace("](../../include)", "](files.html)")
+            line = re.sub(r"`([^`]+)`", lambda quoted: quotation(quoted.group(1)), line)
+        yield line
+
+
+print("\n".join(filtered(sys.argv[1])))

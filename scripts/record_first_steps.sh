@@ -1,0 +1,91 @@
+#!/usr/bin/env bash
+# Records docs/first-steps.txt: what a new user types and sees, from a clean clone to a key that gives nothing and why.
+# The clone is of the last commit of this one, in an empty folder.
+# usage: record_first_steps.sh [--check]   --check writes nothing and fails if the recording is not up to date
+# shellcheck disable=SC2016,SC2034  # commands are typed in as they stand
+set -euo pipefail
+cd "$(dirname "$0")/.."
+
+recording=docs/first-steps.txt
+PROJECT=$PWD
+empty=$(mktemp -d)
+trap 'rm -rf "$empty"' EXIT
+new=$empty/recording.txt
+
+say() {
+    echo
+    printf '# %s\n' "$@"
+}
+
+# type_in COMMAND — shows the command as it is typed, runs it in this shell, and shows what it prints.
+type_in() {
+    printf '\n$ %s\n' "${1//$'\n'/$'\n'> }"
+    local status=0
+    eval "$1" </dev/null || status=$?
+    last_status=$status
+}
+
+session() {
+    cat <<'END'
+First steps, recorded: from a clone in an empty folder to a key that gives nothing, and why.
+
+scripts/record_first_steps.sh makes this file; do not edit it. Times are not those of the recording. On a machine
+that lacks some of the packages the first script says "installing: ..." and asks for the password if need be.
+END
+    say 'Clone the project ($PROJECT is its address), and build it.'
+    type_in 'git clone --quiet "$PROJECT" kx'
+    type_in 'cd kx'
+    type_in './scripts/quickstart.sh'
+
+    say 'kxconfig for this shell; then a folder of my own, with a small file.'
+    type_in 'export PATH=$PWD/build/release/tools:$PATH'
+    type_in 'mkdir ../try && cd ../try'
+    type_in 'cat >device.xml <<END
+<cfg>
+    <net id="1"><ip>10.0.0.1</ip></net>
+    <net id="2"><ip>10.0.0.2</ip></net>
+    <name>box</name>
+</cfg>
+END'
+
+    say 'A first value. Which keys are there?'
+    type_in 'kxconfig get device.xml cfg.name'
+    type_in 'kxconfig keys device.xml'
+    type_in 'kxconfig get device.xml cfg.net@id=2.ip'
+
+    say 'A first change: look first, then do it.'
+    type_in 'kxconfig set --dry-run device.xml cfg.name crate'
+    type_in 'kxconfig set device.xml cfg.name crate'
+    type_in 'cat device.xml'
+
+    say 'It pays to look: this key reads one value, but would change two.'
+    type_in 'kxconfig get device.xml cfg.net@id=1.ip'
+    type_in 'kxconfig set --dry-run device.xml cfg.net@id=1.ip 10.9.9.9'
+
+    say 'A key that gives nothing.'
+    type_in 'kxconfig get device.xml cfg.net.address'
+    type_in 'echo $last_status'
+    if kxconfig --help | grep -q '^ *explain '; then
+        say 'Why?'
+        type_in 'kxconfig explain device.xml cfg.net.address'
+    else
+        say 'Why? The library tells each level that it entered, and the part of the key that it sought there: both' \
+            'net elements were entered for "address", and below them nothing.'
+        type_in 'kxconfig --log-mask value get device.xml cfg.net.address'
+        type_in "kxconfig find device.xml '/cfg/net/*'"
+    fi
+}
+
+# What changes from run to run, or with every edit of a source: the times and source lines of log records.
+steady() {
+    sed -E -e 's/^[0-9]{4}-[0-9-]{5}T[0-9:.]{12} /2026-01-01T12:00:00.000 /' -e 's/^(2026-01-01T12:00:00.000 [a-z]+ [~A-Za-z]+):[0-9]+ /\1:1 /' \
+        -e 's/ +$//' -e 's/\$last_status/$?/' -e "s#$empty#/home/me#g"
+}
+
+(cd "$empty" && unset KX_LOG_MASK && session) 2>&1 | steady >"$new"
+if [ "${1:-}" = --check ]; then
+    diff -u "$recording" "$new" || { echo "$recording is not up to date: run scripts/record_first_steps.sh" >&2; exit 1; }
+    echo "$recording is up to date"
+else
+    cp "$new" "$recording"
+fi
