@@ -31,4 +31,4 @@ need() {
     rm -f "$log"
 }
 
-build_packages=(g++ cmake ninja-build libxml2-dev libcli11-dev)
+build_packages=(g++ cmake ninja-build libxml2-dev libcli11-dev nlohmann-json3-dev)
