@@ -6,7 +6,7 @@ cd "$(dirname "$0")/.."
 
 # The last line: packages whose files the tests read.
 need "${build_packages[@]}" \
-    clang libgtest-dev libgmock-dev \
+    clang libgtest-dev libgmock-dev groff-base bsdutils \
     fontconfig-config shared-mime-info xkb-data
 
 # run_preset NAME — configures, builds and tests by the preset; quiet until something fails.

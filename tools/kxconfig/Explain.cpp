@@ -380,11 +380,12 @@ ExitStatus ExplainLookup(CXMLReader& reader, const std::string& key)
 
     const std::string joined = reader.GetValue(key);
     Print("GetValue(key): " + Quoted(joined),
-          {{"event", "result"}, {"call", "GetValue(key)"}, {"value", joined}});
+          {{"event", "result"}, {"depth", 0}, {"call", "GetValue(key)"}, {"value", joined}});
     std::string value;
     const int status = reader.GetValue(key, value);
     Print("GetValue(key, value): " + ToldStatus(status) + ", value " + Quoted(value),
           {{"event", "result"},
+           {"depth", 0},
            {"call", "GetValue(key, value)"},
            {"status", status},
            {"value", value}});
@@ -400,8 +401,9 @@ ExitStatus ExplainUpdate(CXMLReader& reader, const std::string& key)
 
     GuestWriter writer(reader);
     const int status = writer.Get().SetValue(key, value);
-    Print("SetValue(key, value): " + ToldStatus(status),
-          {{"event", "result"}, {"call", "SetValue(key, value)"}, {"status", status}});
+    Print(
+        "SetValue(key, value): " + ToldStatus(status),
+        {{"event", "result"}, {"depth", 0}, {"call", "SetValue(key, value)"}, {"status", status}});
     return ToExitStatus(status, !trail.StepsWithText().empty());
 }
 
