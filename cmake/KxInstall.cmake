@@ -46,6 +46,7 @@ install(FILES ${PROJECT_BINARY_DIR}/${PROJECT_NAME}.pc DESTINATION ${pkgconfig_d
 
 if(KX_BUILD_TOOLS)
     install(TARGETS kxconfig DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT tools)
-    configure_file(tools/kxconfig/kxconfig.1.in kxconfig.1 @ONLY)
+    install(FILES tools/completion/kxconfig.bash
+        DESTINATION ${CMAKE_INSTALL_DATADIR}/bash-completion/completions RENAME kxconfig COMPONENT tools)
     install(FILES ${PROJECT_BINARY_DIR}/kxconfig.1 DESTINATION ${CMAKE_INSTALL_MANDIR}/man1 COMPONENT tools)
 endif()

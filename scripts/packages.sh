@@ -35,8 +35,8 @@ need() {
     rm -f "$log"
 }
 
-build_packages=(g++ cmake ninja-build libxml2-dev libcli11-dev)
+build_packages=(g++ cmake ninja-build libxml2-dev libcli11-dev nlohmann-json3-dev)
 
 # For the tests of any build; the last line: packages whose files the tests read.
-test_packages=(clang python3 libgtest-dev libgmock-dev pkg-config groff-base
+test_packages=(clang python3 libgtest-dev libgmock-dev pkg-config groff-base bsdutils
     fontconfig-config shared-mime-info xkb-data)

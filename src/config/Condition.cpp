@@ -1,70 +1,10 @@
 #include "Condition.h"
 
-#include <limits.h>
+#include "ConditionEvaluation.h"
+#include "Observer.h"
 
 namespace kx
 {
-
-namespace
-{
-
-bool HasValue(xmlNode* element, const xmlChar* name, const TextView& value)
-{
-    xmlChar* const text = xmlGetProp(element, name);
-    if (text == 0)
-    {
-        return false;
-    }
-    const bool equal = SameText(text, value);
-    xmlFree(text);
-    return equal;
-}
-
-/** Beyond the length of any sensible attribute name: only longer ones are copied to the heap. */
-const size_t kShortName = 64;
-
-bool ShortNameHolds(const Term& term, xmlNode* element)
-{
-    xmlChar name[kShortName];
-    memcpy(name, term.name.data, term.name.size);
-    name[term.name.size] = 0;
-    return HasValue(element, name, term.value);
-}
-
-bool LongNameHolds(const Term& term, xmlNode* element)
-{
-    if (term.name.size > INT_MAX)
-    {
-        return false;
-    }
-    xmlChar* const name = xmlStrndup(reinterpret_cast<const xmlChar*>(term.name.data),
-                                     static_cast<int>(term.name.size));
-    if (name == 0)
-    {
-        return false;
-    }
-    const bool holds = HasValue(element, name, term.value);
-    xmlFree(name);
-    return holds;
-}
-
-/** An attribute name that is empty or holds a NUL names no attribute. */
-bool NamesAnAttribute(const TextView& name)
-{
-    return !name.IsEmpty() && name.Find('\0') == name.size;
-}
-
-bool TermHolds(const Term& term, xmlNode* element)
-{
-    if (!NamesAnAttribute(term.name))
-    {
-        return false;
-    }
-    return term.name.size < kShortName ? ShortNameHolds(term, element)
-                                       : LongNameHolds(term, element);
-}
-
-} // namespace
 
 Term TermCursor::Next()
 {
@@ -99,22 +39,6 @@ size_t TermCursor::FindSeparator()
     return m_remaining.Find('&');
 }
 
-bool ConditionHolds(const TextView& condition, xmlNode* element)
-{
-    bool accepted = true;
-    bool joinedByOr = false;
-    for (TermCursor terms(condition); !terms.AtEnd();)
-    {
-        const Term term = terms.Next();
-        const bool holds = TermHolds(term, element);
-        accepted = joinedByOr ? accepted || holds : accepted && holds;
-        joinedByOr = term.endsWithOr;
-        if (!joinedByOr && !accepted)
-        {
-            return false;
-        }
-    }
-    return accepted;
-}
+template bool ConditionHolds<Silent>(const TextView& condition, xmlNode* element);
 
 } // namespace kx

@@ -34,7 +34,9 @@ private:
  * @return whether the attributes of @p element fulfil @p condition, which is not empty.
  *
  * Terms combine from left to right; a failed "&" or last term rejects at once.
+ * ConditionEvaluation.h defines it; the library has it for the observer Silent.
  */
+template <class Observer>
 bool ConditionHolds(const TextView& condition, xmlNode* element);
 
 } // namespace kx

@@ -1,20 +1,12 @@
 #include "KeyPathLookup.h"
 
-#include "SiblingScan.h"
-#include "diag/Log.h"
-#include "diag/Status.h"
+#include "LookupWalk.h"
 
 namespace kx
 {
 
 namespace
 {
-
-/** The value that @p text holds; never null. */
-const char* ContentOf(const xmlNode* text)
-{
-    return text->content != 0 ? reinterpret_cast<const char*>(text->content) : "";
-}
 
 /** One level of the lookup that runs the values of one parent together. */
 class Collector
@@ -62,50 +54,6 @@ private:
     const size_t m_start; ///< where this level's own result begins
 };
 
-/** One level of the lookup that separates every value. */
-class Appender
-{
-public:
-    Appender(const KeySplit& key, std::string& value, unsigned int& found)
-        : m_key(key), m_value(value), m_found(found), m_status(StatusNotFound)
-    {
-    }
-
-    void Accept(const xmlNode* element)
-    {
-        const xmlNode* const text = OnlyTextChild(element);
-        if (text != 0)
-        {
-            AppendSeparated(ContentOf(text));
-        }
-        if (m_key.hasRest)
-        {
-            m_status = AppendValues(element, m_key.rest, m_value, m_found);
-        }
-    }
-
-    int GetStatus() const { return m_status; }
-
-private:
-    Appender(const Appender&);
-    Appender& operator=(const Appender&);
-
-    void AppendSeparated(const char* text)
-    {
-        if (!m_value.empty())
-        {
-            m_value += '\n';
-        }
-        m_value += text;
-        m_found = 1;
-    }
-
-    const KeySplit& m_key;
-    std::string& m_value;
-    unsigned int& m_found;
-    int m_status; ///< of the last descent: it tells nothing about the values of this level
-};
-
 } // namespace
 
 void CollectValues(const xmlNode* node, const TextView& key, std::string& result)
@@ -116,24 +64,10 @@ void CollectValues(const xmlNode* node, const TextView& key, std::string& result
     }
     const KeySplit split(key);
     Collector collector(split, result);
-    ScanSiblings(node, Segment(split.first), collector);
+    ScanSiblings<Silent>(node, Segment(split.first), collector);
 }
 
-int AppendValues(const xmlNode* node, const TextView& key, std::string& value, unsigned int& found)
-{
-    const char* const tag = "XMLGetValue";
-    KX_TRACE_AS(tag, "+");
-    if (node == 0 || key.IsEmpty())
-    {
-        KX_TRACE_AS(tag, "-");
-        return StatusMissing;
-    }
-    KX_VALUE_AS(tag, "Key :: %s", key.data);
-    const KeySplit split(key);
-    Appender appender(split, value, found);
-    ScanSiblings(node, Segment(split.first), appender);
-    KX_TRACE_AS(tag, "-");
-    return appender.GetStatus();
-}
+template int AppendValues<Silent>(const xmlNode* node, const TextView& key, std::string& value,
+                                  unsigned int& found);
 
 } // namespace kx

@@ -2,6 +2,7 @@
 #define KX_CONFIG_KEYPATHLOOKUP_H
 
 #include "KeyPath.h"
+#include "Observer.h"
 
 #include <string>
 
@@ -21,8 +22,16 @@ void CollectValues(const xmlNode* node, const TextView& key, std::string& result
  * string is empty at that moment, and then sets @p found to 1.
  *
  * @p key is zero-terminated, for the log. @return the status that the level's trace ends with.
+ * LookupWalk.h defines it; the library has it for the observer Silent.
  */
+template <class Observer>
 int AppendValues(const xmlNode* node, const TextView& key, std::string& value, unsigned int& found);
+
+inline int AppendValues(const xmlNode* node, const TextView& key, std::string& value,
+                        unsigned int& found)
+{
+    return AppendValues<Silent>(node, key, value, found);
+}
 
 } // namespace kx
 

@@ -3,6 +3,7 @@
 
 #include "Condition.h"
 #include "KeyPath.h"
+#include "Observer.h"
 
 namespace kx
 {
@@ -16,7 +17,7 @@ namespace kx
  * An element of another name suspends the condition: the next element that matches by name is
  * taken as it is, and only then is the condition in force again. Clients rely on it.
  */
-template <class Visitor>
+template <class Observer, class Visitor>
 void ScanSiblings(const xmlNode* node, const Segment& segment, Visitor& visitor)
 {
     bool suspended = segment.condition.IsEmpty();
@@ -26,14 +27,21 @@ void ScanSiblings(const xmlNode* node, const Segment& segment, Visitor& visitor)
         {
             continue;
         }
+        Observer::Compare(child, segment);
         if (!segment.Names(child))
         {
+            Observer::OtherName();
             suspended = true;
             continue;
         }
-        if (suspended || ConditionHolds(segment.condition, child))
+        if (suspended || ConditionHolds<Observer>(segment.condition, child))
         {
+            Observer::Selected(suspended);
             visitor.Accept(child);
+        }
+        else
+        {
+            Observer::Rejected();
         }
         suspended = segment.condition.IsEmpty();
     }

@@ -17,7 +17,7 @@ ROW = re.compile(r'^\| `"(.*)"` \| (\d+) \|', re.M)
 
 
 def messages_of(sources):
-    for source in sources.rglob("*.cpp"):
+    for source in sorted(sources.rglob("*.cpp")) + sorted(sources.rglob("*.h")):
         for kind, strings in GATE.findall(source.read_text()):
             yield "".join(STRING.findall(strings)), LEVELS[kind]
 

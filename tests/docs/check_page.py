@@ -16,6 +16,7 @@ Each fenced block of the page is dealt with by its language, in the order of the
            a line "..." stands for any number of lines
   sh       must run without a failure
   python   must be a program; commands run it
+  json     must be well-formed; after "printed by", what the command printed, laid out for reading
   text     a drawing; nothing is run
 
 Comments before a block say more of it:
@@ -23,12 +24,14 @@ Comments before a block say more of it:
   <!-- file: NAME -->      the block is also written to this file
   <!-- given: CODE -->     a cpp block stands in a function in which this comes first
   <!-- untested: REASON --> the block is not run, and why
+  <!-- printed by: COMMAND --> a json block is what the command prints
 
 Times and source lines of log records are not compared. In console blocks $KX is the folder of the clone.
 """
 
 import argparse
 import difflib
+import json
 import os
 import pathlib
 import re
@@ -39,7 +42,7 @@ import sys
 import tempfile
 import xml.dom.minidom
 
-COMMENT = re.compile(r"^\s*<!-- (file|given|untested): (.*?) -->\s*$")
+COMMENT = re.compile(r"^\s*<!-- (file|given|untested|printed by): (.*?) -->\s*$")
 FENCE = re.compile(r"^(\s*)```(\S*)\s*$")
 RECORD = re.compile(r"^\d{4}-\d\d-\d\dT\d\d:\d\d:\d\d\.\d{3} (\w+) ([~\w]+):\d+ ?", re.M)
 
@@ -228,6 +231,14 @@ class Checker:
 
     def check_sh(self, block, _):
         self.must_run(["bash", "-euo", "pipefail", "-c", block.text])
+
+    def check_json(self, block, _):
+        shown = json.loads(block.text)
+        if "printed by" in block.notes:
+            command = ["bash", "-c", block.notes["printed by"]]
+            printed = json.loads(self.run(command)[1])
+            if printed != shown:
+                raise Failure("prints " + json.dumps(printed, indent=2))
 
     def check_python(self, block, _):
         try:

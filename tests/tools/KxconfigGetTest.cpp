@@ -79,7 +79,8 @@ TEST_F(KxconfigGet, RefusesAMalformedKey)
 
 TEST_F(KxconfigGet, RefusesBadUsage)
 {
-    ExpectComplaint(Tool({}), 2, "a command is required: get, set, keys or find" + kUsage);
+    ExpectComplaint(Tool({}), 2,
+                    "a command is required: get, set, explain, check, keys or find" + kUsage);
     ExpectComplaint(Tool({"frobnicate"}), 2,
                     "The following argument was not expected: frobnicate" + kUsage);
     ExpectComplaint(Tool({"--frobnicate"}), 2,

@@ -4,6 +4,7 @@
 #include "ExitStatus.h"
 
 #include <string>
+#include <vector>
 
 /** kxconfig get: prints the value or values under @p key in @p file, one on a line. */
 ExitStatus Get(const std::string& file, const std::string& key);
@@ -13,6 +14,18 @@ ExitStatus Find(const std::string& file, const std::string& expression);
 
 /** kxconfig keys: prints every key path under which @p file holds a value, with that value. */
 ExitStatus Keys(const std::string& file);
+
+/**
+ * kxconfig explain: tells level by level what a lookup of @p key does in @p file, or an update;
+ * changes nothing.
+ *
+ * @return what get, or set, would end with.
+ */
+ExitStatus Explain(const std::string& file, const std::string& key, bool update);
+
+/** kxconfig check: warns of what surprises people, about @p keys or, without any, the file's own.
+ */
+ExitStatus Check(const std::string& file, const std::vector<std::string>& keys);
 
 struct SetArguments
 {

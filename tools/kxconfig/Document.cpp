@@ -1,14 +1,14 @@
 #include "Document.h"
 
+#include "Nodes.h"
+#include "Output.h"
+
 #include <libxml/tree.h>
 #include <libxml/xmlerror.h>
 
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
-#include <iomanip>
-#include <iostream>
-#include <sstream>
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -79,45 +79,11 @@ std::string WhyNotParsed(const std::string& path)
     return path + ":" + (g_firstComplaint.empty() ? " not parsed" : g_firstComplaint);
 }
 
-/** @return the name of the root element of @p document (an xmlDocPtr). */
-std::string RootName(void* document)
-{
-    const xmlNode* const root = xmlDocGetRootElement(static_cast<xmlDoc*>(document));
-    return reinterpret_cast<const char*>(root->name);
-}
-
-/** @return @p text with its control characters written as escapes. */
-std::string OnOneLine(const std::string& text)
-{
-    std::ostringstream line;
-    for (const char c : text)
-    {
-        const auto byte = static_cast<unsigned char>(c);
-        if (c == '\n')
-        {
-            line << "\\n";
-        }
-        else if (byte < 0x20 || byte == 0x7F)
-        {
-            line << "\\x" << std::hex << std::setw(2) << std::setfill('0') << unsigned{byte};
-        }
-        else
-        {
-            line << c;
-        }
-    }
-    return line.str();
-}
-
 } // namespace
 
-void Complain(const std::string& message)
+void PrepareEngine()
 {
-    std::cerr << "kxconfig: " + OnOneLine(message) + "\n";
-}
-
-void CollectEngineComplaints()
-{
+    CountLines();
     xmlSetStructuredErrorFunc(nullptr, KeepFirstComplaint);
     xmlSetGenericErrorFunc(nullptr, Ignore); // some of XPath's say the same in other words
 }
@@ -178,7 +144,7 @@ ExitStatus CheckKey(const std::string& file, const std::string& key, CXMLReader&
                  ": it names the root element and at least one more, as in root.name");
         return ExitStatus::BadUsage;
     }
-    const std::string root = RootName(reader.GetDataPtr());
+    const std::string root = Text(RootOf(reader)->name);
     if (key.substr(0, dot) != root)
     {
         Complain("nothing found: the key starts with " + Quoted(key.substr(0, dot)) +
@@ -188,12 +154,7 @@ ExitStatus CheckKey(const std::string& file, const std::string& key, CXMLReader&
     return ExitStatus::Done;
 }
 
-std::string Quoted(const std::string& text)
+const xmlNode* RootOf(CXMLReader& reader)
 {
-    std::string quoted = "\"";
-    for (const char c : text)
-    {
-        quoted += c == '"' || c == '\\' ? std::string("\\") + c : std::string(1, c);
-    }
-    return OnOneLine(quoted + '"');
+    return xmlDocGetRootElement(static_cast<xmlDoc*>(reader.GetDataPtr()));
 }

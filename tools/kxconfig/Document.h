@@ -4,16 +4,17 @@
 #include "ExitStatus.h"
 
 #include "CXMLReader.h"
+#include "CXMLWriter.h"
 #include "CXmlParser.h"
 
 #include <memory>
 #include <string>
 
-/** Prints "kxconfig: " and @p message as one line, whatever it holds, on standard error. */
-void Complain(const std::string& message);
-
-/** Keeps the engine from printing its complaints: LoadFile() tells the first of them instead. */
-void CollectEngineComplaints();
+/**
+ * Makes the engine count lines, and keeps it from printing its complaints: LoadFile() tells the
+ * first of them instead.
+ */
+void PrepareEngine();
 
 /**
  * Loads a file of this machine; URLs and other names that the engine would fetch are not files.
@@ -42,7 +43,22 @@ std::string FirstComplaint(const std::string& before);
  */
 ExitStatus CheckKey(const std::string& file, const std::string& key, CXMLReader& reader);
 
-/** @return @p text in double quotes and on one line: control characters are written as escapes. */
-std::string Quoted(const std::string& text);
+/** @return the root element of the document that @p reader holds. */
+const _xmlNode* RootOf(CXMLReader& reader);
+
+/** A writer on the document of a reader, which keeps owning it. */
+class GuestWriter
+{
+public:
+    explicit GuestWriter(CXMLReader& reader) { m_writer.SetDataPtr(reader.GetDataPtr()); }
+    ~GuestWriter() { m_writer.SetDataPtr(nullptr); }
+    GuestWriter(const GuestWriter&) = delete;
+    GuestWriter& operator=(const GuestWriter&) = delete;
+
+    CXMLWriter& Get() { return m_writer; }
+
+private:
+    CXMLWriter m_writer;
+};
 
 #endif

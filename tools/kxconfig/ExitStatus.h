@@ -1,14 +1,29 @@
 #ifndef KX_TOOLS_EXITSTATUS_H
 #define KX_TOOLS_EXITSTATUS_H
 
-/** What kxconfig's exit status tells; in each case but Done one line stands on standard error. */
+/** What kxconfig's exit status tells; a line on standard error says more, unless a warning does. */
 enum class ExitStatus
 {
-    Done = 0,         ///< found; updated
-    NothingFound = 1, ///< the key names nothing in the file that has a value
-    BadUsage = 2,     ///< an option, an argument or a key that cannot be understood
-    BadFile = 3,      ///< the file cannot be read, or is not well-formed XML
-    NotSaved = 4      ///< the result could not be saved or printed; the file is as it was
+    Done = 0,
+    NothingFound = 1,
+    BadUsage = 2,
+    BadFile = 3,
+    NotSaved = 4
+};
+
+struct ExitStatusMeaning
+{
+    ExitStatus status;
+    const char* meaning;
+};
+
+/** The one table of them: --help, the man page and the documentation show it. */
+const ExitStatusMeaning kExitStatuses[] = {
+    {ExitStatus::Done, "done: found, changed, or nothing to warn of"},
+    {ExitStatus::NothingFound, "nothing found; check: there are warnings"},
+    {ExitStatus::BadUsage, "bad usage, malformed key or expression"},
+    {ExitStatus::BadFile, "the file cannot be read, or is not well-formed XML"},
+    {ExitStatus::NotSaved, "saving or printing failed: the file is as it was"},
 };
 
 #endif

@@ -1,10 +1,10 @@
 #include "Commands.h"
 #include "Document.h"
 #include "Nodes.h"
+#include "Output.h"
 
 #include <libxml/xpath.h>
 
-#include <iostream>
 #include <memory>
 
 namespace
@@ -88,20 +88,52 @@ std::string Line(const xmlNode* node)
     return line;
 }
 
+Json AttributesInJson(const xmlNode* element)
+{
+    Json attributes = Json::object();
+    for (const xmlAttr* attribute = element->properties; attribute != nullptr;
+         attribute = attribute->next)
+    {
+        attributes[Text(attribute->name)] = ContentOf(reinterpret_cast<const xmlNode*>(attribute));
+    }
+    return attributes;
+}
+
+Json InJson(const xmlNode* node)
+{
+    if (node->type == XML_NAMESPACE_DECL)
+    {
+        const auto space = reinterpret_cast<const xmlNs*>(node);
+        return {{"location", LocationOfNamespace(space)},
+                {"type", TypeName(node)},
+                {"value", Text(space->href)}};
+    }
+    Json result = {{"location", LocationOf(node)},
+                   {"line", LineNumberOf(node)},
+                   {"type", TypeName(node)},
+                   {"value", ShowsContent(node) ? Json(ContentOf(node)) : Json()}};
+    if (node->type == XML_ELEMENT_NODE)
+    {
+        result["attributes"] = AttributesInJson(node);
+    }
+    return result;
+}
+
 /** @return the number of nodes printed. */
 int PrintNodes(const xmlNodeSet* nodes)
 {
     const int count = nodes == nullptr ? 0 : nodes->nodeNr;
     for (int i = 0; i < count; ++i)
     {
-        std::cout << Line(nodes->nodeTab[i]) << '\n';
+        Print(Line(nodes->nodeTab[i]), InJson(nodes->nodeTab[i]));
     }
     return count;
 }
 
 void PrintScalar(xmlXPathObject* result)
 {
-    std::cout << Taken(xmlXPathCastToString(result)) << '\n';
+    const std::string value = Taken(xmlXPathCastToString(result));
+    Print(value, {{"value", value}});
 }
 
 } // namespace

@@ -1,7 +1,24 @@
 #include "Commands.h"
 #include "Document.h"
+#include "Nodes.h"
+#include "Output.h"
+#include "Trail.h"
 
-#include <iostream>
+namespace
+{
+
+/** The lookup runs all values together; a script wants them one by one, and from where. */
+void PrintEachResult(const Trail& trail)
+{
+    for (const TrailStep* const step : trail.StepsWithText())
+    {
+        PrintResult({{"location", LocationOf(step->element)},
+                     {"line", LineNumberOf(step->element)},
+                     {"value", *step->text}});
+    }
+}
+
+} // namespace
 
 ExitStatus Get(const std::string& file, const std::string& key)
 {
@@ -21,6 +38,7 @@ ExitStatus Get(const std::string& file, const std::string& key)
         Complain("nothing found: no element of " + file + " has a value under " + Quoted(key));
         return ExitStatus::NothingFound;
     }
-    std::cout << values << '\n';
+    PrintLine(values);
+    PrintEachResult(RecordLookup(static_cast<xmlDoc*>(reader->GetDataPtr()), key));
     return ExitStatus::Done;
 }

@@ -1,8 +1,9 @@
 #include "Commands.h"
 #include "Document.h"
+#include "KeyList.h"
 #include "Nodes.h"
+#include "Output.h"
 
-#include <iostream>
 #include <map>
 #include <set>
 #include <vector>
@@ -87,13 +88,11 @@ private:
     std::map<std::string, int> m_counts; ///< by the segment that would select them
 };
 
-/** Prints the keys of the elements below one whose key is given, in document order, each once. */
-class KeyPrinter
+/** Lists the keys of the elements below one whose key is given, in document order, each once. */
+class KeyLister
 {
 public:
-    explicit KeyPrinter(CXMLReader& reader) : m_reader(reader) {}
-
-    void PrintBelow(const xmlNode* parent, const std::string& key)
+    void ListBelow(const xmlNode* parent, const std::string& key)
     {
         const Siblings siblings(parent);
         for (const xmlNode* node = parent->children; node != nullptr; node = node->next)
@@ -103,31 +102,39 @@ public:
                 const std::string keyOfNode = key + "." + siblings.SegmentOf(node);
                 if (OnlyTextOf(node) != nullptr)
                 {
-                    Print(keyOfNode);
+                    List(keyOfNode);
                 }
-                PrintBelow(node, keyOfNode);
+                ListBelow(node, keyOfNode);
             }
         }
     }
 
-    bool PrintedAny() const { return !m_printed.empty(); }
+    std::vector<std::string> Take() { return std::move(m_keys); }
 
 private:
-    /** The value is what the lookup finds: more than one element's where a key cannot tell. */
-    void Print(const std::string& key)
+    void List(const std::string& key)
     {
-        std::string value;
-        if (m_printed.insert(key).second && m_reader.GetValue(key, value) == 0)
+        if (m_listed.insert(key).second)
         {
-            std::cout << key << '\t' << Quoted(value) << '\n';
+            m_keys.push_back(key);
         }
     }
 
-    CXMLReader& m_reader;
-    std::set<std::string> m_printed;
+    std::vector<std::string> m_keys;
+    std::set<std::string> m_listed;
 };
 
 } // namespace
+
+std::vector<std::string> ListKeys(const xmlNode* root)
+{
+    KeyLister lister;
+    if (IsFreeOf(".", Text(root->name)))
+    {
+        lister.ListBelow(root, Text(root->name));
+    }
+    return lister.Take();
+}
 
 ExitStatus Keys(const std::string& file)
 {
@@ -136,13 +143,18 @@ ExitStatus Keys(const std::string& file)
     {
         return ExitStatus::BadFile;
     }
-    const xmlNode* const root = xmlDocGetRootElement(static_cast<xmlDoc*>(reader->GetDataPtr()));
-    KeyPrinter printer(*reader);
-    if (IsFreeOf(".", Text(root->name)))
+    bool printed = false;
+    for (const std::string& key : ListKeys(RootOf(*reader)))
     {
-        printer.PrintBelow(root, Text(root->name));
+        // The value is what the lookup finds: more than one element's where a key cannot tell.
+        std::string value;
+        if (reader->GetValue(key, value) == 0)
+        {
+            Print(key + '\t' + Quoted(value), {{"key", key}, {"value", value}});
+            printed = true;
+        }
     }
-    if (!printer.PrintedAny())
+    if (!printed)
     {
         Complain("nothing found: " + file + " holds no value that a key path can name");
         return ExitStatus::NothingFound;

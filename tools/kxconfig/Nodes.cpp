@@ -8,6 +8,32 @@ const xmlChar* ToEngine(const std::string& text)
     return reinterpret_cast<const xmlChar*>(text.c_str());
 }
 
+const long kLastCountedLine = 65535;
+
+/** More children than these are not listed one by one. */
+const int kListedChildren = 5;
+
+std::string KindOf(const xmlNode* node)
+{
+    switch (node->type)
+    {
+    case XML_ELEMENT_NODE:
+        return "element " + Text(node->name);
+    case XML_TEXT_NODE:
+        return xmlIsBlankNode(node) == 1 ? "blank text" : "text";
+    case XML_CDATA_SECTION_NODE:
+        return "CDATA section";
+    case XML_ENTITY_REF_NODE:
+        return "entity reference &" + Text(node->name) + ";";
+    case XML_COMMENT_NODE:
+        return "comment";
+    case XML_PI_NODE:
+        return "processing instruction";
+    default:
+        return "node";
+    }
+}
+
 } // namespace
 
 std::string Text(const xmlChar* text)
@@ -27,6 +53,25 @@ std::string LocationOf(const xmlNode* node)
     return Taken(xmlGetNodePath(const_cast<xmlNode*>(node)));
 }
 
+long LineNumberOf(const xmlNode* node)
+{
+    return xmlGetLineNo(node);
+}
+
+std::string LineOf(const xmlNode* node)
+{
+    const long line = LineNumberOf(node);
+    return std::to_string(line) + (line < kLastCountedLine ? "" : " or later");
+}
+
+void CountLines()
+{
+#pragma GCC diagnostic push
+#pragma GCC diagnostic ignored "-Wdeprecated-declarations" // engines that always count say so
+    xmlLineNumbersDefault(1);
+#pragma GCC diagnostic pop
+}
+
 std::string ContentOf(const xmlNode* node)
 {
     return Taken(xmlNodeGetContent(const_cast<xmlNode*>(node)));
@@ -38,6 +83,37 @@ const xmlNode* OnlyTextOf(const xmlNode* element)
     const bool isOnlyText =
         child != nullptr && child->type == XML_TEXT_NODE && child->next == nullptr;
     return isOnlyText ? child : nullptr;
+}
+
+std::string WhyNoValue(const xmlNode* element)
+{
+    if (element->children == nullptr)
+    {
+        return "it is empty";
+    }
+    if (element->children->next == nullptr)
+    {
+        return "its only child is no text: " + KindOf(element->children);
+    }
+    std::string kinds;
+    int count = 0;
+    for (const xmlNode* child = element->children; child != nullptr; child = child->next)
+    {
+        ++count;
+        if (count <= kListedChildren)
+        {
+            kinds += (count == 1 ? "" : ", ") + KindOf(child);
+        }
+    }
+    kinds += count > kListedChildren ? ", ..." : "";
+    return "it has " + std::to_string(count) + " children: " + kinds;
+}
+
+bool HasAttribute(const xmlNode* element, const std::string& name)
+{
+    xmlChar* const text = xmlGetProp(const_cast<xmlNode*>(element), ToEngine(name));
+    xmlFree(text);
+    return text != nullptr;
 }
 
 std::string AttributeOf(const xmlNode* element, const std::string& name)

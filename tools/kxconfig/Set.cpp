@@ -1,27 +1,11 @@
 #include "Commands.h"
 #include "Document.h"
+#include "Output.h"
 #include "Save.h"
 #include "Texts.h"
 
-#include <iostream>
-
 namespace
 {
-
-/** A writer on the document of a reader, which keeps owning it. */
-class GuestWriter
-{
-public:
-    explicit GuestWriter(CXMLReader& reader) { m_writer.SetDataPtr(reader.GetDataPtr()); }
-    ~GuestWriter() { m_writer.SetDataPtr(nullptr); }
-    GuestWriter(const GuestWriter&) = delete;
-    GuestWriter& operator=(const GuestWriter&) = delete;
-
-    CXMLWriter& Get() { return m_writer; }
-
-private:
-    CXMLWriter m_writer;
-};
 
 ExitStatus Update(CXMLWriter& writer, const SetArguments& arguments)
 {
@@ -40,16 +24,16 @@ ExitStatus Update(CXMLWriter& writer, const SetArguments& arguments)
     return ExitStatus::BadUsage;
 }
 
-void Print(const std::vector<ChangedText>& changes)
+void PrintChanges(const std::vector<ChangedText>& changes)
 {
     for (const ChangedText& change : changes)
     {
-        std::cout << change.location << ": " << Quoted(change.before) << " -> "
-                  << Quoted(change.after) << '\n';
+        Print(change.location + ": " + Quoted(change.before) + " -> " + Quoted(change.after),
+              {{"location", change.location}, {"before", change.before}, {"after", change.after}});
     }
     if (changes.empty())
     {
-        std::cout << "nothing changed: the text is the same already\n";
+        PrintLine("nothing changed: the text is the same already");
     }
 }
 
@@ -94,7 +78,7 @@ ExitStatus Set(const SetArguments& arguments)
     status = SaveUnlessAsked(writer.Get(), arguments, !changes.empty());
     if (status == ExitStatus::Done)
     {
-        Print(changes);
+        PrintChanges(changes);
     }
     return status;
 }

@@ -1,5 +1,7 @@
 #include "Commands.h"
 #include "Document.h"
+#include "Output.h"
+#include "Usage.h"
 
 #include "KxLog.h"
 #include "LogMask.h"
@@ -7,32 +9,12 @@
 #include <CLI/CLI.hpp>
 
 #include <cstdlib>
+#include <cstring>
 #include <functional>
-#include <iostream>
+#include <sstream>
 
 namespace
 {
-
-const char* const kFooter =
-    "Examples:\n"
-    "  kxconfig get device.xml cfg.name               print a value\n"
-    "  kxconfig get device.xml cfg.net.ip             print the values of every net, one on a "
-    "line\n"
-    "  kxconfig get device.xml 'cfg.net@id=2.ip'      of the net whose attribute id is 2\n"
-    "  kxconfig get device.xml 'cfg.net@id=1|id=2.ip' of either\n"
-    "  kxconfig set --dry-run device.xml cfg.name box show what would change\n"
-    "  kxconfig set device.xml cfg.name box           change it and save the file\n"
-    "  kxconfig set device.xml cfg.offset -- -5       a value that starts with a dash\n"
-    "  kxconfig keys device.xml                       print all keys and values\n"
-    "  kxconfig find device.xml '//net[@id]'          print the nodes that XPath selects\n"
-    "\n"
-    "Exit status:\n"
-    "  0 done, 1 nothing found, 2 bad usage, malformed key or expression, 3 file unreadable or not "
-    "well-formed,\n"
-    "  4 saving failed: the file is as it was\n"
-    "\n"
-    "The library's log records go to standard error. kxconfig asks for none unless --log-mask or\n"
-    "the environment variable KX_LOG_MASK says otherwise.";
 
 const char* const kSeeHelp = " (kxconfig --help shows the usage)";
 
@@ -89,31 +71,33 @@ ExitStatus ReportUsage(const CLI::App& app, const CLI::ParseError& error)
 {
     if (error.get_exit_code() == 0)
     {
-        app.exit(error); // --help, --version
+        std::ostringstream text; // --help, --version
+        app.exit(error, text, text);
+        const std::string lines = text.str().substr(0, text.str().size() - 1);
+        Print(lines, {{"text", lines}});
         return ExitStatus::Done;
     }
     Complain(error.what() + std::string(kSeeHelp));
     return ExitStatus::BadUsage;
 }
 
-ExitStatus Run(int argc, char** argv)
+/** What the user asked for. */
+struct Request
 {
-    SetArguments arguments; // the others use the first, or the first two
+    SetArguments arguments; // the other commands use the first, or the first two
+    std::vector<std::string> keys;
     std::string expression;
     std::string logMask;
-    std::function<ExitStatus()> command;
+    bool update = false;
+    bool trace = false;
+    std::function<ExitStatus()> command; ///< empty if no command was named
+};
 
-    CLI::App app("Reads and changes values of XML configuration files by key path.", "kxconfig");
-    app.set_version_flag("--version", "kxconfig " KX_VERSION);
-    app.footer(kFooter);
-    app.require_subcommand(0, 1); // so that an unknown one is named
-    app.fallthrough();
-    app.add_option("--log-mask", logMask, std::string("log mask: ") + g_LogMaskHelp)
-        ->type_name("MASK")
-        ->check(CLI::Validator(CheckLogMask, ""));
-
+void AddGetAndSet(CLI::App& app, Request& request)
+{
+    SetArguments& arguments = request.arguments;
     AddKeyCommand(app, "get", "print the value or values under a key path", arguments)
-        ->callback([&] { command = [&] { return Get(arguments.file, arguments.key); }; });
+        ->callback([&] { request.command = [&] { return Get(arguments.file, arguments.key); }; });
 
     CLI::App* const set = AddKeyCommand(
         app, "set", "replace the text under a key path, print what changed, and save", arguments);
@@ -122,18 +106,99 @@ ExitStatus Run(int argc, char** argv)
     set->add_option("--output", arguments.output, "save to this file instead")
         ->type_name("FILE")
         ->check(CLI::Validator(RefuseStandardStreams, ""));
-    set->callback([&] { command = [&] { return Set(arguments); }; });
+    set->callback([&] { request.command = [&] { return Set(arguments); }; });
+}
 
+void AddExplainAndCheck(CLI::App& app, Request& request)
+{
+    SetArguments& arguments = request.arguments;
+    CLI::App* const explain = AddKeyCommand(
+        app, "explain", "tell level by level why a key path gives what it gives", arguments);
+    explain->add_flag("--set", request.update, "tell what an update would reach; changes nothing");
+    explain->callback(
+        [&] {
+            request.command = [&]
+            { return Explain(arguments.file, arguments.key, request.update); };
+        });
+
+    CLI::App* const check = AddFileCommand(
+        app, "check", "warn of what will surprise somebody who looks values up", arguments.file);
+    check->add_option("KEY", request.keys, "key paths to check instead of the file's own");
+    check->callback([&] { request.command = [&] { return Check(arguments.file, request.keys); }; });
+}
+
+void AddKeysAndFind(CLI::App& app, Request& request)
+{
+    const std::string& file = request.arguments.file;
     AddFileCommand(app, "keys", "print every key path under which the file holds a value",
-                   arguments.file)
-        ->callback([&] { command = [&] { return Keys(arguments.file); }; });
+                   request.arguments.file)
+        ->callback([&] { request.command = [&] { return Keys(file); }; });
 
     CLI::App* const find = AddFileCommand(
         app, "find", "print the nodes that an XPath expression selects, or its value",
-        arguments.file);
-    find->add_option("XPATH", expression, "an XPath 1.0 expression")->required();
-    find->callback([&] { command = [&] { return Find(arguments.file, expression); }; });
+        request.arguments.file);
+    find->add_option("XPATH", request.expression, "an XPath 1.0 expression")->required();
+    find->callback([&] { request.command = [&] { return Find(file, request.expression); }; });
+}
 
+void AddOptions(CLI::App& app, Request& request)
+{
+    app.set_version_flag("--version", "kxconfig " KX_VERSION);
+    app.add_flag("--json", "answer with one JSON object");
+    CLI::Option* const mask =
+        app.add_option("--log-mask", request.logMask, std::string("log mask: ") + g_LogMaskHelp)
+            ->type_name("MASK")
+            ->check(CLI::Validator(CheckLogMask, ""));
+    app.add_flag("--trace", request.trace, "show all log records: --log-mask all")->excludes(mask);
+}
+
+/** Found ahead of all else, since what is wrong with the usage is told in JSON too. */
+bool AsksForJson(int argc, char** argv)
+{
+    for (int i = 1; i < argc && std::strcmp(argv[i], "--") != 0; ++i)
+    {
+        if (std::strcmp(argv[i], "--json") == 0)
+        {
+            return true;
+        }
+    }
+    return false;
+}
+
+ExitStatus RunCommand(const CLI::App& app, const Request& request)
+{
+    if (!request.command)
+    {
+        Complain("a command is required: get, set, explain, check, keys or find" +
+                 std::string(kSeeHelp));
+        return ExitStatus::BadUsage;
+    }
+    AnswerFor(app.get_subcommands().front()->get_name(), request.arguments.file);
+    SetLogMask(request.trace ? "all" : request.logMask);
+    PrepareEngine();
+    return request.command();
+}
+
+ExitStatus Run(int argc, char** argv)
+{
+    Request request;
+    CLI::App app("Reads and changes values of XML configuration files by key path.", "kxconfig");
+    app.footer(HelpFooter());
+    app.require_subcommand(0, 1); // so that an unknown one is named
+    app.fallthrough();
+    AddOptions(app, request);
+    AddGetAndSet(app, request);
+    AddExplainAndCheck(app, request);
+    AddKeysAndFind(app, request);
+    if (argc == 2 && std::strcmp(argv[1], "--man") == 0)
+    {
+        PrintLine(ManPage(app));
+        return ExitStatus::Done;
+    }
+    if (AsksForJson(argc, argv))
+    {
+        AnswerInJson();
+    }
     try
     {
         app.parse(argc, argv);
@@ -142,25 +207,12 @@ ExitStatus Run(int argc, char** argv)
     {
         return ReportUsage(app, error);
     }
-    if (!command)
-    {
-        Complain("a command is required: get, set, keys or find" + std::string(kSeeHelp));
-        return ExitStatus::BadUsage;
-    }
-    SetLogMask(logMask);
-    CollectEngineComplaints();
-    return command();
+    return RunCommand(app, request);
 }
 
 } // namespace
 
 int main(int argc, char** argv)
 {
-    const ExitStatus status = Run(argc, argv);
-    if (!std::cout.flush())
-    {
-        Complain("cannot write to standard output");
-        return static_cast<int>(ExitStatus::NotSaved);
-    }
-    return static_cast<int>(status);
+    return static_cast<int>(Finish(Run(argc, argv)));
 }

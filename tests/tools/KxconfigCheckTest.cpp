@@ -1,0 +1,148 @@
+#include "ToolTest.h"
+
+using namespace kxtest;
+using testing::HasSubstr;
+
+namespace
+{
+
+const std::string kDeclaration = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n";
+
+class KxconfigCheck : public ToolTest
+{
+protected:
+    std::string m_file;
+
+    /** Writes a file that begins with the declaration, so that its content starts on line 2. */
+    void Write(const std::string& xml)
+    {
+        m_file = m_folder.Write("cfg.xml", kDeclaration + xml + "\n");
+    }
+
+    /** Expects one line for each warning, given without the file's name. */
+    void ExpectWarnings(const std::vector<std::string>& warnings,
+                        const std::vector<std::string>& keys = {}) const
+    {
+        std::vector<std::string> arguments = {"check", m_file};
+        arguments.insert(arguments.end(), keys.begin(), keys.end());
+        const Outcome outcome = Tool(arguments);
+        std::string lines;
+        for (const std::string& warning : warnings)
+        {
+            lines += m_file + ":" + warning + "\n";
+        }
+        EXPECT_EQ(lines, outcome.out);
+        EXPECT_EQ(warnings.empty() ? 0 : 1, outcome.status);
+        EXPECT_EQ("", outcome.err);
+    }
+};
+
+} // namespace
+
+TEST_F(KxconfigCheck, HasNothingToSayOfAPlainFile)
+{
+    Write("<cfg><net><if id=\"1\"><ip>a</ip></if><if id=\"2\"><ip>b</ip></if></net>"
+          "<name>box</name></cfg>");
+    ExpectWarnings({});
+}
+
+TEST_F(KxconfigCheck, WarnsOfAKeyThatMatchesMoreThanOneElement)
+{
+    Write("<cfg>\n<a>1</a>\n<a>2</a>\n<a>3</a></cfg>");
+    ExpectWarnings({"4: \"cfg.a\" matches 3 elements, the first of them /cfg/a[1] (line 3)"});
+}
+
+TEST_F(KxconfigCheck, WarnsOfAConditionThatIsSuspended)
+{
+    Write("<cfg>\n<z/>\n<a i=\"1\">1</a>\n<a i=\"2\">2</a></cfg>");
+    ExpectWarnings({"4: /cfg/a[1] is taken for \"a@i=2\" though it does not fulfil it: /cfg/z "
+                    "(line 3) suspends the condition",
+                    "5: /cfg/a[2] would be taken for \"a@i=1\" if /cfg/z (line 3), of another "
+                    "name, came right before it",
+                    "5: \"cfg.a@i=2\" matches 2 elements, the first of them /cfg/a[1] (line 4)"});
+}
+
+TEST_F(KxconfigCheck, WarnsOncePerLevelOfConditionsThatDependOnTheOrder)
+{
+    Write("<cfg>\n<a i=\"1\">1</a>\n<a i=\"2\">2</a>\n<z/></cfg>");
+    ExpectWarnings({"4: /cfg/a[2] would be taken for \"a@i=1\" if /cfg/z (line 5), of another "
+                    "name, came right before it"});
+}
+
+TEST_F(KxconfigCheck, ChecksTheKeysThatItIsGiven)
+{
+    Write("<cfg>\n<a i=\"1\">1</a>\n<a i=\"2\">2</a>\n<z/></cfg>");
+    ExpectWarnings({"4: \"cfg.a\" matches 2 elements, the first of them /cfg/a[1] (line 3)"},
+                   {"cfg.a", "cfg.z"});
+    ExpectWarnings({"3: /cfg/a[1] would be taken for \"a@i=2\" if /cfg/z (line 5), of another "
+                    "name, came right before it"},
+                   {"cfg.a@i=2"});
+    EXPECT_EQ(2, Tool({"check", m_file, "cfg"}).status);
+    EXPECT_EQ(1, Tool({"check", m_file, "other.a"}).status);
+}
+
+TEST_F(KxconfigCheck, WarnsOfValuesThatALookupCannotSee)
+{
+    Write("<cfg>\n<a><![CDATA[x]]></a>\n<b>y<!-- c -->z</b>\n<c>t<d/></c>\n<e>\n</e>\n<f/>\n"
+          "<g>  <h/>  </g></cfg>");
+    ExpectWarnings(
+        {"3: /cfg/a has no value though it holds \"x\": its only child is no text: CDATA section",
+         "4: /cfg/b has no value though it holds \"yz\": it has 3 children: text, comment, text",
+         "5: /cfg/c has no value though it holds \"t\": it has 2 children: text, element d"});
+}
+
+TEST_F(KxconfigCheck, WarnsOfNamesThatAKeyCannotHold)
+{
+    Write("<cfg>\n<a.b>1</a.b></cfg>");
+    ExpectWarnings({"3: /cfg/a.b cannot be named by a key: its name holds a \".\", which ends a "
+                    "segment"});
+}
+
+TEST_F(KxconfigCheck, WarnsOfAttributesThatNoLongerTellElementsApart)
+{
+    Write("<cfg>\n<a t=\"x\" i=\"1\"/>\n<a t=\"x\" i=\"2\"/>\n<a t=\"x\" i=\"1\"/></cfg>");
+    ExpectWarnings({"5: /cfg/a[3] has the same i=\"1\" as /cfg/a[1] (line 3)"});
+    Write("<cfg>\n<a t=\"x\" i=\"1\"/>\n<a t=\"x\" i=\"2\"/></cfg>");
+    ExpectWarnings({});
+}
+
+TEST_F(KxconfigCheck, TellsWhatSavingChangesFirst)
+{
+    const auto expect = [this](const std::string& bytes, const std::vector<std::string>& warnings)
+    {
+        m_file = m_folder.Write("cfg.xml", bytes);
+        ExpectWarnings(warnings);
+    };
+    expect(kDeclaration + "<cfg/>\n", {});
+    expect("<cfg/>\n", {"1: saving changes the XML declaration: none becomes \"<?xml "
+                        "version=\\\"1.0\\\" encoding=\\\"UTF-8\\\"?>\""});
+    expect("<?xml version=\"1.0\" encoding=\"ISO-8859-1\"?>\n<cfg/>\n",
+           {"1: saving changes the XML declaration: \"<?xml version=\\\"1.0\\\" "
+            "encoding=\\\"ISO-8859-1\\\"?>\" becomes \"<?xml version=\\\"1.0\\\" "
+            "encoding=\\\"UTF-8\\\"?>\""});
+    expect("\xEF\xBB\xBF" + kDeclaration + "<cfg/>\n",
+           {"1: saving changes the byte order mark, which is lost"});
+    expect(kDeclaration + "<cfg>\n<a i='1'/></cfg>\n",
+           {"3: saving changes white space or quotes in a tag: \"'1'/></cfg>\" becomes "
+            "\"\\\"1\\\"/></cfg>\""});
+    expect(kDeclaration + "<cfg>\n<a  i=\"1\"/></cfg>\n",
+           {"3: saving changes white space or quotes in a tag: \" i=\\\"1\\\"/></cfg>\" becomes "
+            "\"i=\\\"1\\\"/></cfg>\""});
+    expect(kDeclaration + "<cfg>\n<a></a></cfg>\n",
+           {"3: saving changes how an empty element is written: \"></a></cfg>\" becomes "
+            "\"/></cfg>\""});
+    expect(kDeclaration + "<cfg>\n<a>&#65;</a></cfg>\n",
+           {"3: saving changes how a character is written: \"&#65;</a></cfg>\" becomes "
+            "\"A</a></cfg>\""});
+    expect(kDeclaration + "<cfg>\r\n</cfg>\n",
+           {"2: saving changes line ends (carriage returns): \"\\x0d\" becomes \"\""});
+    expect(kDeclaration + "<cfg/>", {"2: saving changes the end of the file: \"\" becomes \"\""});
+}
+
+TEST_F(KxconfigCheck, LeavesTheFileAlone)
+{
+    m_file = m_folder.Write("cfg.xml", "<cfg><a i='1'/></cfg>");
+    EXPECT_EQ(1, Tool({"check", m_file}).status);
+    EXPECT_EQ("<cfg><a i='1'/></cfg>", ReadFile(m_file));
+    EXPECT_EQ(3, Tool({"check", m_folder.Path("missing.xml")}).status);
+}

@@ -1,0 +1,287 @@
+#include "ToolTest.h"
+
+#include <algorithm>
+#include <sstream>
+
+using namespace kxtest;
+using testing::HasSubstr;
+using testing::Not;
+
+namespace
+{
+
+const std::string kGateway = KX_EXAMPLE_DATA "/gateway.xml";
+
+class KxconfigExplain : public ToolTest
+{
+protected:
+    /** The file of most tests. */
+    const std::string m_file =
+        m_folder.Write("cfg.xml", "<cfg>\n"
+                                  "  <net id='1' on='y'><ip>10.0.0.1</ip></net>\n"
+                                  "  <net id='2'><ip>10.0.0.2</ip></net>\n"
+                                  "  <name>box</name>\n"
+                                  "  <net id='3'><ip>10.0.0.3</ip></net>\n"
+                                  "</cfg>\n");
+
+    void ExpectExplained(const std::string& key, int status, const std::string& lines) const
+    {
+        ExpectOutput({"explain", m_file, key}, status, lines);
+    }
+
+    void ExpectUpdateExplained(const std::string& key, int status, const std::string& lines) const
+    {
+        const std::string before = ReadFile(m_file);
+        ExpectOutput({"explain", "--set", m_file, key}, status, lines);
+        EXPECT_EQ(before, ReadFile(m_file));
+    }
+
+    static void ExpectOutput(const std::vector<std::string>& arguments, int status,
+                             const std::string& lines)
+    {
+        const Outcome outcome = Tool(arguments);
+        EXPECT_EQ(status, outcome.status);
+        EXPECT_EQ(lines, outcome.out);
+        EXPECT_EQ("", outcome.err);
+    }
+
+    /** @return the line about the element a of a document with this root content. */
+    std::string LineAboutA(const std::string& content) const
+    {
+        const std::string file =
+            m_folder.Write("a.xml", "<!DOCTYPE cfg [<!ENTITY e 'x'>]><cfg>" + content + "</cfg>");
+        std::istringstream lines(Tool({"explain", file, "cfg.a"}).out);
+        std::string line;
+        while (std::getline(lines, line) && line.find("/cfg/a: ") == std::string::npos)
+        {
+        }
+        return line;
+    }
+};
+
+const std::string kRoot = "line 1: /cfg: the key starts with the root's name\n";
+
+} // namespace
+
+TEST_F(KxconfigExplain, TellsLevelByLevelWhatWasComparedWithWhat)
+{
+    ExpectExplained("cfg.net@id=1|id=2.ip", 0,
+                    kRoot +
+                        "below /cfg: looking for \"net@id=1|id=2\"\n"
+                        "  line 2: /cfg/net[1]: accepted: id is \"1\"; or id is \"1\", not \"2\"\n"
+                        "    below /cfg/net[1]: looking for \"ip\"\n"
+                        "      line 2: /cfg/net[1]/ip: accepted; value \"10.0.0.1\"\n"
+                        "  line 3: /cfg/net[2]: accepted: id is \"2\", not \"1\"; or id is \"2\"\n"
+                        "    below /cfg/net[2]: looking for \"ip\"\n"
+                        "      line 3: /cfg/net[2]/ip: accepted; value \"10.0.0.2\"\n"
+                        "  line 4: /cfg/name: not named \"net\"; suspends the condition for the "
+                        "next element that is\n"
+                        "  line 5: /cfg/net[3]: accepted by name alone: /cfg/name (line 4) "
+                        "suspended the condition \"id=1|id=2\", which it does not fulfil\n"
+                        "    below /cfg/net[3]: looking for \"ip\"\n"
+                        "      line 5: /cfg/net[3]/ip: accepted; value \"10.0.0.3\"\n"
+                        "GetValue(key): \"10.0.0.1\\n10.0.0.2\\n10.0.0.3\"\n"
+                        "GetValue(key, value): status 0 (success), value "
+                        "\"10.0.0.1\\n10.0.0.2\\n10.0.0.3\"\n");
+}
+
+TEST_F(KxconfigExplain, TellsEachTermUntilOneRejects)
+{
+    const Outcome outcome = Tool({"explain", m_file, "cfg.net@on=y&id=9&x=1.ip"});
+    EXPECT_EQ(0, outcome.status); // the third net is taken by its name alone
+    EXPECT_THAT(outcome.out, HasSubstr("  line 2: /cfg/net[1]: rejected: on is \"y\"; and id is "
+                                       "\"1\", not \"9\"\n"));
+    EXPECT_THAT(outcome.out,
+                HasSubstr("  line 3: /cfg/net[2]: rejected: on is absent, not \"y\"\n"));
+}
+
+TEST_F(KxconfigExplain, TellsThatAnAmpersandAheadOfABarIsPartOfTheValue)
+{
+    EXPECT_THAT(Tool({"explain", m_file, "cfg.net@id=1&on=y|id=2.ip"}).out,
+                HasSubstr("  line 2: /cfg/net[1]: rejected: id is \"1\", not \"1&on=y\" (\"&\" "
+                          "ahead of \"|\" is part of the value); or id is \"1\", not \"2\"\n"));
+}
+
+TEST_F(KxconfigExplain, TellsOfATermThatNamesNoAttribute)
+{
+    EXPECT_THAT(Tool({"explain", m_file, "cfg.net@id.ip"}).out,
+                HasSubstr("  line 2: /cfg/net[1]: rejected: a term without an attribute name never "
+                          "holds\n"));
+}
+
+TEST_F(KxconfigExplain, TellsThatASuspendedConditionWouldHaveHeld)
+{
+    EXPECT_THAT(Tool({"explain", m_file, "cfg.net@id=3.ip"}).out,
+                HasSubstr("suspended the condition \"id=3\", which it fulfils anyway\n"));
+}
+
+TEST_F(KxconfigExplain, TellsWhyAnAcceptedElementHasNoValue)
+{
+    EXPECT_EQ("  line 1: /cfg/a: accepted; value \"x\"", LineAboutA("<a>x</a>"));
+    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: it is empty", LineAboutA("<a/>"));
+    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: its only child is no text: CDATA section",
+              LineAboutA("<a><![CDATA[x]]></a>"));
+    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: its only child is no text: entity reference "
+              "&e;",
+              LineAboutA("<a>&e;</a>"));
+    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: it has 3 children: text, comment, text",
+              LineAboutA("<a>x<!-- c -->y</a>"));
+    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: it has 7 children: blank text, element b, "
+              "blank text, element b, blank text, ...",
+              LineAboutA("<a> <b/> <b/> <b/> </a>"));
+    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: it has 2 children: processing instruction, "
+              "text",
+              LineAboutA("<a><?p?>x</a>"));
+}
+
+TEST_F(KxconfigExplain, SummarisesElementsThatAreAlike)
+{
+    std::string xml = "<cfg>";
+    for (int i = 0; i != 1000; ++i)
+    {
+        xml += "<x i='" + std::to_string(i) + "'/>";
+    }
+    const std::string file = m_folder.Write("many.xml", xml + "<y/><a>1</a><z/><z/></cfg>");
+    ExpectOutput({"explain", file, "cfg.a"}, 0,
+                 kRoot + "below /cfg: looking for \"a\"\n"
+                         "  line 1: /cfg/x[1]: not named \"a\"\n"
+                         "  ... 1000 more elements of other names\n"
+                         "  line 1: /cfg/a: accepted; value \"1\"\n"
+                         "  line 1: /cfg/z[1]: not named \"a\"\n"
+                         "  line 1: /cfg/z[2]: not named \"a\"\n"
+                         "GetValue(key): \"1\"\n"
+                         "GetValue(key, value): status 0 (success), value \"1\"\n");
+    EXPECT_THAT(Tool({"explain", file, "cfg.x@i=-"}).out,
+                HasSubstr("  line 1: /cfg/x[1]: rejected: i is \"0\", not \"-\"\n"
+                          "  ... 999 more elements that the condition rejects\n"
+                          "  line 1: /cfg/y: not named \"x\"; suspends"));
+    const std::string same = m_folder.Write("same.xml", xml + "</cfg>");
+    EXPECT_THAT(Tool({"explain", same, "cfg.a"}).out,
+                HasSubstr("  ... 999 more elements named x\n"));
+}
+
+TEST_F(KxconfigExplain, TellsThatAForeignRootCountsAsSuccess)
+{
+    ExpectExplained("other.name", 1,
+                    "line 1: /cfg: the key starts with \"other\", not with the root's name "
+                    "\"cfg\": nothing is sought, and that counts as success\n"
+                    "GetValue(key): \"\"\n"
+                    "GetValue(key, value): status 0 (success), value \"\"\n");
+}
+
+TEST_F(KxconfigExplain, TellsOfKeysThatNameNothing)
+{
+    ExpectExplained("cfg", 2,
+                    "line 1: /cfg: the key \"cfg\" has no \".\", so nothing is sought\n"
+                    "GetValue(key): \"\"\n"
+                    "GetValue(key, value): status 7 (malformed key), value \"\"\n");
+    ExpectExplained("cfg.", 1,
+                    kRoot + "below /cfg: the key ends in \".\", so nothing is sought\n"
+                            "GetValue(key): \"\"\n"
+                            "GetValue(key, value): status -2 (nothing found), value \"\"\n");
+    ExpectExplained("cfg.name.x", 0,
+                    kRoot + "below /cfg: looking for \"name\"\n"
+                            "  line 2: /cfg/net[1]: not named \"name\"\n"
+                            "  line 3: /cfg/net[2]: not named \"name\"\n"
+                            "  line 4: /cfg/name: accepted; value \"box\"\n"
+                            "    below /cfg/name: there is no element\n"
+                            "  line 5: /cfg/net[3]: not named \"name\"\n"
+                            "GetValue(key): \"box\"\n"
+                            "GetValue(key, value): status 0 (success), value \"box\"\n");
+}
+
+TEST_F(KxconfigExplain, AgreesWithGet)
+{
+    for (const std::string key :
+         {"gateway.name", "gateway.network.interface.address", "gateway.network.dns.server",
+          "gateway.channels.channel@id=1|id=2.limit@level=alarm", "gateway.missing", "gateway.log",
+          "gateway.network.interface@name=eth1.address", "other.name", "gateway"})
+    {
+        const Outcome explained = Tool({"explain", kGateway, key});
+        const Outcome got = Tool({"get", kGateway, key});
+        EXPECT_EQ(got.status, explained.status) << key;
+        // Each value of the narrative stands on a line of what get prints, in this order.
+        std::istringstream lines(explained.out);
+        std::string values;
+        const std::string mark = "; value \"";
+        for (std::string line; std::getline(lines, line);)
+        {
+            const auto at = line.find(mark);
+            const auto start = at + mark.size();
+            values +=
+                at == std::string::npos ? "" : line.substr(start, line.size() - start - 1) + "\n";
+        }
+        EXPECT_EQ(got.out, values) << key;
+    }
+}
+
+TEST_F(KxconfigExplain, TellsWhatAnUpdateReaches)
+{
+    ExpectUpdateExplained(
+        "cfg.net@id=2.ip", 0,
+        kRoot +
+            "below /cfg: looking, to begin with, for \"net@id=2\"\n"
+            "  line 2: /cfg/net[1]: rejected: id is \"1\", not \"2\"; left out with all that is "
+            "below\n"
+            "  line 3: /cfg/net[2]: accepted as \"net@id=2\": id is \"2\"; no text to replace: its "
+            "only child is no text: element ip\n"
+            "    below /cfg/net[2]: looking, to begin with, for \"ip\"\n"
+            "      line 3: /cfg/net[2]/ip: accepted as \"ip\"; its text \"10.0.0.2\" is replaced\n"
+            "  line 4: /cfg/name: not \"ip\"\n"
+            "  line 5: /cfg/net[3]: not \"ip\"\n"
+            "    below /cfg/net[3]: looking, to begin with, for \"ip\"\n"
+            "      line 5: /cfg/net[3]/ip: accepted as \"ip\"; its text \"10.0.0.3\" is replaced\n"
+            "SetValue(key, value): status 0 (success)\n");
+}
+
+TEST_F(KxconfigExplain, TellsThatAnUpdateLosesTheLastSegmentAfterARejection)
+{
+    const Outcome outcome = Tool({"explain", "--set", m_file, "cfg.net@id=2"});
+    EXPECT_EQ(1, outcome.status);
+    EXPECT_THAT(outcome.out, HasSubstr("  line 3: /cfg/net[2]: not \"\"\n"));
+    EXPECT_THAT(outcome.out, HasSubstr("SetValue(key, value): status -2 (nothing found)\n"));
+}
+
+TEST_F(KxconfigExplain, TellsThatAnUpdateIgnoresAForeignRootAndATrailingDot)
+{
+    EXPECT_THAT(Tool({"explain", "--set", m_file, "other.name"}).out,
+                HasSubstr("that counts as success\nSetValue(key, value): status 0 (success)\n"));
+    ExpectUpdateExplained("cfg.", 1,
+                          kRoot + "below /cfg: the key ends in \".\", so nothing is sought\n"
+                                  "SetValue(key, value): status -2 (nothing found)\n");
+}
+
+TEST_F(KxconfigExplain, NamesTheElementsThatSetChanges)
+{
+    for (const std::string key : {"cfg.ip", "cfg.net.ip", "cfg.name", "cfg.net@id=2.ip"})
+    {
+        const std::string explained = Tool({"explain", "--set", m_file, key}).out;
+        std::istringstream changes(Tool({"set", "--dry-run", m_file, key, "new"}).out);
+        long count = 0;
+        for (std::string line; std::getline(changes, line); ++count)
+        {
+            EXPECT_THAT(explained, HasSubstr(line.substr(0, line.find(':')) + ": accepted"));
+        }
+        long told = 0;
+        for (auto at = explained.find(" is replaced\n"); at != std::string::npos;
+             at = explained.find(" is replaced\n", at + 1))
+        {
+            ++told;
+        }
+        EXPECT_EQ(count, told) << key;
+    }
+}
+
+TEST_F(KxconfigExplain, SaysWhyAFileCannotBeRead)
+{
+    const std::string missing = m_folder.Path("missing.xml");
+    ExpectComplaint(Tool({"explain", missing, "a.b"}), 3,
+                    "cannot read " + missing + ": No such file or directory");
+}
+
+TEST_F(KxconfigExplain, ShowsTheRecordsOfTheLibrarysOwnRunOnly)
+{
+    const Outcome outcome = Tool({"explain", "--log-mask", "value", m_file, "cfg.name"});
+    EXPECT_EQ(4, std::count(outcome.err.begin(), outcome.err.end(), '\n')) << outcome.err;
+    EXPECT_THAT(outcome.out, Not(HasSubstr("Key is")));
+}

@@ -1,0 +1,125 @@
+#include "ToolTest.h"
+
+#include <nlohmann/json.hpp>
+
+using namespace kxtest;
+using nlohmann::json;
+
+namespace
+{
+
+class KxconfigJson : public ToolTest
+{
+protected:
+    const std::string m_file = m_folder.Write(
+        "cfg.xml", "<cfg>\n<net id='1'><ip>a</ip></net>\n<net id='2'><ip>b</ip></net></cfg>");
+
+    /** @return the object on standard output, which nothing else stands on. */
+    static json Answer(std::vector<std::string> arguments)
+    {
+        arguments.insert(arguments.begin(), "--json");
+        const Outcome outcome = Tool(arguments);
+        EXPECT_EQ("", outcome.err);
+        const json answer = json::parse(outcome.out, nullptr, false);
+        EXPECT_TRUE(answer.is_object()) << outcome.out;
+        EXPECT_EQ(outcome.status, answer.at("status"));
+        return answer;
+    }
+};
+
+} // namespace
+
+TEST_F(KxconfigJson, HasOneShape)
+{
+    const json expected = {{"file", m_file},
+                           {"verb", "keys"},
+                           {"status", 0},
+                           {"results",
+                            {{{"key", "cfg.net@id=1.ip"}, {"value", "a"}},
+                             {{"key", "cfg.net@id=2.ip"}, {"value", "b"}}}},
+                           {"messages", json::array()}};
+    EXPECT_EQ(expected, Answer({"keys", m_file}));
+}
+
+TEST_F(KxconfigJson, GetGivesEachValueAndItsPlace)
+{
+    const json expected = {{{"location", "/cfg/net[1]/ip"}, {"line", 2}, {"value", "a"}},
+                           {{"location", "/cfg/net[2]/ip"}, {"line", 3}, {"value", "b"}}};
+    EXPECT_EQ(expected, Answer({"get", m_file, "cfg.net.ip"}).at("results"));
+}
+
+TEST_F(KxconfigJson, SetGivesEachChange)
+{
+    const json expected = {{{"location", "/cfg/net[1]/ip"}, {"before", "a"}, {"after", "x"}},
+                           {{"location", "/cfg/net[2]/ip"}, {"before", "b"}, {"after", "x"}}};
+    EXPECT_EQ(expected, Answer({"set", "--dry-run", m_file, "cfg.ip", "x"}).at("results"));
+}
+
+TEST_F(KxconfigJson, FindGivesNodesAndValues)
+{
+    const json expected = {{{"location", "/cfg/net[2]"},
+                            {"line", 3},
+                            {"type", "element"},
+                            {"value", nullptr},
+                            {"attributes", {{"id", "2"}}}}};
+    EXPECT_EQ(expected, Answer({"find", m_file, "//net[2]"}).at("results"));
+    EXPECT_EQ(json({{{"value", "2"}}}), Answer({"find", m_file, "count(//net)"}).at("results"));
+}
+
+TEST_F(KxconfigJson, CheckGivesEachWarning)
+{
+    const json answer = Answer({"check", m_file, "cfg.net.ip"});
+    EXPECT_EQ(1, answer.at("status"));
+    const json expected = {
+        {"line", 3},
+        {"kind", "ambiguous key"},
+        {"text", "\"cfg.net.ip\" matches 2 elements, the first of them /cfg/net[1]/ip (line 2)"}};
+    EXPECT_THAT(answer.at("results"), testing::Contains(expected));
+}
+
+TEST_F(KxconfigJson, ExplainGivesEachStep)
+{
+    const json results = Answer({"explain", m_file, "cfg.net@id=2.ip"}).at("results");
+    ASSERT_EQ(8u, results.size());
+    EXPECT_EQ("root", results[0].at("event"));
+    const json rejected = {
+        {"event", "element"},
+        {"depth", 1},
+        {"line", 2},
+        {"location", "/cfg/net[1]"},
+        {"sought", {{"name", "net"}, {"condition", "id=2"}}},
+        {"verdict", "rejected"},
+        {"terms", {{{"attribute", "id"}, {"expected", "2"}, {"actual", "1"}, {"holds", false}}}},
+        {"value", nullptr}};
+    EXPECT_EQ(rejected, results[2]);
+    EXPECT_EQ("b", results[5].at("value"));
+    const json last = {{"event", "result"},
+                       {"depth", 0},
+                       {"call", "GetValue(key, value)"},
+                       {"status", 0},
+                       {"value", "b"}};
+    EXPECT_EQ(last, results[7]);
+}
+
+TEST_F(KxconfigJson, KeepsComplaintsAsMessages)
+{
+    const json missing = Answer({"get", m_folder.Path("missing.xml"), "a.b"});
+    EXPECT_EQ(3, missing.at("status"));
+    EXPECT_EQ(json({"cannot read " + m_folder.Path("missing.xml") + ": No such file or directory"}),
+              missing.at("messages"));
+    EXPECT_EQ(json::array(), missing.at("results"));
+    const json usage = Answer({"get"});
+    EXPECT_EQ(2, usage.at("status"));
+    EXPECT_EQ(nullptr, usage.at("verb"));
+    EXPECT_EQ(json({"FILE is required (kxconfig --help shows the usage)"}), usage.at("messages"));
+}
+
+TEST_F(KxconfigJson, IsValidWhateverBytesItHolds)
+{
+    const std::string odd = m_folder.Write("odd\xFF\n\".xml", "<cfg><a>\"\\ &#x85;\t</a></cfg>");
+    const json found = Answer({"get", odd, "cfg.a"});
+    EXPECT_EQ("\"\\ \xC2\x85\t", found.at("results")[0].at("value"));
+    EXPECT_EQ(m_folder.Path("odd\xEF\xBF\xBD\n\".xml"), found.at("file"));
+    EXPECT_EQ(1, Answer({"get", odd, "cfg.\xC3\x28\x01"}).at("status"));
+    EXPECT_EQ(0, Answer({"--help"}).at("status"));
+}

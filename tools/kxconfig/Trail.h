@@ -1,0 +1,75 @@
+#ifndef KX_TOOLS_TRAIL_H
+#define KX_TOOLS_TRAIL_H
+
+#include <libxml/tree.h>
+
+#include <memory>
+#include <optional>
+#include <string>
+#include <string_view>
+#include <vector>
+
+// What a lookup or an update did, as recorded by an observer of the library's own walks.
+
+/** A term of a condition, and whether the element's attribute fulfilled it. */
+struct TestedTerm
+{
+    std::string_view attribute; ///< empty for a term without "="
+    std::string_view expected;
+    bool endsWithOr;
+    bool holds;
+};
+
+enum class Verdict
+{
+    OtherName,
+    Rejected, ///< by the condition
+    Accepted
+};
+
+struct TrailLevel;
+
+/** An element that the walk met, and what came of it. */
+struct TrailStep
+{
+    const xmlNode* element;
+    std::string_view name;      ///< what its name was compared with
+    std::string_view condition; ///< of the segment that it was compared with
+    Verdict verdict = Verdict::OtherName;
+    bool suspended = false; ///< accepted by its name alone, whatever the condition
+    std::vector<TestedTerm> terms;
+    std::optional<std::string> text;   ///< the text that can be read or replaced
+    bool keyEnds = false;              ///< the key ends in ".": nothing is sought below
+    std::unique_ptr<TrailLevel> below; ///< null if the walk did not go on below
+};
+
+/** The children of one element. */
+struct TrailLevel
+{
+    const xmlNode* parent;
+    bool keyEnds = false;
+    std::vector<TrailStep> steps;
+};
+
+/** The views in it are of the key that was walked, which must outlive it, as must the document. */
+struct Trail
+{
+    std::unique_ptr<TrailLevel> top; ///< null if nothing was walked
+
+    /** @return the elements that gave or lost their text, in document order. */
+    std::vector<const TrailStep*> StepsWithText() const;
+};
+
+/** @return whether @p key has a "." and starts with the name of the root. */
+bool StartsAtRoot(const xmlDoc* document, const std::string& key);
+
+/** What happens when @p key is looked up; no log records are written. */
+Trail RecordLookup(xmlDoc* document, const std::string& key);
+
+/** What happens when the text under @p key is replaced: the document is changed. */
+Trail RecordUpdate(xmlDoc* document, const std::string& key, const char* value);
+
+/** @return whether @p element fulfils @p condition, as the library tells it. */
+bool Fulfils(const xmlNode* element, std::string_view condition);
+
+#endif
