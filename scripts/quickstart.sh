@@ -47,5 +47,9 @@ show "$kxconfig" set "$copy" gateway.log.level debug
 show "$kxconfig" get "$copy" gateway.log.level
 show "$kxconfig" --log-mask value get "$file" gateway.time.zone
 
+# A key that gives nothing, and why.
+show "$kxconfig" get "$file" gateway.log.target || true
+show "$kxconfig" explain "$file" gateway.log.target || true
+
 printf '\nThe file is %s; try other keys, or %s --help.\n' "$file" "$kxconfig"
 printf 'For kxconfig in any folder: export PATH=%q:$PATH\n' "$PWD/${kxconfig%/*}"

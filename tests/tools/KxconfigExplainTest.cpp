@@ -272,6 +272,20 @@ TEST_F(KxconfigExplain, NamesTheElementsThatSetChanges)
     }
 }
 
+TEST_F(KxconfigExplain, SaysWhereTheEngineStopsCountingLines)
+{
+    const std::string file = m_folder.Write("long.xml", "<cfg>" + std::string(65533, '\n') +
+                                                            "<a>1</a>\n<a>2</a>\n</cfg>");
+    for (const std::string update : {"", "--set"})
+    {
+        std::vector<std::string> arguments = {"explain", file, "cfg.a"};
+        arguments.insert(arguments.end(), update.empty() ? 0 : 1, update);
+        const std::string told = Tool(arguments).out;
+        EXPECT_THAT(told, HasSubstr("  line 65534: /cfg/a[1]: accepted"));
+        EXPECT_THAT(told, HasSubstr("  line 65535 or later: /cfg/a[2]: accepted"));
+    }
+}
+
 TEST_F(KxconfigExplain, SaysWhyAFileCannotBeRead)
 {
     const std::string missing = m_folder.Path("missing.xml");

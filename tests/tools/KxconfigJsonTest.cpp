@@ -63,6 +63,8 @@ TEST_F(KxconfigJson, FindGivesNodesAndValues)
                             {"value", nullptr},
                             {"attributes", {{"id", "2"}}}}};
     EXPECT_EQ(expected, Answer({"find", m_file, "//net[2]"}).at("results"));
+    EXPECT_EQ(nullptr, Answer({"find", m_file, "/"}).at("results")[0].at("line"));
+    EXPECT_EQ(3, Answer({"find", m_file, "//net[2]/@id"}).at("results")[0].at("line"));
     EXPECT_EQ(json({{{"value", "2"}}}), Answer({"find", m_file, "count(//net)"}).at("results"));
 }
 

@@ -75,6 +75,35 @@ Json TermsInJson(const TrailStep& step)
     return terms;
 }
 
+const char* VerdictInJson(const TrailStep& step)
+{
+    switch (step.verdict)
+    {
+    case Verdict::OtherName:
+        return "other name";
+    case Verdict::Rejected:
+        return "rejected";
+    default:
+        return step.suspended ? "accepted by name alone" : "accepted";
+    }
+}
+
+Json StepInJson(const TrailStep& step)
+{
+    Json result = {{"event", "element"},
+                   {"line", LineNumberOf(step.element)},
+                   {"location", LocationOf(step.element)},
+                   {"sought", SoughtInJson(step)},
+                   {"verdict", VerdictInJson(step)},
+                   {"terms", TermsInJson(step)},
+                   {"value", step.text ? Json(*step.text) : Json()}};
+    if (step.verdict == Verdict::Accepted && !step.text)
+    {
+        result["reason"] = WhyNoValue(step.element);
+    }
+    return result;
+}
+
 /** Whose steps are told: of a lookup or of an update. */
 enum class Walk
 {
@@ -182,35 +211,25 @@ private:
 
     void TellStep(const TrailStep& step, const xmlNode* suspender, int depth)
     {
-        Json result = {{"event", "element"},
-                       {"line", LineNumberOf(step.element)},
-                       {"location", LocationOf(step.element)},
-                       {"sought", SoughtInJson(step)}};
-        std::string line = "line " + LineOf(step.element) + ": " + LocationOf(step.element) + ": ";
+        Say(depth,
+            "line " + LineOf(step.element) + ": " + LocationOf(step.element) + ": " +
+                ToldVerdict(step, suspender),
+            StepInJson(step));
+        TellBelow(step, depth + 1);
+    }
+
+    std::string ToldVerdict(const TrailStep& step, const xmlNode* suspender) const
+    {
         switch (step.verdict)
         {
         case Verdict::OtherName:
-            line += Painted(Colour::Faint, OtherName(step, suspender));
-            result["verdict"] = "other name";
-            break;
+            return Painted(Colour::Faint, OtherName(step, suspender));
         case Verdict::Rejected:
-            line += Painted(Colour::Bad, "rejected") + ": " + ToldTerms(step);
-            line += m_walk == Walk::Update ? "; left out with all that is below" : "";
-            result["verdict"] = "rejected";
-            break;
-        case Verdict::Accepted:
-            line += Painted(Colour::Good, "accepted") + Acceptance(step, suspender) + Value(step);
-            result["verdict"] = step.suspended ? "accepted by name alone" : "accepted";
-            break;
+            return Painted(Colour::Bad, "rejected") + ": " + ToldTerms(step) +
+                   (m_walk == Walk::Update ? "; left out with all that is below" : "");
+        default:
+            return Painted(Colour::Good, "accepted") + Acceptance(step, suspender) + Value(step);
         }
-        result["terms"] = TermsInJson(step);
-        result["value"] = step.text ? Json(*step.text) : Json();
-        if (step.verdict == Verdict::Accepted && !step.text)
-        {
-            result["reason"] = WhyNoValue(step.element);
-        }
-        Say(depth, line, result);
-        TellBelow(step, depth + 1);
     }
 
     std::string OtherName(const TrailStep& step, const xmlNode* suspender) const

@@ -108,8 +108,9 @@ Json InJson(const xmlNode* node)
                 {"type", TypeName(node)},
                 {"value", Text(space->href)}};
     }
+    const long line = LineNumberOf(node);
     Json result = {{"location", LocationOf(node)},
-                   {"line", LineNumberOf(node)},
+                   {"line", line > 0 ? Json(line) : Json()},
                    {"type", TypeName(node)},
                    {"value", ShowsContent(node) ? Json(ContentOf(node)) : Json()}};
     if (node->type == XML_ELEMENT_NODE)

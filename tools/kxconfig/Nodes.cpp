@@ -55,7 +55,8 @@ std::string LocationOf(const xmlNode* node)
 
 long LineNumberOf(const xmlNode* node)
 {
-    return xmlGetLineNo(node);
+    // For an element the engine would guess from its children, which an update replaces.
+    return node->type == XML_ELEMENT_NODE ? node->line : xmlGetLineNo(node);
 }
 
 std::string LineOf(const xmlNode* node)

@@ -22,7 +22,7 @@ std::string Taken(xmlChar* text);
 /** @return the location path of @p node, such as /cfg/net[2]/ip. */
 std::string LocationOf(const xmlNode* node);
 
-/** @return the line of the file that @p node stands on. */
+/** @return the line of the file that @p node stands on; negative for the document. */
 long LineNumberOf(const xmlNode* node);
 
 /** The same as it is told: the engine counts up to 65535. */
