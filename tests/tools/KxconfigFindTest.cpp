@@ -45,6 +45,20 @@ TEST_F(KxconfigFind, PrintsEveryKindOfNode)
     EXPECT_EQ("/cfg/p:e element\n", Find("/cfg/*[3]"));
 }
 
+TEST_F(KxconfigFind, PrintsThePrefixOfAnAttribute)
+{
+    const std::string file = m_folder.Write("prefix.xml", "<a xmlns:p='urn:p' p:id='1' id='2'/>");
+    EXPECT_EQ("/a element p:id=\"1\" id=\"2\"\n", Tool({"find", file, "/a"}).out);
+}
+
+TEST_F(KxconfigFind, BlamesTheExpressionAndNotTheFile)
+{
+    const std::string file = m_folder.Write("undeclared.xml", "<a><p:b/></a>");
+    const Outcome outcome = Tool({"find", file, "//["});
+    EXPECT_EQ(2, outcome.status);
+    EXPECT_EQ(std::string::npos, outcome.err.find("prefix")) << outcome.err;
+}
+
 TEST_F(KxconfigFind, PrintsNumbersStringsAndBooleansAsSuch)
 {
     EXPECT_EQ("2\n", Find("count(//net)"));

@@ -2,6 +2,7 @@
 
 #include <fcntl.h>
 #include <sys/stat.h>
+#include <sys/sysmacros.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -162,13 +163,122 @@ TEST_F(KxconfigSet, RefusesToSaveWhatWouldNotLoadAgain)
 
 TEST_F(KxconfigSet, SaysThatSavingFailed)
 {
-    ExpectRefused({"set", m_file, "cfg.name", "x", "--output", "/dev/full"}, 4,
-                  "cannot save /dev/full");
     ExpectRefused({"set", m_file, "cfg.name", "x", "--output", m_folder.Path("")}, 4,
                   "cannot save " + m_folder.Path("") + ": Is a directory");
     const std::string nowhere = m_folder.Path("nowhere/cfg.xml");
     ExpectRefused({"set", m_file, "cfg.name", "x", "--output", nowhere}, 4,
                   "cannot save " + nowhere + ": No such file or directory");
+}
+
+TEST_F(KxconfigSet, SaysThatADeviceIsFull)
+{
+    // A node of the test's own: whoever replaced the real one by a file would harm the machine.
+    const std::string full = m_folder.Path("full");
+    if (mknod(full.c_str(), S_IFCHR | 0666, makedev(1, 7)) != 0)
+    {
+        GTEST_SKIP() << "needs to run as the superuser, to make a device node";
+    }
+    ExpectComplaint(Tool({"set", m_file, "cfg.name", "x", "--output", full}), 4,
+                    "cannot save " + full);
+    struct stat status = {};
+    ASSERT_EQ(0, stat(full.c_str(), &status));
+    EXPECT_TRUE(S_ISCHR(status.st_mode));
+    EXPECT_EQ(m_before, ReadFile(m_file));
+}
+
+TEST_F(KxconfigSet, RefusesAValueThatIsNoXmlText)
+{
+    for (const std::string value : {"x&y", "x&y=2", "&", "a & b"})
+    {
+        ExpectRefused({"set", m_file, "cfg.name", value}, 2,
+                      "VALUE is not XML text: write & as &amp;");
+    }
+}
+
+TEST_F(KxconfigSet, DryRunFailsWhereTheRealRunWould)
+{
+    EXPECT_EQ(4, Tool({"set", "--dry-run", m_file, "cfg.name", "&nowhere;"}).status);
+    EXPECT_EQ(2, Tool({"set", "--dry-run", m_file, "cfg.name", "x&y"}).status);
+    ExpectUntouched();
+}
+
+TEST_F(KxconfigSet, DryRunMakesNoOtherFileEither)
+{
+    EXPECT_EQ(
+        0, Tool({"set", "--dry-run", m_file, "cfg.name", "x", "--output", m_folder.Path("new.xml")})
+               .status);
+    ExpectUntouched();
+}
+
+TEST_F(KxconfigSet, OutputIsWrittenAlsoWhenNothingChanges)
+{
+    const std::string copy = m_folder.Path("copy.xml");
+    EXPECT_EQ(0, Tool({"set", m_file, "cfg.name", "box", "--output", copy}).status);
+    EXPECT_NE(std::string::npos, ReadFile(copy).find("<name>box</name>"));
+}
+
+TEST_F(KxconfigSet, TellsThatPrintingFailedThoughTheFileIsSaved)
+{
+    const Outcome outcome =
+        RunShell(InShell(KX_CONFIG_TOOL) + " set " + m_file + " cfg.name crate >/dev/full");
+    EXPECT_EQ(4, outcome.status);
+    EXPECT_EQ("kxconfig: cannot write to standard output\n", outcome.err);
+    EXPECT_NE(std::string::npos, ReadFile(m_file).find("crate"));
+}
+
+TEST_F(KxconfigSet, RefusesAFileThatMustNotBeWritten)
+{
+    if (geteuid() != 0)
+    {
+        GTEST_SKIP() << "needs to run as the superuser, to become somebody else";
+    }
+    ASSERT_EQ(0, chmod(m_folder.Path("").c_str(), 0777));
+    ASSERT_EQ(0, chmod(m_file.c_str(), 0444));
+    const Outcome outcome =
+        RunProgram({KX_CONFIG_TOOL, "set", m_file, "cfg.name", "crate"}, {}, 65534);
+    EXPECT_EQ(4, outcome.status);
+    EXPECT_EQ("kxconfig: cannot save " + m_file + ": Permission denied\n", outcome.err);
+    ExpectUntouched();
+}
+
+TEST_F(KxconfigSet, KeepsOwnerAndGroup)
+{
+    if (geteuid() != 0)
+    {
+        GTEST_SKIP() << "needs to run as the superuser, to give the file away";
+    }
+    ASSERT_EQ(0, chown(m_file.c_str(), 1234, 4321));
+    EXPECT_EQ(0, Tool({"set", m_file, "cfg.name", "crate"}).status);
+    struct stat status = {};
+    ASSERT_EQ(0, stat(m_file.c_str(), &status));
+    EXPECT_EQ(1234u, status.st_uid);
+    EXPECT_EQ(4321u, status.st_gid);
+}
+
+TEST_F(KxconfigSet, DoesNotTakeAFileFromItsGroup)
+{
+    if (geteuid() != 0)
+    {
+        GTEST_SKIP() << "needs to run as the superuser, to become somebody else";
+    }
+    // Writable for all, but of a group that the other user is not in.
+    ASSERT_EQ(0, chmod(m_folder.Path("").c_str(), 0777));
+    ASSERT_EQ(0, chown(m_file.c_str(), 1234, 4321));
+    ASSERT_EQ(0, chmod(m_file.c_str(), 0666));
+    EXPECT_EQ(4,
+              RunProgram({KX_CONFIG_TOOL, "set", m_file, "cfg.name", "crate"}, {}, 65534).status);
+    ExpectUntouched();
+}
+
+TEST_F(KxconfigSet, FollowsALinkToAFileThatIsYetToBe)
+{
+    const std::string link = m_folder.Path("link.xml");
+    ASSERT_EQ(0, symlink("target.xml", link.c_str()));
+    EXPECT_EQ(0, Tool({"set", m_file, "cfg.name", "crate", "--output", link}).status);
+    struct stat status = {};
+    ASSERT_EQ(0, lstat(link.c_str(), &status));
+    EXPECT_TRUE(S_ISLNK(status.st_mode));
+    EXPECT_NE(std::string::npos, ReadFile(m_folder.Path("target.xml")).find("crate"));
 }
 
 TEST_F(KxconfigSet, KeepsPermissionsAndLinks)

@@ -3,6 +3,7 @@
 #include "Nodes.h"
 #include "Output.h"
 
+#include <libxml/parser.h>
 #include <libxml/tree.h>
 #include <libxml/xmlerror.h>
 
@@ -18,6 +19,7 @@ namespace
 {
 
 std::string g_firstComplaint;
+bool g_complaintIsFatal = false;
 
 #if LIBXML_VERSION >= 21200
 using EngineError = const xmlError*;
@@ -31,10 +33,14 @@ void Ignore(void*, const char*, ...)
 
 void KeepFirstComplaint(void*, EngineError error)
 {
-    if (!g_firstComplaint.empty() || error->level < XML_ERR_ERROR || error->message == nullptr)
+    // What ends a parse tells more than what went before it, such as a prefix that is not declared.
+    const bool isFatal = error->level == XML_ERR_FATAL;
+    const bool isFirst = g_firstComplaint.empty() || (isFatal && !g_complaintIsFatal);
+    if (!isFirst || error->level < XML_ERR_ERROR || error->message == nullptr)
     {
         return;
     }
+    g_complaintIsFatal = isFatal;
     g_firstComplaint = error->message;
     g_firstComplaint.erase(
         std::min(g_firstComplaint.find_first_of("\r\n"), g_firstComplaint.size()));
@@ -42,6 +48,12 @@ void KeepFirstComplaint(void*, EngineError error)
     {
         g_firstComplaint = std::to_string(error->line) + ": " + g_firstComplaint;
     }
+}
+
+void ForgetComplaints()
+{
+    g_firstComplaint.clear();
+    g_complaintIsFatal = false;
 }
 
 /** @return what keeps the file from being read as one, or an empty string. */
@@ -65,7 +77,7 @@ std::string WhyNotRead(const std::string& path)
 /** @return whether @p path is a file that can be read; begins a new collection of complaints. */
 bool CanBeRead(const std::string& path, std::string& complaint)
 {
-    g_firstComplaint.clear();
+    ForgetComplaints();
     const std::string reason = WhyNotRead(path);
     if (!reason.empty())
     {
@@ -100,6 +112,7 @@ std::unique_ptr<CXMLReader> LoadFile(const std::string& path, std::string& compl
         complaint = WhyNotParsed(path);
         return nullptr;
     }
+    ForgetComplaints(); // of a file that loads all the same
     return reader;
 }
 
@@ -116,6 +129,7 @@ bool LoadDocument(const std::string& path, CXmlParser& document)
         Complain(WhyNotParsed(path));
         return false;
     }
+    ForgetComplaints();
     return true;
 }
 
@@ -133,6 +147,20 @@ std::unique_ptr<CXMLReader> LoadFile(const std::string& path)
         Complain(complaint);
     }
     return reader;
+}
+
+std::string WhyNotLoadedAgain(CXMLReader& reader)
+{
+    xmlChar* text = nullptr;
+    int size = 0;
+    xmlDocDumpMemoryEnc(static_cast<xmlDoc*>(reader.GetDataPtr()), &text, &size, "UTF-8");
+    ForgetComplaints();
+    xmlDoc* const again =
+        xmlReadMemory(reinterpret_cast<const char*>(text), size, nullptr, nullptr, 0);
+    xmlFree(text);
+    const bool loads = again != nullptr;
+    xmlFreeDoc(again);
+    return loads ? "" : FirstComplaint("");
 }
 
 ExitStatus CheckKey(const std::string& file, const std::string& key, CXMLReader& reader)

@@ -36,6 +36,12 @@ bool LoadDocument(const std::string& path, CXmlParser& document);
 std::string FirstComplaint(const std::string& before);
 
 /**
+ * @return why the document that @p reader holds would not load again once it is saved, as "LINE:
+ *         reason"; or an empty string.
+ */
+std::string WhyNotLoadedAgain(CXMLReader& reader);
+
+/**
  * Complains if @p key cannot be one, or starts with another name than the root of @p reader, which
  * the library itself takes for success.
  *

@@ -23,7 +23,8 @@ const ExitStatusMeaning kExitStatuses[] = {
     {ExitStatus::NothingFound, "nothing found; check: there are warnings"},
     {ExitStatus::BadUsage, "bad usage, malformed key or expression"},
     {ExitStatus::BadFile, "the file cannot be read, or is not well-formed XML"},
-    {ExitStatus::NotSaved, "saving or printing failed: the file is as it was"},
+    {ExitStatus::NotSaved,
+     "saving or printing failed; a file that could not be saved is as it was"},
 };
 
 #endif

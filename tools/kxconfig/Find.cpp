@@ -57,7 +57,9 @@ std::string Attributes(const xmlNode* element)
          attribute = attribute->next)
     {
         const auto node = reinterpret_cast<const xmlNode*>(attribute);
-        attributes += " " + Text(attribute->name) + "=" + Quoted(ContentOf(node));
+        const bool hasPrefix = attribute->ns != nullptr && attribute->ns->prefix != nullptr;
+        const std::string prefix = hasPrefix ? Text(attribute->ns->prefix) + ":" : "";
+        attributes += " " + prefix + Text(attribute->name) + "=" + Quoted(ContentOf(node));
     }
     return attributes;
 }

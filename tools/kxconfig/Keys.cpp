@@ -32,7 +32,7 @@ std::vector<Attribute> UsableAttributes(const xmlNode* element)
     {
         const std::string name = Text(attribute->name);
         const std::string value = AttributeOf(element, name);
-        if (IsFreeOf(".|&=@", name) && IsFreeOf(".|&\t\n", value))
+        if (IsFreeOf(".|&=@", name) && IsFreeOf(".|&\t\r\n", value))
         {
             usable.push_back({name, value});
         }

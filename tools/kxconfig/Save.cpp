@@ -1,7 +1,6 @@
 #include "Save.h"
 
-#include "Document.h"
-
+#include <algorithm>
 #include <cerrno>
 #include <cstring>
 #include <filesystem>
@@ -86,10 +85,15 @@ private:
             umask(mask);
             return fchmod(file, 0666 & ~mask) == 0;
         }
-        // Who may write the file but does not own it makes it his own, as most editors do.
+        // Who may write the file without owning it becomes its owner; those who share it by its
+        // group must not lose it.
         if (fchown(file, status.st_uid, status.st_gid) != 0)
         {
             status.st_mode &= 0777;
+            if (fchown(file, static_cast<uid_t>(-1), status.st_gid) != 0)
+            {
+                return false;
+            }
         }
         return fchmod(file, status.st_mode & 07777) == 0;
     }
@@ -99,33 +103,64 @@ private:
     bool m_failed;
 };
 
-std::string SaveBeside(CXMLWriter& writer, const std::string& path, const fs::path& target)
+std::string SaveBeside(CXMLWriter& writer, const std::string& path, const fs::path& target,
+                       const FileState* loaded)
 {
     Replacement replacement(target);
     if (replacement.Failed())
     {
         return "cannot save " + path + ": " + SystemReason();
     }
-    std::string complaint = SaveDirectly(writer, replacement.Name());
-    if (!complaint.empty())
+    if (!SaveDirectly(writer, replacement.Name()).empty())
     {
         return "cannot save " + path + ": the engine could not write it";
     }
-    if (LoadFile(replacement.Name(), complaint) == nullptr)
+    if (loaded != nullptr && loaded->HasChanged(target))
     {
-        const std::string line = complaint.substr(std::strlen(replacement.Name()) + 1);
-        return "not saved: " + path + " would not load any more, line " + line;
+        return "not saved: " + path + " was changed by somebody else meanwhile";
     }
     return replacement.TakePlace() ? "" : "cannot save " + path + ": " + SystemReason();
 }
 
-} // namespace
-
-std::string Save(CXMLWriter& writer, const std::string& path)
+/** @return the file that @p path leads to by symbolic links; it need not exist. */
+fs::path FollowLinks(const std::string& path)
 {
     std::error_code error;
-    const fs::path resolved = fs::weakly_canonical(path, error); // follows links
-    const fs::path target = error ? fs::path(path) : resolved;
+    fs::path target = path;
+    for (int links = 0; links != 40 && fs::is_symlink(fs::symlink_status(target, error)); ++links)
+    {
+        target = target.parent_path() / fs::read_symlink(target, error);
+    }
+    const fs::path resolved = fs::weakly_canonical(target, error);
+    return error ? target : resolved;
+}
+
+} // namespace
+
+FileState::FileState(const std::string& path) : m_numbers()
+{
+    struct stat status = {};
+    m_exists = stat(path.c_str(), &status) == 0;
+    if (m_exists)
+    {
+        m_numbers[0] = static_cast<unsigned long long>(status.st_dev);
+        m_numbers[1] = static_cast<unsigned long long>(status.st_ino);
+        m_numbers[2] = static_cast<unsigned long long>(status.st_size);
+        m_numbers[3] = static_cast<unsigned long long>(status.st_mtim.tv_sec);
+        m_numbers[4] = static_cast<unsigned long long>(status.st_mtim.tv_nsec);
+    }
+}
+
+bool FileState::HasChanged(const std::string& path) const
+{
+    const FileState now(path);
+    return now.m_exists != m_exists || !std::equal(m_numbers, m_numbers + 5, now.m_numbers);
+}
+
+std::string Save(CXMLWriter& writer, const std::string& path, const FileState* loaded)
+{
+    std::error_code error;
+    const fs::path target = FollowLinks(path);
     const fs::file_status status = fs::status(target, error);
     if (fs::is_directory(status))
     {
@@ -139,5 +174,5 @@ std::string Save(CXMLWriter& writer, const std::string& path)
     {
         return "cannot save " + path + ": " + SystemReason();
     }
-    return SaveBeside(writer, path, target);
+    return SaveBeside(writer, path, target, loaded);
 }

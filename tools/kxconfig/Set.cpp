@@ -10,6 +10,11 @@ namespace
 ExitStatus Update(CXMLWriter& writer, const SetArguments& arguments)
 {
     const int status = writer.SetValue(arguments.key, arguments.value);
+    if (!FirstComplaint("").empty())
+    {
+        Complain("VALUE is not XML text: write & as &amp;");
+        return ExitStatus::BadUsage;
+    }
     if (status == 0)
     {
         return ExitStatus::Done;
@@ -37,26 +42,25 @@ void PrintChanges(const std::vector<ChangedText>& changes)
     }
 }
 
-ExitStatus SaveUnlessAsked(CXMLWriter& writer, const SetArguments& arguments, bool changed)
+/** @return an empty string, or why nothing was saved, or, in a dry run, would be. */
+std::string SaveChanges(CXMLReader& reader, CXMLWriter& writer, const SetArguments& arguments,
+                        const FileState& loaded)
 {
     const bool elsewhere = !arguments.output.empty();
-    if (arguments.dryRun || (!changed && !elsewhere))
+    const std::string& target = elsewhere ? arguments.output : arguments.file;
+    const std::string reason = WhyNotLoadedAgain(reader);
+    if (!reason.empty())
     {
-        return ExitStatus::Done;
+        return "not saved: " + target + " would not load any more, line " + reason;
     }
-    const std::string complaint = Save(writer, elsewhere ? arguments.output : arguments.file);
-    if (!complaint.empty())
-    {
-        Complain(complaint);
-        return ExitStatus::NotSaved;
-    }
-    return ExitStatus::Done;
+    return arguments.dryRun ? "" : Save(writer, target, elsewhere ? nullptr : &loaded);
 }
 
 } // namespace
 
 ExitStatus Set(const SetArguments& arguments)
 {
+    const FileState loaded(arguments.file);
     const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file);
     if (reader == nullptr)
     {
@@ -75,10 +79,15 @@ ExitStatus Set(const SetArguments& arguments)
         return status;
     }
     const std::vector<ChangedText> changes = texts.Changes();
-    status = SaveUnlessAsked(writer.Get(), arguments, !changes.empty());
-    if (status == ExitStatus::Done)
+    if (!changes.empty() || !arguments.output.empty())
     {
-        PrintChanges(changes);
+        const std::string complaint = SaveChanges(*reader, writer.Get(), arguments, loaded);
+        if (!complaint.empty())
+        {
+            Complain(complaint);
+            return ExitStatus::NotSaved;
+        }
     }
-    return status;
+    PrintChanges(changes);
+    return ExitStatus::Done;
 }
