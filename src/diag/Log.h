@@ -78,9 +78,16 @@ inline bool LogEnabled(LogLevel level)
     KX_LOG_RECORD_OF(kx::LogLevelTrace, __FUNCTION__, format, argument)
 #define KX_ERROR(text) KX_LOG_RECORD(kx::LogLevelError, __FUNCTION__, text)
 #define KX_ERROR_AS(tag, text) KX_LOG_RECORD(kx::LogLevelError, tag, text)
+#define KX_ERROR_OF(format, argument)                                                              \
+    KX_LOG_RECORD_OF(kx::LogLevelError, __FUNCTION__, format, argument)
+#define KX_WARNING(text) KX_LOG_RECORD(kx::LogLevelWarning, __FUNCTION__, text)
 #define KX_VALUE_OF(format, argument)                                                              \
     KX_LOG_RECORD_OF(kx::LogLevelValue, __FUNCTION__, format, argument)
 #define KX_VALUE_AS(tag, format, argument)                                                         \
     KX_LOG_RECORD_OF(kx::LogLevelValue, tag, format, argument)
+#define KX_XPATH(text) KX_LOG_RECORD(kx::LogLevelXPath, __FUNCTION__, text)
+#define KX_XPATH_AS(tag, text) KX_LOG_RECORD(kx::LogLevelXPath, tag, text)
+#define KX_XPATH_OF(format, argument)                                                              \
+    KX_LOG_RECORD_OF(kx::LogLevelXPath, __FUNCTION__, format, argument)
 
 #endif

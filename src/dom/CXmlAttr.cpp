@@ -1,0 +1,21 @@
+#include "CXmlAttr.h"
+
+#include "diag/Log.h"
+
+CXmlAttr::CXmlAttr()
+{
+    KX_TRACE("+");
+    KX_TRACE("-");
+}
+
+CXmlAttr::CXmlAttr(std::string name, std::string value) : m_strName(name), m_strValue(value)
+{
+    KX_TRACE("+");
+    KX_TRACE("-");
+}
+
+CXmlAttr::~CXmlAttr()
+{
+    KX_TRACE("+");
+    KX_TRACE("-");
+}

@@ -1,0 +1,198 @@
+#include "EngineNode.h"
+
+#include <libxml/valid.h>
+
+namespace kx
+{
+
+namespace
+{
+
+/** Whether @p node is a full node record whose children are its own. */
+bool IsPlainNode(const xmlNode* node)
+{
+    switch (node->type)
+    {
+    case XML_ELEMENT_NODE:
+    case XML_TEXT_NODE:
+    case XML_CDATA_SECTION_NODE:
+    case XML_PI_NODE:
+    case XML_COMMENT_NODE:
+    case XML_DOCUMENT_FRAG_NODE:
+    case XML_XINCLUDE_START:
+    case XML_XINCLUDE_END:
+        return true;
+    default:
+        return false;
+    }
+}
+
+bool IsDocument(const xmlNode* node)
+{
+    return node->type == XML_DOCUMENT_NODE || node->type == XML_HTML_DOCUMENT_NODE;
+}
+
+bool IsAttribute(const xmlNode* node)
+{
+    return node != 0 && node->type == XML_ATTRIBUTE_NODE;
+}
+
+/** Entity references keep pointing to the entities that a DTD declares. */
+bool DeclaresEntities(const xmlNode* dtd)
+{
+    return reinterpret_cast<const xmlDtd*>(dtd)->entities != 0;
+}
+
+/**
+ * Makes the attribute that @p node is, or is a piece of, an ordinary one if it is an ID.
+ *
+ * The engine's table of IDs finds an entry by the attribute's value: an attribute whose value was
+ * changed would stay in the table after it is freed.
+ */
+void ForgetId(xmlNode* node)
+{
+    xmlNode* const owner = IsAttribute(node) ? node : LinkOf(node, &xmlNode::parent);
+    if (!IsAttribute(owner))
+    {
+        return;
+    }
+    xmlAttr* const attribute = reinterpret_cast<xmlAttr*>(owner);
+    if (attribute->atype == XML_ATTRIBUTE_ID)
+    {
+        xmlRemoveID(attribute->doc, attribute);
+    }
+}
+
+/** Whether @p attribute has a name and, unless @p value is empty, a text. */
+bool IsWhole(const xmlAttr* attribute, const std::string& value)
+{
+    const xmlNode* const text = attribute->children;
+    return attribute->name != 0 && (value.empty() || (text != 0 && text->content != 0));
+}
+
+} // namespace
+
+xmlNode* LinkOf(const xmlNode* node, NodeLink link)
+{
+    return node != 0 && node->type != XML_NAMESPACE_DECL ? node->*link : 0;
+}
+
+xmlNode* ElementFrom(xmlNode* node, NodeLink link)
+{
+    while (node != 0 && node->type != XML_ELEMENT_NODE)
+    {
+        node = node->*link;
+    }
+    return node;
+}
+
+const xmlChar* NameOf(const xmlNode* node)
+{
+    return node != 0 && node->type != XML_NAMESPACE_DECL ? node->name : 0;
+}
+
+xmlNs* NamespaceOf(xmlNode* node)
+{
+    if (IsAttribute(node))
+    {
+        return reinterpret_cast<xmlAttr*>(node)->ns;
+    }
+    return IsElement(node) ? node->ns : 0;
+}
+
+xmlAttr* AttributesOf(const xmlNode* node)
+{
+    return IsElement(node) ? node->properties : 0;
+}
+
+bool CanHoldChildren(const xmlNode* node)
+{
+    return node != 0 && (IsPlainNode(node) || IsAttribute(node) || IsDocument(node) ||
+                         node->type == XML_DTD_NODE);
+}
+
+bool CanHaveSiblings(const xmlNode* node)
+{
+    // The siblings of an attribute are attributes: an element must not enter their chain.
+    return node != 0 && !IsAttribute(node);
+}
+
+bool CanSetContent(const xmlNode* node)
+{
+    // The content and the child of an entity reference belong to the entity's declaration.
+    return node != 0 && node->type != XML_ENTITY_REF_NODE && node->type != XML_ENTITY_NODE;
+}
+
+bool CanBeRemoved(const xmlNode* node)
+{
+    return node != 0 &&
+           (IsPlainNode(node) || IsAttribute(node) || node->type == XML_ENTITY_REF_NODE ||
+            (node->type == XML_DTD_NODE && !DeclaresEntities(node)));
+}
+
+bool CanBeCleared(const xmlNode* node)
+{
+    const xmlNode* child = LinkOf(node, &xmlNode::children);
+    while (CanBeRemoved(child) && child->parent == node)
+    {
+        child = child->next;
+    }
+    return node != 0 && child == 0;
+}
+
+xmlNode* WholeElement(xmlNode* element)
+{
+    if (element != 0 && element->name == 0)
+    {
+        xmlFreeNode(element);
+        return 0;
+    }
+    return element;
+}
+
+bool AddAttribute(xmlNode* node, const std::string& name, const std::string& value)
+{
+    xmlAttr* const attribute = xmlNewNsProp(node, 0, ToEngine(name), ToEngine(value));
+    if (attribute != 0 && !IsWhole(attribute, value))
+    {
+        xmlRemoveProp(attribute);
+        return false;
+    }
+    return attribute != 0;
+}
+
+void ReplaceContent(xmlNode* node, const std::string& text)
+{
+    ForgetId(node);
+    xmlNodeSetContent(node, ToEngine(text));
+}
+
+void RemoveChildren(xmlNode* node)
+{
+    while (LinkOf(node, &xmlNode::children) != 0)
+    {
+        RemoveFromTree(node->children);
+    }
+}
+
+void RemoveAttributes(xmlNode* node)
+{
+    // An attribute that the engine fails to remove would be met again and again.
+    bool removed = true;
+    while (removed && AttributesOf(node) != 0)
+    {
+        removed = xmlRemoveProp(AttributesOf(node)) == 0;
+    }
+}
+
+void RemoveFromTree(xmlNode* node)
+{
+    if (!IsAttribute(node))
+    {
+        ForgetId(node);
+    }
+    xmlUnlinkNode(node);
+    xmlFreeNode(node);
+}
+
+} // namespace kx

@@ -1,0 +1,94 @@
+#ifndef KX_DOM_ENGINENODE_H
+#define KX_DOM_ENGINENODE_H
+
+/**
+ * @file EngineNode.h
+ * The engine's node records, as handles may use them.
+ *
+ * A handle can stand on any record that begins with the engine's type number. Documents,
+ * attributes, DTDs and declarations share only their first fields (name, links, document) with a
+ * node; a namespace shares nothing but the type. The functions below look at the type before they
+ * read a field, so that every operation is safe on every kind of node.
+ */
+
+#include <libxml/tree.h>
+
+#include <string>
+
+namespace kx
+{
+
+inline const xmlChar* ToEngine(const std::string& text)
+{
+    return reinterpret_cast<const xmlChar*>(text.c_str());
+}
+
+/** @return the engine's zero-terminated @p text, which may be null: then it reads as empty. */
+inline const char* FromEngine(const xmlChar* text)
+{
+    return text != 0 ? reinterpret_cast<const char*>(text) : "";
+}
+
+/** One of a node's links: &xmlNode::next and its like. */
+typedef xmlNode* xmlNode::*NodeLink;
+
+inline bool IsElement(const xmlNode* node)
+{
+    return node != 0 && node->type == XML_ELEMENT_NODE;
+}
+
+/** @return what @p node, which may be null, is linked to by @p link; null if it has no such link.
+ */
+xmlNode* LinkOf(const xmlNode* node, NodeLink link);
+
+/** @return the first of @p node and those that follow it by @p link that is an element, or null. */
+xmlNode* ElementFrom(xmlNode* node, NodeLink link);
+
+/** @return the stored name of @p node, which may be null; null if it has none. */
+const xmlChar* NameOf(const xmlNode* node);
+
+/** @return the namespace of @p node; null if it has none or is of a kind that cannot have one. */
+xmlNs* NamespaceOf(xmlNode* node);
+
+/** @return the first attribute of @p node, which may be null; only elements have attributes. */
+xmlAttr* AttributesOf(const xmlNode* node);
+
+/** @return whether a child linked under @p node, which may be null, is freed with it. */
+bool CanHoldChildren(const xmlNode* node);
+
+/** @return whether an element can be linked beside @p node, which may be null. */
+bool CanHaveSiblings(const xmlNode* node);
+
+/** @return whether @p node, which may be null, can take the content that is set on it. */
+bool CanSetContent(const xmlNode* node);
+
+/** @return whether nothing else in the engine points to @p node, which may be null. */
+bool CanBeRemoved(const xmlNode* node);
+
+/** @return whether @p node, which may be null, can give up all its children. */
+bool CanBeCleared(const xmlNode* node);
+
+/**
+ * @return @p element, which the engine has just made, or null if it could not be made whole: short
+ *         of memory the engine answers an element without a name, which is freed here.
+ */
+xmlNode* WholeElement(xmlNode* element);
+
+/** Adds an attribute to @p node. @return whether the engine made it, name and value and all. */
+bool AddAttribute(xmlNode* node, const std::string& name, const std::string& value);
+
+/** Replaces the content of @p node. */
+void ReplaceContent(xmlNode* node, const std::string& text);
+
+/** Removes every child of @p node, which can be cleared. */
+void RemoveChildren(xmlNode* node);
+
+/** Removes every attribute of @p node. */
+void RemoveAttributes(xmlNode* node);
+
+/** Takes @p node out of its tree and frees it with all that it holds. */
+void RemoveFromTree(xmlNode* node);
+
+} // namespace kx
+
+#endif

@@ -1,0 +1,20 @@
+#ifndef KX_DOM_HANDLE_H
+#define KX_DOM_HANDLE_H
+
+#include "CXmlNode.h"
+
+namespace kx
+{
+
+/** Sets @p handle, a null handle so far, on @p node; without a node it stays null. */
+inline void Designate(CXmlNode& handle, _xmlNode* node)
+{
+    if (node != 0)
+    {
+        handle.SetXmlNodePtr(node);
+    }
+}
+
+} // namespace kx
+
+#endif
