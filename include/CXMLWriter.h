@@ -125,7 +125,8 @@ public:
      * empty                  | nothing: a later SetValue() does not reach the element any more |
      *
      * Control characters other than tab, newline and carriage return save, but do not load. A value
-     * is used up to its first NUL byte.
+     * is used up to its first NUL byte. If the engine runs out of memory, an element can be left empty
+     * though it counts as updated: the engine does not tell.
      *
      * @param key    the key path; its first component is the root's name, without a condition.
      * @param value  the new text.
