@@ -10,6 +10,7 @@
 #include <algorithm>
 #include <cstdarg>
 #include <cstdio>
+#include <optional>
 
 namespace
 {
@@ -18,9 +19,19 @@ bool g_noting = false;
 std::vector<const void*> g_freed;
 std::vector<std::string> g_parsed;
 std::vector<std::string> g_properties;
+std::vector<std::string> g_formatSaves;
+std::vector<int> g_blanksDefaults;
+std::size_t g_cleanups = 0;
+long g_contexts = 0;
 std::string g_engineErrors;
+
 bool g_answerSaves = false;
 int g_saveResult = 0;
+std::optional<int> g_formatSaveAnswer;
+std::optional<xmlXPathObjectPtr> g_xpathAnswer;
+xmlXPathObjectPtr g_lastXPath = nullptr;
+bool g_refuseContext = false;
+bool g_refuseSibling = false;
 
 template <class Function>
 Function* Next(Function*, const char* name)
@@ -80,11 +91,93 @@ extern "C" int xmlSaveFileEnc(const char* path, xmlDocPtr document, const char* 
     return g_answerSaves ? g_saveResult : engine(path, document, encoding);
 }
 
+extern "C" int xmlSaveFormatFileEnc(const char* path, xmlDocPtr document, const char* encoding,
+                                    int format)
+{
+    static const auto engine = Next(&xmlSaveFormatFileEnc, "xmlSaveFormatFileEnc");
+    if (g_noting)
+    {
+        g_formatSaves.push_back(path + std::string(" ") + encoding + " " + std::to_string(format));
+    }
+    if (g_formatSaveAnswer)
+    {
+        const int answer = *g_formatSaveAnswer;
+        g_formatSaveAnswer.reset();
+        return answer;
+    }
+    return engine(path, document, encoding, format);
+}
+
+extern "C" int xmlKeepBlanksDefault(int value)
+{
+    static const auto engine = Next(&xmlKeepBlanksDefault, "xmlKeepBlanksDefault");
+    if (g_noting)
+    {
+        g_blanksDefaults.push_back(value);
+    }
+    return engine(value);
+}
+
+extern "C" void xmlCleanupParser()
+{
+    static const auto engine = Next(&xmlCleanupParser, "xmlCleanupParser");
+    g_cleanups += g_noting;
+    engine();
+}
+
+extern "C" xmlXPathContextPtr xmlXPathNewContext(xmlDocPtr document)
+{
+    static const auto engine = Next(&xmlXPathNewContext, "xmlXPathNewContext");
+    if (g_refuseContext)
+    {
+        g_refuseContext = false;
+        return nullptr;
+    }
+    const xmlXPathContextPtr context = engine(document);
+    g_contexts += context != nullptr;
+    return context;
+}
+
+extern "C" void xmlXPathFreeContext(xmlXPathContextPtr context)
+{
+    static const auto engine = Next(&xmlXPathFreeContext, "xmlXPathFreeContext");
+    g_contexts -= context != nullptr;
+    engine(context);
+}
+
+extern "C" xmlXPathObjectPtr xmlXPathEvalExpression(const xmlChar* text, xmlXPathContextPtr context)
+{
+    static const auto engine = Next(&xmlXPathEvalExpression, "xmlXPathEvalExpression");
+    if (g_xpathAnswer)
+    {
+        g_lastXPath = *g_xpathAnswer;
+        g_xpathAnswer.reset();
+        return g_lastXPath;
+    }
+    g_lastXPath = engine(text, context);
+    return g_lastXPath;
+}
+
+extern "C" xmlNodePtr xmlAddSibling(xmlNodePtr node, xmlNodePtr sibling)
+{
+    static const auto engine = Next(&xmlAddSibling, "xmlAddSibling");
+    if (g_refuseSibling)
+    {
+        g_refuseSibling = false;
+        return nullptr;
+    }
+    return engine(node, sibling);
+}
+
 namespace kxtest
 {
 
 EngineCalls::EngineCalls()
 {
+    g_formatSaves.clear();
+    g_blanksDefaults.clear();
+    g_cleanups = 0;
+    g_contexts = 0;
     g_freed.clear();
     g_parsed.clear();
     g_properties.clear();
@@ -95,6 +188,12 @@ EngineCalls::~EngineCalls()
 {
     g_noting = false;
     g_answerSaves = false;
+}
+
+void EngineCalls::AnswerSavesWith(int result)
+{
+    g_answerSaves = true;
+    g_saveResult = result;
 }
 
 std::size_t EngineCalls::Freed(const void* document) const
@@ -114,11 +213,42 @@ const std::vector<std::string>& EngineCalls::PropertiesRead() const
 {
     return g_properties;
 }
-
-void EngineCalls::AnswerSavesWith(int result)
+const std::vector<std::string>& EngineCalls::FormatSaves() const
 {
-    g_answerSaves = true;
-    g_saveResult = result;
+    return g_formatSaves;
+}
+const std::vector<int>& EngineCalls::BlanksDefaults() const
+{
+    return g_blanksDefaults;
+}
+std::size_t EngineCalls::Cleanups() const
+{
+    return g_cleanups;
+}
+long EngineCalls::LiveContexts() const
+{
+    return g_contexts;
+}
+
+void AnswerNextFormatSave(int result)
+{
+    g_formatSaveAnswer = result;
+}
+void RefuseNextXPathContext()
+{
+    g_refuseContext = true;
+}
+void AnswerNextXPath(xmlXPathObjectPtr result)
+{
+    g_xpathAnswer = result;
+}
+xmlXPathObjectPtr LastXPath()
+{
+    return g_lastXPath;
+}
+void RefuseNextSibling()
+{
+    g_refuseSibling = true;
 }
 
 xmlDocPtr ParseText(const std::string& xml)

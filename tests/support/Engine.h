@@ -5,6 +5,7 @@
 // notes them and passes them on.
 
 #include <libxml/tree.h>
+#include <libxml/xpath.h>
 
 #include <cstddef>
 #include <string>
@@ -36,7 +37,34 @@ public:
 
     /** Makes xmlSaveFileEnc save nothing and answer with @p result, as long as the object lives. */
     void AnswerSavesWith(int result);
+
+    /** @return the arguments of each call of xmlSaveFormatFileEnc: "path encoding format". */
+    const std::vector<std::string>& FormatSaves() const;
+
+    /** @return the arguments of each call of xmlKeepBlanksDefault. */
+    const std::vector<int>& BlanksDefaults() const;
+
+    /** @return how often xmlCleanupParser was called. */
+    std::size_t Cleanups() const;
+
+    /** @return contexts made by xmlXPathNewContext less those freed. */
+    long LiveContexts() const;
 };
+
+/** Makes the next call of xmlSaveFormatFileEnc do nothing and answer @p result. */
+void AnswerNextFormatSave(int result);
+
+/** Makes the next call of xmlXPathNewContext do nothing and answer null. */
+void RefuseNextXPathContext();
+
+/** Makes the next call of xmlXPathEvalExpression do nothing and answer @p result. */
+void AnswerNextXPath(xmlXPathObjectPtr result);
+
+/** @return what xmlXPathEvalExpression answered last; possibly freed since. */
+xmlXPathObjectPtr LastXPath();
+
+/** Makes the next call of xmlAddSibling do nothing and answer null. */
+void RefuseNextSibling();
 
 /** Parses a document from memory, blanks kept; the caller frees it. */
 xmlDocPtr ParseText(const std::string& xml);

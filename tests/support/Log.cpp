@@ -64,6 +64,17 @@ std::ostream& operator<<(std::ostream& out, const Record& record)
     return out << "\n  " << record.level << ' ' << record.tag << " \"" << record.text << '"';
 }
 
+Records operator+(Records left, const Records& right)
+{
+    left.insert(left.end(), right.begin(), right.end());
+    return left;
+}
+
+Records Traced(const std::string& tag, const Records& inner)
+{
+    return Records({Trace(tag, "+")}) + inner + Records({Trace(tag, "-")});
+}
+
 Records Under(unsigned mask, const Records& all)
 {
     Records kept;

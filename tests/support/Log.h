@@ -52,6 +52,12 @@ inline Record XPath(std::string tag, std::string text)
     return {31, tag, text};
 }
 
+/** @return "+" and "-" of @p tag with the records of what it calls between them. */
+Records Traced(const std::string& tag, const Records& inner = {});
+
+/** @return @p left, then @p right. */
+Records operator+(Records left, const Records& right);
+
 /** The records of @p all that a mask lets through: what an operation must log under that mask. */
 Records Under(unsigned mask, const Records& all);
 
