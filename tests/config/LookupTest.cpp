@@ -623,6 +623,9 @@ TEST_F(LookupTest, WithoutARootElementIsMissing)
                        Error("GetValue", "Root Node ptr is NULL"),
                        Value("GetValue", "Parsed Value :: old"), Trace("GetValue", "-")}),
               log.Take());
+    log.SetMask(kMaskNone);
+    EXPECT_EQ(22, m_reader->GetValue("cfg", value));
+    EXPECT_EQ(Records(), log.Take());
     EXPECT_EQ("old", value);
 }
 
