@@ -7,6 +7,7 @@
 #include "ConfinedEngine.h"
 
 #include "model/MemoryFile.h"
+#include "support/Log.h"
 
 #include <libxml/parser.h>
 
@@ -35,8 +36,24 @@ std::string NameOf(const xmlNode* node)
     return reinterpret_cast<const char*>(node->name);
 }
 
+/**
+ * @return whether the engine loads what it saves for @p document. Older engines do not escape
+ *         markup in the name of a namespace.
+ */
+bool LoadsAgain(xmlDocPtr document)
+{
+    xmlChar* text = nullptr;
+    int size = 0;
+    xmlDocDumpMemoryEnc(document, &text, &size, "UTF-8");
+    const xmlDocPtr again =
+        xmlReadMemory(reinterpret_cast<const char*>(text), size, nullptr, nullptr, 0);
+    xmlFree(text);
+    xmlFreeDoc(again);
+    return again != nullptr;
+}
+
 /** Reads and changes what the document holds by keys that are made of its names. */
-void UseStore(const std::string& path)
+bool UseStore(const std::string& path)
 {
     const std::unique_ptr<CXMLReader> reader(GetCXMLReaderObject(path.c_str()));
     const std::unique_ptr<CXMLWriter> writer(GetCXMLWriterObject(path.c_str()));
@@ -47,7 +64,7 @@ void UseStore(const std::string& path)
         Require(reader->GetValue("a.b", value) == 22, "a lookup without a document succeeded");
         Require(writer->SetValue("a.b", value) == 7, "an update without a document succeeded");
         Require(writer->SaveData() == -2, "nothing was saved, with success");
-        return;
+        return false;
     }
     const xmlNode* const root = xmlDocGetRootElement(document);
     for (const xmlNode* node = root->children; node != nullptr; node = node->next)
@@ -63,9 +80,10 @@ void UseStore(const std::string& path)
     }
     const kxmodel::MemoryFile target("");
     writer->SetPath(target.Path());
-    // An encoding that the engine does not write, UTF-8 aside, there is none.
     Require(writer->SaveData() == 0, "a document that loads was not saved");
-    Require(writer->ParseFile(target.Path()) == 0, "a document that was saved does not load");
+    const bool loadsAgain = LoadsAgain(document);
+    Require(writer->ParseFile(target.Path()) == 0 || !loadsAgain, "it is saved and does not load");
+    return loadsAgain;
 }
 
 /** Visits nodes from @p node on, in document order, as a client would. */
@@ -85,7 +103,7 @@ void Walk(CXmlNode node, std::size_t& visited)
     }
 }
 
-bool UseDocument(const std::string& path)
+bool UseDocument(const std::string& path, bool loadsAgain)
 {
     CXmlParser parser;
     const int status = parser.ParseXml(path);
@@ -96,7 +114,7 @@ bool UseDocument(const std::string& path)
     Require(!parser.FindNode("/", CXmlNode()).IsNull() == (status == 0), "no document to query");
     const kxmodel::MemoryFile target("");
     Require(parser.SaveXml(target.Path()) == (status == 0 ? 0 : 22), "saving went otherwise");
-    Require(status != 0 || parser.ParseXml(target.Path()) == 0, "it is saved and does not load");
+    Require(!loadsAgain || parser.ParseXml(target.Path()) == 0, "it is saved and does not load");
     return status == 0;
 }
 
@@ -116,9 +134,11 @@ extern "C" int LLVMFuzzerInitialize(int*, char***)
 
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
 {
+    const kxtest::LogRecorder log;
     const kxmodel::MemoryFile file(std::string(reinterpret_cast<const char*>(data), size));
     const bool loads = Loads(file.Path());
-    UseStore(file.Path());
-    Require(UseDocument(file.Path()) == loads, "one loader takes what the other refuses");
+    const bool loadsAgain = UseStore(file.Path());
+    Require(UseDocument(file.Path(), loadsAgain) == loads,
+            "one loader takes what the other refuses");
     return 0;
 }
