@@ -26,7 +26,7 @@ check() {
     echo "valgrind: ${1##*/} clean"
 }
 
-for room in config diag dom faults model platform threads; do
+for room in config diag dom faults model platform threads trust; do
     if [ -x $build/tests/$room/${room}_tests ]; then
         KX_EVALUATIONS=4000 check $build/tests/$room/${room}_tests
     fi
