@@ -40,6 +40,9 @@ endfunction()
 # Exports from a shared library what the version script names, and nothing else: hidden visibility alone
 # lets weak instances of standard templates out.
 function(kx_exports target script)
-    target_link_options(${target} PRIVATE LINKER:--version-script=${script} LINKER:--no-undefined)
+    target_link_options(${target} PRIVATE LINKER:--version-script=${script})
+    if(NOT KX_BUILD_FUZZ) # the fuzzer's and Clang's sanitizers' functions come with the program
+        target_link_options(${target} PRIVATE LINKER:--no-undefined)
+    endif()
     set_property(TARGET ${target} APPEND PROPERTY LINK_DEPENDS ${script})
 endfunction()

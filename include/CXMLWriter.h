@@ -128,7 +128,9 @@ public:
      * | empty                  | nothing: a later SetValue() does not reach it         |
      *
      * Control characters other than tab, newline and carriage return save, but do not load again;
-     * newer engines replace them when they save. A value is used up to its first NUL byte.
+     * newer engines replace them when they save. A value is used up to its first NUL byte. If the
+     * engine runs out of memory, an element can be left empty though it counts as updated: the
+     * engine does not tell.
      *
      * @param key    the key path; its first component is the root's name, without a condition.
      * @param value  the new text.

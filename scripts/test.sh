@@ -7,6 +7,7 @@
 #   abi98    everything with the target's kind of standard library (shared strings, a linear list::size)
 #   engine   everything with the newest libxml2 that Debian has as a source package
 #   arm      everything for ARMv7-A, in both calling conventions, under qemu-arm; the library's size
+#   proof    every line and branch of the library covered; Valgrind; threads; a short run of each fuzz target
 #   docs     the reference, built by Doxygen without a warning
 #   host     fast and package; what runs if no stage is named
 #   all      all of them; what CI runs
@@ -60,6 +61,13 @@ stage_arm() {
     scripts/arm_size.sh
 }
 
+stage_proof() {
+    scripts/coverage.sh
+    scripts/valgrind.sh
+    run_preset tsan
+    scripts/fuzz.sh
+}
+
 stage_docs() {
     scripts/reference.sh
 }
@@ -72,6 +80,7 @@ stage_host() {
 stage_all() {
     stage_host
     stage_docs
+    stage_proof
     stage_abi98
     stage_engine
     stage_arm
@@ -80,7 +89,7 @@ stage_all() {
 [ $# -gt 0 ] || set -- host
 for stage in "$@"; do
     declare -F "stage_$stage" >/dev/null ||
-        { echo "$0: no stage \"$stage\"; there are fast, package, abi98, engine, arm, docs, host, all" >&2; exit 2; }
+        { echo "$0: no stage \"$stage\"; there are fast, package, abi98, engine, arm, proof, docs, host, all" >&2; exit 2; }
 done
 for stage in "$@"; do
     "stage_$stage"

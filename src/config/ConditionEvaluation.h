@@ -3,8 +3,6 @@
 
 #include "Condition.h"
 
-#include <limits.h>
-
 namespace kx
 {
 
@@ -23,27 +21,28 @@ inline bool HasValue(xmlNode* element, const xmlChar* name, const TextView& valu
 /** Beyond the length of any sensible attribute name: only longer ones are copied to the heap. */
 const size_t kShortName = 64;
 
-inline bool ShortNameHolds(const Term& term, xmlNode* element)
+/** @return whether @p term holds; @p name is room for its name and a NUL. */
+inline bool NameHolds(const Term& term, xmlNode* element, xmlChar* name)
 {
-    xmlChar name[kShortName];
     memcpy(name, term.name.data, term.name.size);
     name[term.name.size] = 0;
     return HasValue(element, name, term.value);
 }
 
+inline bool ShortNameHolds(const Term& term, xmlNode* element)
+{
+    xmlChar name[kShortName];
+    return NameHolds(term, element, name);
+}
+
 inline bool LongNameHolds(const Term& term, xmlNode* element)
 {
-    if (term.name.size > INT_MAX)
-    {
-        return false;
-    }
-    xmlChar* const name = xmlStrndup(reinterpret_cast<const xmlChar*>(term.name.data),
-                                     static_cast<int>(term.name.size));
+    xmlChar* const name = static_cast<xmlChar*>(xmlMalloc(term.name.size + 1));
     if (name == 0)
     {
         return false;
     }
-    const bool holds = HasValue(element, name, term.value);
+    const bool holds = NameHolds(term, element, name);
     xmlFree(name);
     return holds;
 }
@@ -74,7 +73,8 @@ bool ConditionHolds(const TextView& condition, xmlNode* element)
         const Term term = terms.Next();
         const bool holds = TermHolds(term, element);
         Observer::Tested(term, holds);
-        accepted = joinedByOr ? accepted || holds : accepted && holds;
+        // Whatever a "&" joins a term to has been accepted, or it would have rejected.
+        accepted = joinedByOr ? accepted || holds : holds;
         joinedByOr = term.endsWithOr;
         if (!joinedByOr && !accepted)
         {

@@ -49,10 +49,17 @@ struct TextView
     size_t size;
 };
 
-/** @return whether the engine's zero-terminated @p text consists of exactly the bytes of @p view.
+/**
+ * @return whether the engine's zero-terminated @p text consists of exactly the bytes of @p view.
+ *
+ * A null @p text is no text at all: short of memory the engine makes elements without a name.
  */
 inline bool SameText(const xmlChar* text, const TextView& view)
 {
+    if (text == 0)
+    {
+        return false;
+    }
     for (size_t i = 0; i != view.size; ++i)
     {
         // A NUL in the view is no byte of the text: it must not lead past the terminator.

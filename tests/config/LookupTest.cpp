@@ -820,6 +820,21 @@ TEST_F(LookupTest, NulBytesAreBytesLikeOthersAndMatchNoName)
     EXPECT_EQ(Nothing(7), Ask("\0"s));
 }
 
+TEST_F(LookupTest, ElementWithoutANameIsNeverMeant)
+{
+    // What the engine makes of an element when it runs out of memory while parsing.
+    const xmlNodePtr root = Root();
+    const xmlChar* const names[] = {root->name, root->children->name};
+    root->children->name = nullptr;
+    EXPECT_EQ(Found("10.0.0.2"), Ask("cfg.net.ip"));
+    EXPECT_EQ(Nothing(-2), Ask("cfg..ip"));
+    root->name = nullptr;
+    EXPECT_EQ(Nothing(0), Ask("cfg.name"));
+    EXPECT_EQ(Nothing(0), Ask(".name"));
+    root->children->name = names[1];
+    root->name = names[0];
+}
+
 TEST_F(LookupTest, BytesThatAreNoUtf8MatchNothing)
 {
     for (const char* const key :

@@ -563,6 +563,22 @@ TEST_F(UpdateTest, ValueIsTakenByValue)
 
 // --- Keys of every kind
 
+TEST_F(UpdateTest, ElementWithoutANameIsNeverMeant)
+{
+    // What the engine makes of an element when it runs out of memory while parsing.
+    Load("<cfg><a>1</a><a>2</a></cfg>");
+    const xmlChar* const names[] = {Root()->name, Root()->children->name};
+    Root()->children->name = nullptr;
+    EXPECT_EQ(0, Set("cfg.a", "new"));
+    EXPECT_EQ(-2, Set("cfg..", "newer"));
+    Root()->name = nullptr;
+    EXPECT_EQ(0, Set("cfg.a", "newest"));
+    EXPECT_EQ(0, Set(".a", "newest"));
+    Root()->name = names[0];
+    Root()->children->name = names[1];
+    EXPECT_EQ("<cfg><a>1</a><a>new</a></cfg>", Document());
+}
+
 TEST_F(UpdateTest, StrangeKeysChangeNothing)
 {
     using namespace std::string_literals;

@@ -19,7 +19,6 @@ namespace
 {
 
 std::string g_firstComplaint;
-bool g_complaintIsFatal = false;
 
 #if LIBXML_VERSION >= 21200
 using EngineError = const xmlError*;
@@ -33,14 +32,12 @@ void Ignore(void*, const char*, ...)
 
 void KeepFirstComplaint(void*, EngineError error)
 {
-    // What ends a parse tells more than what went before it, such as a prefix that is not declared.
-    const bool isFatal = error->level == XML_ERR_FATAL;
-    const bool isFirst = g_firstComplaint.empty() || (isFatal && !g_complaintIsFatal);
-    if (!isFirst || error->level < XML_ERR_ERROR || error->message == nullptr)
+    // A prefix that is not declared is complained of, but ends no parse: what does is of interest.
+    if (!g_firstComplaint.empty() || error->level < XML_ERR_ERROR || error->message == nullptr ||
+        error->domain == XML_FROM_NAMESPACE)
     {
         return;
     }
-    g_complaintIsFatal = isFatal;
     g_firstComplaint = error->message;
     g_firstComplaint.erase(
         std::min(g_firstComplaint.find_first_of("\r\n"), g_firstComplaint.size()));
@@ -53,7 +50,6 @@ void KeepFirstComplaint(void*, EngineError error)
 void ForgetComplaints()
 {
     g_firstComplaint.clear();
-    g_complaintIsFatal = false;
 }
 
 /** @return what keeps the file from being read as one, or an empty string. */

@@ -1,0 +1,17 @@
+#ifndef KX_FUZZ_CONFINEDENGINE_H
+#define KX_FUZZ_CONFINEDENGINE_H
+
+// The engine as fuzz targets want it: silent, and confined to the files that they made.
+
+namespace kxfuzz
+{
+
+/**
+ * Called by LLVMFuzzerInitialize(). From then on the engine prints nothing, and the process aborts
+ * if it is about to read anything but a file in memory: no document may make the library do that.
+ */
+void ConfineEngine();
+
+} // namespace kxfuzz
+
+#endif

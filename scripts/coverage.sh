@@ -1,0 +1,36 @@
+#!/usr/bin/env bash
+# Runs the tests with lines and branches of the library counted, writes build/coverage/report/index.html,
+# and fails unless all of them are covered. Clang counts the branches of the source: what the compiler adds
+# for exceptions is none of them.
+set -euo pipefail
+cd "$(dirname "$0")/.."
+. scripts/packages.sh
+
+need "${build_packages[@]}" clang llvm libgtest-dev libgmock-dev fontconfig-config shared-mime-info xkb-data
+
+build=build/coverage
+log=$build/coverage.log
+mkdir -p $build
+{ cmake --preset coverage && cmake --build --preset coverage; } >$log 2>&1 || { tail -n 40 $log >&2; exit 1; }
+
+rm -rf $build/raw
+if ! LLVM_PROFILE_FILE=$PWD/$build/raw/%4m.profraw ctest --preset coverage -E '^portability' >$log 2>&1; then
+    grep -vE ' Passed |^ +Start ' $log >&2
+    exit 1
+fi
+llvm-profdata merge -o $build/all.profdata $build/raw/*.profraw
+
+library=$build/src/libKX_XMLConfigParser.so
+llvm-cov show $library -instr-profile $build/all.profdata -format=html -output-dir=$build/report \
+    -show-branches=count src include
+llvm-cov report $library -instr-profile $build/all.profdata \
+    -show-branch-summary -show-region-summary=0 src include >$build/report.txt
+if ! awk '$1 == "TOTAL" {
+        printf "coverage: %d of %d lines, %d of %d branches\n", $5 - $6, $5, $8 - $9, $8
+        complete = $6 == 0 && $9 == 0
+    }
+    END { exit !complete }' $build/report.txt; then
+    cat $build/report.txt >&2
+    echo "see $build/report/index.html" >&2
+    exit 1
+fi

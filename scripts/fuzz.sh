@@ -1,0 +1,34 @@
+#!/usr/bin/env bash
+# fuzz.sh [TARGET [SECONDS]] — fuzzes a target of fuzz/, or all of them one after the other, and fails if
+# one finds something. Findings go to build/fuzz/findings; each becomes a test before it is mended.
+# A run goes on where the last one ended: what it found worth keeping is in build/fuzz/corpus.
+set -euo pipefail
+cd "$(dirname "$0")/.."
+. scripts/packages.sh
+
+targets=(keypath document loader)
+seconds=${2:-12}
+if [ "${1:-all}" != all ]; then
+    targets=("$1")
+fi
+
+need "${build_packages[@]}" clang libgtest-dev libgmock-dev
+
+build=build/fuzz
+mkdir -p $build/findings
+{ cmake --preset fuzz && cmake --build --preset fuzz; } >$build/build.log 2>&1 || { tail -n 40 $build/build.log >&2; exit 1; }
+
+for target in "${targets[@]}"; do
+    corpus=$build/corpus/$target
+    log=$build/$target.log
+    mkdir -p "$corpus"
+    if ! $build/fuzz/fuzz_"$target" "$corpus" fuzz/corpus/"$target" \
+        -dict=fuzz/xml.dict -max_len=4096 -timeout=10 -rss_limit_mb=1024 -max_total_time="$seconds" \
+        -artifact_prefix=$build/findings/"$target"- -print_final_stats=1 >"$log" 2>&1; then
+        tail -n 60 "$log" >&2
+        exit 1
+    fi
+    echo "fuzz $target: $(awk '/number_of_executed_units/ { runs = $2 }
+        / cov: / { for (i = 1; i < NF; ++i) if ($i == "cov:") edges = $(i + 1) }
+        END { print runs " runs, " edges " edges of library and target covered" }' "$log")"
+done

@@ -1,0 +1,36 @@
+#!/usr/bin/env bash
+# Runs the suites and the fuzz corpora under Valgrind. Any error fails, and any leak that is not in
+# tests/valgrind.supp.
+set -euo pipefail
+cd "$(dirname "$0")/.."
+. scripts/packages.sh
+
+need "${build_packages[@]}" valgrind clang libgtest-dev libgmock-dev libc6-dbg \
+    fontconfig-config shared-mime-info xkb-data
+
+build=build/dev
+log=build/valgrind.log
+mkdir -p build
+{ cmake --preset dev && cmake --build --preset dev; } >$log 2>&1 || { tail -n 40 $log >&2; exit 1; }
+
+# check COMMAND... — under Valgrind. The tests count what passes through their own operator new:
+# Valgrind must not put its own in its place.
+check() {
+    if ! valgrind --quiet --error-exitcode=99 --leak-check=full \
+        --errors-for-leak-kinds=definite,indirect,possible --show-leak-kinds=definite,indirect,possible \
+        --soname-synonyms=somalloc=nouserintercepts --suppressions=tests/valgrind.supp \
+        "$@" >$log 2>&1; then
+        tail -n 60 $log >&2
+        exit 1
+    fi
+    echo "valgrind: ${1##*/} clean"
+}
+
+for room in config diag dom faults model platform threads trust; do
+    if [ -x $build/tests/$room/${room}_tests ]; then
+        KX_EVALUATIONS=4000 check $build/tests/$room/${room}_tests
+    fi
+done
+for target in keypath document loader; do
+    check $build/fuzz/replay_$target fuzz/corpus/$target
+done
