@@ -222,8 +222,9 @@ int CXmlNode::RemoveChildNode(std::string name)
     KX_TRACE("+");
     int status = StatusMissing;
     CXmlNode child = FindChildNode(name);
-    if (child.m_pXmlNode != 0 && RemoveFromTree(child.m_pXmlNode))
+    if (child.m_pXmlNode != 0)
     {
+        FreeFromTree(child.m_pXmlNode);
         status = StatusOk;
     }
     KX_TRACE("-");

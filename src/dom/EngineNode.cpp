@@ -122,7 +122,7 @@ bool OwnsItsContent(const xmlNode* node)
 bool CanBeRemoved(const xmlNode* node)
 {
     // A reference shares its child with the entity's declaration, but nothing points to it.
-    return OwnsItsContent(node) || (node != 0 && node->type == XML_ENTITY_REF_NODE);
+    return OwnsItsContent(node) || node->type == XML_ENTITY_REF_NODE;
 }
 
 xmlNode* WholeElement(xmlNode* element)
@@ -164,7 +164,7 @@ bool RemoveChildren(xmlNode* node)
     }
     while (node->children != 0)
     {
-        RemoveFromTree(node->children);
+        FreeFromTree(node->children);
     }
     return true;
 }
@@ -186,9 +186,14 @@ bool RemoveFromTree(xmlNode* node)
     {
         return false;
     }
+    FreeFromTree(node);
+    return true;
+}
+
+void FreeFromTree(xmlNode* node)
+{
     xmlUnlinkNode(node);
     xmlFreeNode(node);
-    return true;
 }
 
 } // namespace kx

@@ -65,7 +65,7 @@ bool CanHaveSiblings(const xmlNode* node);
  */
 bool OwnsItsContent(const xmlNode* node);
 
-/** @return whether @p node, which may be null, can be freed without others pointing to it. */
+/** @return whether @p node can be freed without others pointing to it. */
 bool CanBeRemoved(const xmlNode* node);
 
 /**
@@ -91,6 +91,9 @@ void RemoveAttributes(xmlNode* node);
  * short: then it stays.
  */
 bool RemoveFromTree(xmlNode* node);
+
+/** The same of a node that is no piece of an attribute's value: that cannot fail. */
+void FreeFromTree(xmlNode* node);
 
 } // namespace kx
 

@@ -559,6 +559,16 @@ TEST_F(NodeTest, EntityWhoseContentLiesInTheDocumentIsNotCleared)
     entity->children = entity->last = own;
 }
 
+TEST_F(NodeTest, AttributeThatTheEngineDoesNotRemoveEndsTheClearing)
+{
+    const xmlDocPtr document = Parse("<a x='1' y='2'/>");
+    const xmlAttrPtr attribute = document->children->properties;
+    attribute->parent = nullptr; // as no sound tree has it
+    EXPECT_EQ(0, CXmlNode(document->children).ClearNode());
+    EXPECT_EQ(attribute, document->children->properties);
+    attribute->parent = document->children;
+}
+
 TEST_F(NodeTest, ChildUnderTheDocumentIsSavedWithoutANamespace)
 {
     const xmlDocPtr document = xmlNewDoc(nullptr);
