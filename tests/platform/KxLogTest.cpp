@@ -94,6 +94,10 @@ TEST(KxLog, WritesOnAfterPartialAndInterruptedWrites)
 
 TEST(LogMaskOfTheEnvironment, BadValueNeverFailsTheProcess)
 {
+    if (InShell(kProbe) != "'" + std::string(kProbe) + "'")
+    {
+        GTEST_SKIP() << "an emulator does not survive the pipe that is broken before it starts";
+    }
     const std::string command = std::string(kProbe) + " mask 2>&1 1>&3 3>&- | true";
     const Outcome outcome = RunProgram(
         {"/bin/bash", "-c", "set -o pipefail; exec 3>&1; " + command}, {"KX_LOG_MASK=a\nb"});
