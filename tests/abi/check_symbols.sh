@@ -11,7 +11,7 @@ exported() {
     "${NM:-nm}" -D --defined-only --demangle "$library" |
         sed -E -e 's/^[0-9a-f]+ . //' \
             -e 's/std::(__cxx11::)?basic_string<char, std::char_traits<char>, std::allocator<char> ?>/std::string/g' \
-            -e 's/std::__cxx11::list</std::list</g' |
+            -e 's/std::__cxx11::list</std::list</g' -e 's/\[abi:cxx11\]//g' |
         sort -u
 }
 

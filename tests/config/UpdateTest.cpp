@@ -601,8 +601,9 @@ TEST_F(UpdateTest, NothingIsAllocatedButWhatTheEngineAllocates)
     CXMLWriter writer;
     writer.SetDataPtr(m_document);
     const std::string key = "cfg.p@n=1.v";
+    const std::string value = "x"; // held in the string itself, or shared by its copies
     const NewCounter heap;
-    const int status = writer.SetValue(key, "x"); // held in the string itself
+    const int status = writer.SetValue(key, value);
     EXPECT_EQ(0u, heap.Requests());
     EXPECT_EQ(0, status);
     writer.SetDataPtr(nullptr);
