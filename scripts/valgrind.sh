@@ -14,9 +14,9 @@ mkdir -p build
 { cmake --preset dev && cmake --build --preset dev; } >$log 2>&1 || { tail -n 40 $log >&2; exit 1; }
 
 # check COMMAND... — under Valgrind. The tests count what passes through their own operator new:
-# Valgrind must not put its own in its place.
+# Valgrind must not put its own in its place. A program that hangs fails; the slowest takes about a minute.
 check() {
-    if ! valgrind --quiet --error-exitcode=99 --leak-check=full \
+    if ! timeout 900 valgrind --quiet --error-exitcode=99 --leak-check=full \
         --errors-for-leak-kinds=definite,indirect,possible --show-leak-kinds=definite,indirect,possible \
         --soname-synonyms=somalloc=nouserintercepts --suppressions=tests/valgrind.supp \
         "$@" >$log 2>&1; then
