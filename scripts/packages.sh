@@ -40,3 +40,8 @@ build_packages=(g++ cmake ninja-build libxml2-dev libcli11-dev nlohmann-json3-de
 # For the tests of any build; the last line: packages whose files the tests read.
 test_packages=(clang python3 libgtest-dev libgmock-dev pkg-config groff-base bsdutils
     fontconfig-config shared-mime-info xkb-data)
+
+# For the benchmarks: what measures, what the library is compared with, what draws the plots.
+bench_packages=(libbenchmark-dev valgrind python3-matplotlib pkg-config
+    libpoco-dev libboost-dev libpugixml-dev libtinyxml2-dev libxml++2.6-dev
+    fontconfig-config shared-mime-info xkb-data)

@@ -1,0 +1,43 @@
+#!/usr/bin/env bash
+# Measures this library side by side with what one would pick instead, and writes docs/performance.md from the
+# results. Takes about twenty minutes; a quiet machine makes for quiet figures.
+set -euo pipefail
+cd "$(dirname "$0")/.."
+. scripts/packages.sh
+
+need "${build_packages[@]}" "${bench_packages[@]}"
+
+results=build/bench/results
+programs=build/bench/bench
+mkdir -p $results
+{ cmake --preset bench && cmake --build --preset bench; } >build/bench.log 2>&1 || { cat build/bench.log >&2; exit 1; }
+
+echo "== allocations"
+$programs/kx_bench_allocations >$results/allocations.json
+
+# Where code and documents happen to lie in memory makes more of a difference than one would like, and lasts as
+# long as the process: each workload has processes of its own, in several rounds, the median of which counts.
+mapfile -t workloads < <($programs/kx_bench --benchmark_list_tests | sed 's,/[^/]*$,,' | awk '!seen[$0]++')
+rm -f $results/time-*.json
+for round in 1 2 3 4 5; do
+    echo "== time, round $round of 5"
+    for i in "${!workloads[@]}"; do
+        $programs/kx_bench --benchmark_filter="^$(sed 's/[(|)]/\\&/g' <<<"${workloads[i]}")/" \
+            --benchmark_repetitions=3 --benchmark_min_time=0.05 --benchmark_enable_random_interleaving=true \
+            --benchmark_out="$(printf '%s/time-%d-%03d.json' $results $round "$i")" --benchmark_out_format=json \
+            >$results/time.txt 2>&1 || { cat $results/time.txt >&2; exit 1; }
+    done
+done
+
+echo "== instructions"
+scripts/count_instructions.sh $programs/kx_bench_instructions >$results/instructions.txt
+
+echo "== the price of the log gates"
+mapfile -t names < <(cut -f2 $results/instructions.txt | grep '/this library' | grep -vE '^load|0000/')
+for gates in kept gone; do
+    LD_LIBRARY_PATH=$programs/gates/$gates scripts/count_instructions.sh $programs/kx_bench_guard "${names[@]}" \
+        >$results/gates_$gates.txt
+done
+
+scripts/performance_report.py $results docs
+echo "docs/performance.md is written"
