@@ -18,7 +18,7 @@ bool IsRootOf(const xmlNode* root, const KeySplit& key)
     return key.hasRest && SameText(root->name, key.first);
 }
 
-int FindValues(xmlDoc* document, const std::string& key, std::string& value)
+int FindValues(xmlDoc* document, TextView key, std::string& value)
 {
     const xmlNode* const root = xmlDocGetRootElement(document);
     if (root == 0)
@@ -26,7 +26,7 @@ int FindValues(xmlDoc* document, const std::string& key, std::string& value)
         KX_ERROR_AS("GetValue", "Root Node ptr is NULL");
         return StatusMissing;
     }
-    const KeySplit split((TextView(key)));
+    const KeySplit split(key);
     if (!split.hasRest)
     {
         return StatusBadArgument;
@@ -103,19 +103,29 @@ std::string CXMLReader::GetValue(const std::string& key)
 
 int CXMLReader::GetValue(const std::string& key, std::string& value)
 {
-    KX_TRACE("+");
+    if (&key == &value)
+    {
+        // The lookup works on the key's own bytes, which must not be those that it appends to.
+        return CXMLReader::GetValue(std::string(key), value);
+    }
     if (m_pXmlDoc == 0 || key.empty())
     {
+        KX_TRACE("+");
         KX_ERROR("Document structure pointer m_pXmlDoc is NULL");
         KX_TRACE("-");
         return StatusMissing;
     }
-    KX_VALUE_OF("Key is %s", key.c_str());
-    // The lookup works on the key's own bytes, which must not be those that it appends to.
-    const int status = &key == &value ? FindValues(m_pXmlDoc, std::string(key), value)
-                                      : FindValues(m_pXmlDoc, key, value);
-    KX_VALUE_OF("Parsed Value :: %s", value.c_str());
-    KX_TRACE("-");
+    KX_LOG_EITHER(LogLevelTrace, LogLevelValue)
+    {
+        KX_TRACE("+");
+        KX_VALUE_OF("Key is %s", key.c_str());
+    }
+    const int status = FindValues(m_pXmlDoc, TextView(key), value);
+    KX_LOG_EITHER(LogLevelValue, LogLevelTrace)
+    {
+        KX_VALUE_OF("Parsed Value :: %s", value.c_str());
+        KX_TRACE("-");
+    }
     return status;
 }
 

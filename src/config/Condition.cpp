@@ -6,6 +6,17 @@
 namespace kx
 {
 
+namespace
+{
+
+/** An attribute name that is empty or holds a NUL names no attribute. */
+bool NamesAnAttribute(TextView name)
+{
+    return !name.IsEmpty() && name.Find('\0') == name.size;
+}
+
+} // namespace
+
 Term TermCursor::Next()
 {
     const size_t separator = FindSeparator();
@@ -39,6 +50,42 @@ size_t TermCursor::FindSeparator()
     return m_remaining.Find('&');
 }
 
-template bool ConditionHolds<Silent>(const TextView& condition, xmlNode* element);
+TermTest::TermTest(const Term& term) : m_value(term.value)
+{
+    m_shortName[0] = 0;
+    if (!NamesAnAttribute(term.name))
+    {
+        return;
+    }
+    if (term.name.size < kShortName)
+    {
+        memcpy(m_shortName, term.name.data, term.name.size);
+        m_shortName[term.name.size] = 0;
+    }
+    else
+    {
+        m_longName = term.name;
+    }
+}
+
+bool TermTest::LongNameHolds(xmlNode* element) const
+{
+    if (m_longName.IsEmpty())
+    {
+        return false;
+    }
+    xmlChar* const name = static_cast<xmlChar*>(xmlMalloc(m_longName.size + 1));
+    if (name == 0)
+    {
+        return false;
+    }
+    memcpy(name, m_longName.data, m_longName.size);
+    name[m_longName.size] = 0;
+    const bool holds = HasValue(element, name);
+    xmlFree(name);
+    return holds;
+}
+
+template bool Condition::OthersHold<Silent>(xmlNode* element, bool accepted) const;
 
 } // namespace kx

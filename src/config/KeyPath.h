@@ -41,8 +41,8 @@ struct TextView
     /** @return what stands after @p position; empty if the view ends there or before. */
     TextView After(size_t position) const
     {
-        return position < size ? TextView(data + position + 1, size - position - 1)
-                               : TextView(data + size, 0);
+        const size_t begin = position + (position < size);
+        return TextView(data + begin, size - begin);
     }
 
     const char* data;
@@ -54,32 +54,30 @@ struct TextView
  *
  * A null @p text is no text at all: short of memory the engine makes elements without a name.
  */
-inline bool SameText(const xmlChar* text, const TextView& view)
+inline bool SameText(const xmlChar* text, TextView view)
 {
     if (text == 0)
     {
         return false;
     }
-    for (size_t i = 0; i != view.size; ++i)
+    const xmlChar* const bytes = reinterpret_cast<const xmlChar*>(view.data);
+    size_t same = 0;
+    // A NUL in the view is no byte of the text: it must not lead past the terminator.
+    while (same != view.size && text[same] == bytes[same] && text[same] != 0)
     {
-        // A NUL in the view is no byte of the text: it must not lead past the terminator.
-        if (text[i] != static_cast<xmlChar>(view.data[i]) || text[i] == 0)
-        {
-            return false;
-        }
+        ++same;
     }
-    return text[view.size] == 0;
+    return same == view.size && text[same] == 0;
 }
 
 /** A key split at its first "." into this level's segment and the key of the levels below. */
 struct KeySplit
 {
-    explicit KeySplit(const TextView& key)
+    explicit KeySplit(TextView key)
+        : first(key.Before(key.Find('.'))),
+          rest(key.After(first.size)),
+          hasRest(first.size != key.size)
     {
-        const size_t dot = key.Find('.');
-        hasRest = dot != key.size;
-        first = key.Before(dot);
-        rest = key.After(dot);
     }
 
     TextView first;
@@ -92,11 +90,14 @@ struct Segment
 {
     Segment() {}
 
-    explicit Segment(const TextView& text)
+    explicit Segment(TextView text)
+        : name(text.Before(text.Find('@'))), condition(text.After(name.size))
     {
-        const size_t at = text.Find('@');
-        name = text.Before(at);
-        condition = text.After(at);
+    }
+
+    Segment(TextView elementName, TextView itsCondition)
+        : name(elementName), condition(itsCondition)
+    {
     }
 
     /** @return whether @p element bears the segment's name. */

@@ -56,7 +56,7 @@ private:
 
 } // namespace
 
-void CollectValues(const xmlNode* node, const TextView& key, std::string& result)
+void CollectValues(const xmlNode* node, TextView key, std::string& result)
 {
     if (node == 0 || key.IsEmpty())
     {
@@ -67,7 +67,7 @@ void CollectValues(const xmlNode* node, const TextView& key, std::string& result
     ScanSiblings<Silent>(node, Segment(split.first), collector);
 }
 
-template int AppendValues<Silent>(const xmlNode* node, const TextView& key, std::string& value,
+template int AppendValues<Silent>(const xmlNode* node, TextView key, std::string& value,
                                   unsigned int& found);
 
 } // namespace kx

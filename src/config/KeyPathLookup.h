@@ -15,7 +15,7 @@ namespace kx
  *
  * A null node or an empty key adds nothing. Logs nothing.
  */
-void CollectValues(const xmlNode* node, const TextView& key, std::string& result);
+void CollectValues(const xmlNode* node, TextView key, std::string& result);
 
 /**
  * Appends to @p value what lies below @p node under @p key, each value preceded by "\n" unless the
@@ -25,10 +25,9 @@ void CollectValues(const xmlNode* node, const TextView& key, std::string& result
  * LookupWalk.h defines it; the library has it for the observer Silent.
  */
 template <class Observer>
-int AppendValues(const xmlNode* node, const TextView& key, std::string& value, unsigned int& found);
+int AppendValues(const xmlNode* node, TextView key, std::string& value, unsigned int& found);
 
-inline int AppendValues(const xmlNode* node, const TextView& key, std::string& value,
-                        unsigned int& found)
+inline int AppendValues(const xmlNode* node, TextView key, std::string& value, unsigned int& found)
 {
     return AppendValues<Silent>(node, key, value, found);
 }

@@ -5,7 +5,7 @@
 namespace kx
 {
 
-template int UpdateValues<Silent>(xmlNode* top, const TextView& key, const char* value,
+template int UpdateValues<Silent>(xmlNode* top, TextView key, const char* value,
                                   unsigned int& updated);
 
 } // namespace kx

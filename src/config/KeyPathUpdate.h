@@ -16,9 +16,9 @@ namespace kx
  * @return the status of the last descent.
  */
 template <class Observer>
-int UpdateValues(xmlNode* top, const TextView& key, const char* value, unsigned int& updated);
+int UpdateValues(xmlNode* top, TextView key, const char* value, unsigned int& updated);
 
-inline int UpdateValues(xmlNode* top, const TextView& key, const char* value, unsigned int& updated)
+inline int UpdateValues(xmlNode* top, TextView key, const char* value, unsigned int& updated)
 {
     return UpdateValues<Silent>(top, key, value, updated);
 }

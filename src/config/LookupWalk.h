@@ -62,17 +62,21 @@ private:
 };
 
 template <class Observer>
-int AppendValues(const xmlNode* node, const TextView& key, std::string& value, unsigned int& found)
+int AppendValues(const xmlNode* node, TextView key, std::string& value, unsigned int& found)
 {
     const char* const tag = "XMLGetValue";
-    KX_TRACE_AS(tag, "+");
     if (node == 0 || key.IsEmpty())
     {
+        KX_TRACE_AS(tag, "+");
         Observer::EmptyKey(node);
         KX_TRACE_AS(tag, "-");
         return StatusMissing;
     }
-    KX_VALUE_AS(tag, "Key :: %s", key.data);
+    KX_LOG_EITHER(LogLevelTrace, LogLevelValue)
+    {
+        KX_TRACE_AS(tag, "+");
+        KX_VALUE_AS(tag, "Key :: %s", key.data);
+    }
     const KeySplit split(key);
     Appender<Observer> appender(split, value, found);
     Observer::EnterLevel(node);

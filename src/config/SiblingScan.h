@@ -8,19 +8,24 @@
 namespace kx
 {
 
-/**
- * Visits the element children of @p node that @p segment selects, in document order.
- *
- * This is one level of every lookup; what becomes of an element that was selected is the visitor's
- * affair: it is called as visitor.Accept(child).
- *
- * An element of another name suspends the condition: the next element that matches by name is
- * taken as it is, and only then is the condition in force again. Clients rely on it.
- */
-template <class Observer, class Visitor>
-void ScanSiblings(const xmlNode* node, const Segment& segment, Visitor& visitor)
+/** Stands in for the condition of a segment that has none. */
+struct NoCondition
 {
-    bool suspended = segment.condition.IsEmpty();
+    static bool IsEmpty() { return true; }
+
+    template <class Observer>
+    static bool Holds(xmlNode*)
+    {
+        return true;
+    }
+};
+
+/** The scan of ScanSiblings(), with the segment's condition made ready as @p condition. */
+template <class Observer, class ConditionTest, class Visitor>
+inline void ScanSiblings(const xmlNode* node, const Segment& segment,
+                         const ConditionTest& condition, Visitor& visitor)
+{
+    bool suspended = condition.IsEmpty();
     for (xmlNode* child = node->children; child != 0; child = child->next)
     {
         if (child->type != XML_ELEMENT_NODE)
@@ -34,7 +39,7 @@ void ScanSiblings(const xmlNode* node, const Segment& segment, Visitor& visitor)
             suspended = true;
             continue;
         }
-        if (suspended || ConditionHolds<Observer>(segment.condition, child))
+        if (suspended || condition.template Holds<Observer>(child))
         {
             Observer::Selected(suspended);
             visitor.Accept(child);
@@ -43,7 +48,37 @@ void ScanSiblings(const xmlNode* node, const Segment& segment, Visitor& visitor)
         {
             Observer::Rejected();
         }
-        suspended = segment.condition.IsEmpty();
+        suspended = condition.IsEmpty();
+    }
+}
+
+/** Out of line, as its callers call themselves: only levels with a condition pay for its stack. */
+template <class Observer, class Visitor>
+__attribute__((noinline)) void ScanWithCondition(const xmlNode* node, TextView name,
+                                                 TextView condition, Visitor& visitor)
+{
+    ScanSiblings<Observer>(node, Segment(name, condition), Condition(condition), visitor);
+}
+
+/**
+ * Visits the element children of @p node that @p segment selects, in document order.
+ *
+ * This is one level of every lookup; what becomes of an element that was selected is the visitor's
+ * affair: it is called as visitor.Accept(child).
+ *
+ * An element of another name suspends the condition: the next element that matches by name is
+ * taken as it is, and only then is the condition in force again. Clients rely on it.
+ */
+template <class Observer, class Visitor>
+inline void ScanSiblings(const xmlNode* node, const Segment& segment, Visitor& visitor)
+{
+    if (segment.condition.IsEmpty())
+    {
+        ScanSiblings<Observer>(node, segment, NoCondition(), visitor);
+    }
+    else
+    {
+        ScanWithCondition<Observer>(node, segment.name, segment.condition, visitor);
     }
 }
 

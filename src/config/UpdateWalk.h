@@ -14,7 +14,7 @@ struct UpdateLevel
 {
     UpdateLevel() : key(), first(key), later(key), rest(key), isLast(true) {}
 
-    explicit UpdateLevel(const TextView& whole) : key(whole), first(key), later(key), rest(key)
+    explicit UpdateLevel(TextView whole) : key(whole), first(key), later(key), rest(key)
     {
         const KeySplit split(whole);
         isLast = !split.hasRest;
@@ -42,7 +42,7 @@ struct UpdateLevel
 class LevelCursor
 {
 public:
-    explicit LevelCursor(const TextView& key)
+    explicit LevelCursor(TextView key)
         : m_start(key.data), m_end(key.data + key.size), m_repeats(0), m_current(0)
     {
         m_levels[0] = UpdateLevel(key);
@@ -119,7 +119,7 @@ template <class Observer>
 class UpdateWalk
 {
 public:
-    UpdateWalk(const TextView& key, const char* value, unsigned int& updated)
+    UpdateWalk(TextView key, const char* value, unsigned int& updated)
         : m_cursor(key), m_sought(0), m_parent(0), m_depth(0), m_value(value), m_updated(updated)
     {
     }
@@ -195,7 +195,7 @@ private:
             return true;
         }
         if (!m_sought->condition.IsEmpty() &&
-            !ConditionHolds<Observer>(m_sought->condition, &element))
+            !Condition(m_sought->condition).Holds<Observer>(&element))
         {
             Observer::Rejected();
             return false;
@@ -232,7 +232,7 @@ private:
 };
 
 template <class Observer>
-int UpdateValues(xmlNode* top, const TextView& key, const char* value, unsigned int& updated)
+int UpdateValues(xmlNode* top, TextView key, const char* value, unsigned int& updated)
 {
     if (top == 0 || key.IsEmpty())
     {

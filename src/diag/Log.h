@@ -53,6 +53,12 @@ inline bool LogEnabled(LogLevel level)
     return __builtin_expect((LogMask() & (1u << level)) != 0, false);
 }
 
+/** @return whether records of either level are wanted; a single test, as that of one level. */
+inline bool LogEnabled(LogLevel one, LogLevel other)
+{
+    return __builtin_expect((LogMask() & ((1u << one) | (1u << other))) != 0, false);
+}
+
 } // namespace kx
 
 #define KX_LOG_RECORD(level, tag, text)                                                            \
@@ -72,6 +78,9 @@ inline bool LogEnabled(LogLevel level)
             KxLog(__LINE__, level, tag, format, argument);                                         \
         }                                                                                          \
     } while (false)
+
+/** Stands before a block of gates of two levels: with both bits clear they cost one test in all. */
+#define KX_LOG_EITHER(one, other) if (kx::LogEnabled(one, other))
 
 #define KX_TRACE(text) KX_LOG_RECORD(kx::LogLevelTrace, __FUNCTION__, text)
 #define KX_TRACE_AS(tag, text) KX_LOG_RECORD(kx::LogLevelTrace, tag, text)

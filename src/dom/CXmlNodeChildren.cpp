@@ -20,21 +20,18 @@ bool HasOnlyText(const xmlNode* node)
 }
 
 /**
- * Whether @p child, met under @p node, bears @p name.
+ * @return the first of @p child and the children after it under @p node that bears @p name.
  *
  * It is the node that must be an element, not the child: clients find text and comments under the
  * engine's names for them, and nothing under a document.
  */
-bool IsNamed(const xmlNode* node, const xmlNode* child, const std::string& name)
-{
-    const xmlChar* const stored = NameOf(child);
-    return IsElement(node) && stored != 0 && name == FromEngine(stored);
-}
-
-/** @return the first of @p child and the children after it under @p node that bears @p name. */
 xmlNode* NamedFrom(const xmlNode* node, xmlNode* child, const std::string& name)
 {
-    while (child != 0 && !IsNamed(node, child, name))
+    if (!IsElement(node))
+    {
+        return 0;
+    }
+    while (child != 0 && !SameText(NameOf(child), name))
     {
         child = child->next;
     }

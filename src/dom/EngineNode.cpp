@@ -69,25 +69,6 @@ bool IsWhole(const xmlAttr* attribute, const std::string& value)
 
 } // namespace
 
-xmlNode* LinkOf(const xmlNode* node, NodeLink link)
-{
-    return node != 0 && node->type != XML_NAMESPACE_DECL ? node->*link : 0;
-}
-
-xmlNode* ElementFrom(xmlNode* node, NodeLink link)
-{
-    while (node != 0 && node->type != XML_ELEMENT_NODE)
-    {
-        node = node->*link;
-    }
-    return node;
-}
-
-const xmlChar* NameOf(const xmlNode* node)
-{
-    return node != 0 && node->type != XML_NAMESPACE_DECL ? node->name : 0;
-}
-
 xmlNs* NamespaceOf(xmlNode* node)
 {
     if (IsAttribute(node))

@@ -13,6 +13,8 @@
 
 #include <libxml/tree.h>
 
+#include <string.h>
+
 #include <string>
 
 namespace kx
@@ -29,6 +31,18 @@ inline const char* FromEngine(const xmlChar* text)
     return text != 0 ? reinterpret_cast<const char*>(text) : "";
 }
 
+/**
+ * @return whether the engine's @p text consists of exactly the bytes of @p name; not if it is null.
+ */
+inline bool SameText(const xmlChar* text, const std::string& name)
+{
+    const char* const bytes = FromEngine(text);
+    const char* const wanted = name.c_str();
+    // Most names differ at once. A NUL among the wanted bytes ends strcmp, but not the name.
+    return text != 0 && bytes[0] == wanted[0] && strcmp(bytes, wanted) == 0 &&
+           strlen(bytes) == name.size();
+}
+
 /** One of a node's links: &xmlNode::next and its like. */
 typedef xmlNode* xmlNode::*NodeLink;
 
@@ -39,13 +53,26 @@ inline bool IsElement(const xmlNode* node)
 
 /** @return what @p node, which may be null, is linked to by @p link; null if it has no such link.
  */
-xmlNode* LinkOf(const xmlNode* node, NodeLink link);
+inline xmlNode* LinkOf(const xmlNode* node, NodeLink link)
+{
+    return node != 0 && node->type != XML_NAMESPACE_DECL ? node->*link : 0;
+}
 
 /** @return the first of @p node and those that follow it by @p link that is an element, or null. */
-xmlNode* ElementFrom(xmlNode* node, NodeLink link);
+inline xmlNode* ElementFrom(xmlNode* node, NodeLink link)
+{
+    while (node != 0 && node->type != XML_ELEMENT_NODE)
+    {
+        node = node->*link;
+    }
+    return node;
+}
 
 /** @return the stored name of @p node, which may be null; null if it has none. */
-const xmlChar* NameOf(const xmlNode* node);
+inline const xmlChar* NameOf(const xmlNode* node)
+{
+    return node != 0 && node->type != XML_NAMESPACE_DECL ? node->name : 0;
+}
 
 /** @return the namespace of @p node; null if it has none or is of a kind that cannot have one. */
 xmlNs* NamespaceOf(xmlNode* node);

@@ -80,6 +80,26 @@ TEST(Gate, EvaluatesNoArgumentWhenTheBitIsClear)
     EXPECT_EQ(1, evaluations);
 }
 
+TEST(Gate, OfTwoLevelsIsPassedIfEitherBitIsSet)
+{
+    LogRecorder log(kMaskNone);
+    for (const unsigned mask : {kMaskTrace, kMaskValue, kMaskTrace | kMaskValue, ~0u})
+    {
+        LogRecorder::SetMask(mask);
+        bool passed = false;
+        KX_LOG_EITHER(kx::LogLevelTrace, kx::LogLevelValue)
+        {
+            passed = true;
+        }
+        EXPECT_TRUE(passed) << mask;
+    }
+    LogRecorder::SetMask(~(kMaskTrace | kMaskValue));
+    KX_LOG_EITHER(kx::LogLevelTrace, kx::LogLevelValue)
+    {
+        ADD_FAILURE() << "both bits are clear";
+    }
+}
+
 TEST(Gate, ReadsTheMaskAnewEachTime)
 {
     LogRecorder log(kMaskNone);

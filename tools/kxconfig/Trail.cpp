@@ -172,6 +172,6 @@ Trail RecordUpdate(xmlDoc* document, const std::string& key, const char* value)
 
 bool Fulfils(const xmlNode* element, std::string_view condition)
 {
-    return kx::ConditionHolds<kx::Silent>(kx::TextView(condition.data(), condition.size()),
-                                          const_cast<xmlNode*>(element));
+    return kx::Condition(kx::TextView(condition.data(), condition.size()))
+        .Holds<kx::Silent>(const_cast<xmlNode*>(element));
 }

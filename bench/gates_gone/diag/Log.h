@@ -26,4 +26,7 @@
         }                                                                                          \
     } while (false)
 
+#undef KX_LOG_EITHER
+#define KX_LOG_EITHER(one, other) if (false)
+
 #endif
