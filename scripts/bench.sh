@@ -32,11 +32,11 @@ done
 echo "== instructions"
 scripts/count_instructions.sh $programs/kx_bench_instructions >$results/instructions.txt
 
-echo "== the price of the log gates"
+echo "== what log gates and the walks' observer cost"
 mapfile -t names < <(cut -f2 $results/instructions.txt | grep '/this library' | grep -vE '^load|0000/')
-for gates in kept gone; do
-    LD_LIBRARY_PATH=$programs/gates/$gates scripts/count_instructions.sh $programs/kx_bench_guard "${names[@]}" \
-        >$results/gates_$gates.txt
+for variant in as_it_is no_gates no_watch; do
+    LD_LIBRARY_PATH=$programs/variants/$variant scripts/count_instructions.sh $programs/kx_bench_guard "${names[@]}" \
+        >$results/$variant.txt
 done
 
 scripts/performance_report.py $results docs

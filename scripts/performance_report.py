@@ -55,8 +55,8 @@ class Results:
         self.times = {name: statistics.median(round[name] for round in self.rounds) for name in self.rounds[0]}
         self.allocations = json.loads((folder / "allocations.json").read_text())
         self.instructions = counts(folder / "instructions.txt")
-        self.gates = counts(folder / "gates_kept.txt")
-        self.without_gates = counts(folder / "gates_gone.txt")
+        self.as_it_is = counts(folder / "as_it_is.txt")
+        self.without = {variant: counts(folder / f"{variant}.txt") for variant in ("no_gates", "no_watch")}
 
     def workloads(self):
         return list(dict.fromkeys(split(name)[0] for name in self.times))
@@ -316,19 +316,24 @@ def parsing_text(results):
             f"{', '.join(sentences)}.\n\n")
 
 
-def gate_rows(results):
-    for name, gated in results.gates.items():
-        bare = results.without_gates[name]
+def price(results, variant, name):
+    """What an operation pays for what the variant leaves out, in percent of its instructions there."""
+    return (results.as_it_is[name] / results.without[variant][name] - 1) * 100
+
+
+def price_rows(results):
+    for name, whole in results.as_it_is.items():
         workload, implementation = split(name)
         if not re.search(r"(\D|\b(1|2|4|6|10|1000|250))$", workload):
             continue
         label = escape(workload) + (", value returned" if implementation == RETURNING else "")
-        yield [label, f"{gated:,}", f"{bare:,}", f"{(gated / bare - 1) * 100:.1f} %"]
+        yield [label, f"{whole:,}"] + [
+            cell for variant, bare in results.without.items()
+            for cell in (f"{bare[name]:,}", f"{price(results, variant, name):.1f} %")]
 
 
-def lookup_gate_price(results):
-    return max((gated / results.without_gates[name] - 1) * 100
-               for name, gated in results.gates.items() if name.startswith("look up"))
+def dearest_lookup(results, variant):
+    return max(price(results, variant, name) for name in results.as_it_is if name.startswith("look up"))
 
 
 def versions(results):
@@ -391,17 +396,19 @@ walk as well.
 
 ![Growth](performance/growth.svg)
 
-## The price of the log gates
+## The price of log gates and of the observer
 
-Instructions of an operation with the log mask at zero, against a build in which every gate is compiled out. \
-The dearest lookup pays {gate_price:.1f} %.
+Instructions of an operation with the log mask at zero, against a build in which every gate is compiled out, and \
+against one in which the walks do not call the observer that `kxconfig explain` watches them by. The dearest lookup \
+pays {gate_price:.1f} % for the gates and {watch_price:.1f} % for the observer, whose calls vanish when compiled; less \
+than nothing is the compiler's choice of registers.
 
-{gates}
+{prices}
 
 ## Keeping it so
 
 `scripts/check_speed.sh` counts the instructions of six operations and fails if one takes 3 % more than \
-`bench/instructions.txt` says. To see where they went:
+`bench/instructions.txt` says, or if the observer costs something. To see where they went:
 
 ```sh
 valgrind --tool=callgrind --instr-atstart=no --callgrind-out-file=build/out build/bench/bench/kx_bench_guard '{example}'
@@ -432,8 +439,10 @@ def page(results):
         tables="\n\n".join(parts),
         growth=table(["with the number of", "sizes", "instructions", "of the walk", "time", "of the walk"],
                      growth_rows(results)),
-        gates=table(["operation", "with gates", "without", "price"], gate_rows(results)),
-        gate_price=lookup_gate_price(results),
+        prices=table(["operation", "as it is", "without gates", "price", "without observer", "price"],
+                     price_rows(results)),
+        gate_price=dearest_lookup(results, "no_gates"),
+        watch_price=dearest_lookup(results, "no_watch"),
         example=f"{CONDITION} 1000/{LIBRARY}",
     )
 

@@ -8,6 +8,7 @@
 #   engine   everything with the newest libxml2 that Debian has as a source package
 #   arm      everything for ARMv7-A, in both calling conventions, under qemu-arm; the library's size
 #   proof    every line and branch of the library covered; Valgrind; threads; a short run of each fuzz target
+#   speed    the instructions of key operations, against those that were accepted
 #   docs     the reference, built by Doxygen without a warning
 #   host     fast and package; what runs if no stage is named
 #   all      all of them but engine; what CI runs
@@ -68,6 +69,10 @@ stage_proof() {
     scripts/fuzz.sh
 }
 
+stage_speed() {
+    scripts/check_speed.sh
+}
+
 stage_docs() {
     scripts/reference.sh
 }
@@ -80,6 +85,7 @@ stage_host() {
 stage_all() {
     stage_host
     stage_docs
+    stage_speed
     stage_proof
     stage_abi98
     stage_arm
@@ -88,7 +94,7 @@ stage_all() {
 [ $# -gt 0 ] || set -- host
 for stage in "$@"; do
     declare -F "stage_$stage" >/dev/null ||
-        { echo "$0: no stage \"$stage\"; there are fast, package, abi98, engine, arm, proof, docs, host, all" >&2; exit 2; }
+        { echo "$0: no stage \"$stage\"; there are fast, package, abi98, engine, arm, proof, speed, docs, host, all" >&2; exit 2; }
 done
 for stage in "$@"; do
     "stage_$stage"

@@ -12,6 +12,7 @@
 
 #include <cstring>
 #include <iterator>
+#include <stdexcept>
 
 namespace bench
 {
@@ -32,6 +33,17 @@ const xmlChar* EngineText(const char* text)
 bool IsNamed(const xmlNode* node, const char* name)
 {
     return node->type == XML_ELEMENT_NODE && std::strcmp(Text(node->name), name) == 0;
+}
+
+/** The root is a step of the path, too: its name is compared. */
+xmlNode* RootOf(const xmlDoc* document)
+{
+    xmlNode* const root = xmlDocGetRootElement(document);
+    if (!IsNamed(root, "cfg"))
+    {
+        throw std::runtime_error("another document");
+    }
+    return root;
 }
 
 bool HoldsOnlyText(const xmlNode* element)
@@ -230,7 +242,7 @@ void AddLookUpsBySiblings()
                 return [document = LoadedDocument(Siblings(count))]
                 {
                     std::string value;
-                    AppendTexts(xmlDocGetRootElement(document), "service", value);
+                    AppendTexts(RootOf(document), "service", value);
                     return value;
                 };
             });
@@ -243,7 +255,7 @@ void AddLookUpsBySiblings()
                 return [document = LoadedDocument(Texts(count))]
                 {
                     std::string value;
-                    AppendTexts(xmlDocGetRootElement(document), "item", value);
+                    AppendTexts(RootOf(document), "item", value);
                     return value;
                 };
             });
@@ -258,7 +270,7 @@ void AddLookUpsByDepth()
             [levels]
             {
                 return [document = LoadedDocument(Nested(levels)), names = NestedNames(levels)]
-                { return TextsBelow(xmlDocGetRootElement(document), names); };
+                { return TextsBelow(RootOf(document), names); };
             });
     }
 }
@@ -272,7 +284,7 @@ void AddLookUpsWithConditions()
             {
                 return [document = LoadedDocument(Items(count)), id = std::to_string(count)]
                 {
-                    return TextsInSelected(xmlDocGetRootElement(document), "item", "name",
+                    return TextsInSelected(RootOf(document), "item", "name",
                                            [&id](xmlNode* item)
                                            { return HasAttribute(item, "id", id.c_str()); });
                 };
@@ -285,7 +297,7 @@ void AddLookUpsWithConditions()
             {
                 return [document = LoadedDocument(Attributed()), terms = AndTerms(count)]
                 {
-                    return TextsInSelected(xmlDocGetRootElement(document), "item", "name",
+                    return TextsInSelected(RootOf(document), "item", "name",
                                            [&terms](xmlNode* item)
                                            { return AllHold(item, terms); });
                 };
@@ -295,7 +307,7 @@ void AddLookUpsWithConditions()
             {
                 return [document = LoadedDocument(Attributed()), terms = OrTerms(count)]
                 {
-                    return TextsInSelected(xmlDocGetRootElement(document), "item", "name",
+                    return TextsInSelected(RootOf(document), "item", "name",
                                            [&terms](xmlNode* item)
                                            { return AnyHolds(item, terms); });
                 };
@@ -309,7 +321,7 @@ void AddUpdates()
         []
         {
             return [document = LoadedDocument(Channels(kUpdatedChannels))]
-            { return Update(xmlDocGetRootElement(document), "label", "after"); };
+            { return Update(RootOf(document), "label", "after"); };
         });
     Add(kUpdateAndSave, kWalk, true,
         []
@@ -317,7 +329,7 @@ void AddUpdates()
             return [document = LoadedDocument(Channels(kUpdatedChannels)),
                     path = ScratchFile("saved.xml")]
             {
-                const int updated = Update(xmlDocGetRootElement(document), "label", "after");
+                const int updated = Update(RootOf(document), "label", "after");
                 return updated == 1 && xmlSaveFileEnc(path.c_str(), document, "UTF-8") >= 0;
             };
         });

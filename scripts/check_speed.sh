@@ -1,0 +1,84 @@
+#!/usr/bin/env bash
+# Guards against getting slower: counts the instructions of some key operations and compares them with the counts
+# in bench/instructions.txt, which hold for Debian 12 on x86-64, and with those of a library in which the walks of
+# reader and writer have no observer.
+# usage: check_speed.sh [--accept]
+#   --accept  writes the counts of now into the file, for a change that is meant
+set -euo pipefail
+cd "$(dirname "$0")/.."
+. scripts/packages.sh
+
+margin=3          # percent
+observer_margin=1 # percent: the compiler may choose other registers
+file=bench/instructions.txt
+
+need "${build_packages[@]}" valgrind
+
+log=build/speed.log
+mkdir -p build
+{ cmake --preset bench && cmake --build --preset bench --target kx_bench_guard kx_as_it_is kx_no_watch; } >"$log" 2>&1 ||
+    { cat "$log" >&2; exit 1; }
+
+# What the counts depend on besides this project.
+versions() {
+    dpkg-query -W -f '${Package} ${Version}\n' g++-12 libc6 libstdc++6 libxml2 valgrind 2>/dev/null |
+        sort -u | paste -sd, | sed 's/,/, /g'
+}
+
+mapfile -t operations < <(grep -v '^#' $file | cut -f2)
+
+# count VARIANT — prints what the operations take with that build of the library.
+count() {
+    LD_LIBRARY_PATH=build/bench/bench/variants/$1 \
+        scripts/count_instructions.sh build/bench/bench/kx_bench_guard "${operations[@]}"
+}
+
+counted=$(count as_it_is)
+
+if [ "${1:-}" = --accept ]; then
+    { grep '^#' $file | grep -v '^# with '; echo "# with $(versions)"; echo "$counted"; } >$file.new
+    mv $file.new $file
+    echo "$file is written; commit it with the change that it is about"
+    exit 0
+fi
+
+# compare MARGIN BEFORE AFTER — prints how counts differ, and fails if one is higher by more than the margin.
+compare() {
+    awk -F'\t' -v margin="$1" '
+        /^#/ { next }
+        NR == FNR { before[$2] = $1; next }
+        {
+            change = ($1 / before[$2] - 1) * 100
+            verdict = change > margin ? "SLOWER" : change < -margin ? "faster" : ""
+            printf "%10d  %+6.1f %%  %-7s %s\n", $1, change, verdict, $2
+            slower = slower || change > margin
+            seen[$2] = 1
+        }
+        END {
+            for (name in before)
+                if (!(name in seen)) { print "not counted: " name; slower = 1 }
+            exit slower
+        }' "$2" "$3"
+}
+
+echo "== instructions, against $file"
+if ! compare $margin $file <(echo "$counted"); then
+    cat >&2 <<MESSAGE
+
+An operation takes more than $margin % more instructions than $file says.
+If the change is not meant: callgrind_annotate shows where they went, see docs/performance.md.
+If it is meant: scripts/check_speed.sh --accept writes the new counts; commit them, and say why in the message.
+MESSAGE
+    accepted_versions=$(sed -n 's/^# with //p' $file)
+    if [ "$accepted_versions" != "$(versions)" ]; then
+        printf 'These counts may differ for another reason:\n  accepted with %s\n  counted with  %s\n' \
+            "$accepted_versions" "$(versions)" >&2
+    fi
+    exit 1
+fi
+
+echo "== instructions, against walks without an observer"
+if ! compare $observer_margin <(count no_watch) <(echo "$counted"); then
+    echo "The observer's calls have to vanish in the library's own walks: see src/config/Observer.h." >&2
+    exit 1
+fi
