@@ -76,8 +76,6 @@ public:
     /** @param text  not empty. */
     explicit Condition(TextView text) : m_others(text), m_first(m_others.Next()), m_test(m_first) {}
 
-    static bool IsEmpty() { return false; }
-
     /** Terms combine from left to right; a failed "&" or last term rejects at once. */
     template <class Observer>
     bool Holds(xmlNode* element) const

@@ -11,21 +11,49 @@ namespace kx
 /** Stands in for the condition of a segment that has none. */
 struct NoCondition
 {
-    static bool IsEmpty() { return true; }
+    static void Suspend() {}
 
     template <class Observer>
-    static bool Holds(xmlNode*)
+    static bool Admits(xmlNode*)
     {
+        Observer::Selected(true);
         return true;
     }
 };
 
-/** The scan of ScanSiblings(), with the segment's condition made ready as @p condition. */
-template <class Observer, class ConditionTest, class Visitor>
-inline void ScanSiblings(const xmlNode* node, const Segment& segment,
-                         const ConditionTest& condition, Visitor& visitor)
+/** The condition of a segment, on its way along the siblings. */
+class SuspendableCondition
 {
-    bool suspended = condition.IsEmpty();
+public:
+    explicit SuspendableCondition(TextView text) : m_condition(text), m_suspended(false) {}
+
+    /** Leaves the condition out for the next element that asks. */
+    void Suspend() { m_suspended = true; }
+
+    template <class Observer>
+    bool Admits(xmlNode* element)
+    {
+        const bool suspended = m_suspended;
+        m_suspended = false;
+        if (!suspended && !m_condition.Holds<Observer>(element))
+        {
+            Observer::Rejected();
+            return false;
+        }
+        Observer::Selected(suspended);
+        return true;
+    }
+
+private:
+    const Condition m_condition;
+    bool m_suspended;
+};
+
+/** The scan of ScanSiblings(), with the segment's condition made ready as @p condition. */
+template <class Observer, class SegmentCondition, class Visitor>
+inline void ScanSiblings(const xmlNode* node, const Segment& segment, SegmentCondition condition,
+                         Visitor& visitor)
+{
     for (xmlNode* child = node->children; child != 0; child = child->next)
     {
         if (child->type != XML_ELEMENT_NODE)
@@ -36,19 +64,12 @@ inline void ScanSiblings(const xmlNode* node, const Segment& segment,
         if (!segment.Names(child))
         {
             Observer::OtherName();
-            suspended = true;
-            continue;
+            condition.Suspend();
         }
-        if (suspended || condition.template Holds<Observer>(child))
+        else if (condition.template Admits<Observer>(child))
         {
-            Observer::Selected(suspended);
             visitor.Accept(child);
         }
-        else
-        {
-            Observer::Rejected();
-        }
-        suspended = condition.IsEmpty();
     }
 }
 
@@ -57,7 +78,8 @@ template <class Observer, class Visitor>
 __attribute__((noinline)) void ScanWithCondition(const xmlNode* node, TextView name,
                                                  TextView condition, Visitor& visitor)
 {
-    ScanSiblings<Observer>(node, Segment(name, condition), Condition(condition), visitor);
+    ScanSiblings<Observer>(node, Segment(name, condition), SuspendableCondition(condition),
+                           visitor);
 }
 
 /**
