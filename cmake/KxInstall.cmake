@@ -44,6 +44,8 @@ file(RELATIVE_PATH pc_includedir ${CMAKE_INSTALL_PREFIX} ${CMAKE_INSTALL_FULL_IN
 configure_file(cmake/${PROJECT_NAME}.pc.in ${PROJECT_NAME}.pc @ONLY)
 install(FILES ${PROJECT_BINARY_DIR}/${PROJECT_NAME}.pc DESTINATION ${pkgconfig_dir} COMPONENT development)
 
+install(FILES ${PROJECT_SOURCE_DIR}/CHANGELOG.md DESTINATION ${CMAKE_INSTALL_DOCDIR} COMPONENT runtime)
+
 if(KX_BUILD_TOOLS)
     install(TARGETS kxconfig DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT tools)
     install(FILES tools/completion/kxconfig.bash

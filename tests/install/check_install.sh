@@ -27,6 +27,7 @@ expected() {
     printf "$libdir/lib%s\n" KX_Platform.so{,.1,.1.0.0} KX_XMLConfigParser.so{,.${version%%.*},."$version"}
     echo "$libdir/pkgconfig/KX_XMLConfigParser.pc"
     echo share/bash-completion/completions/kxconfig
+    echo share/doc/KX_XMLConfigParser/CHANGELOG.md
     echo share/man/man1/kxconfig.1
 }
 

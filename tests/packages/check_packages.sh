@@ -39,6 +39,7 @@ for binary in "$root/usr/bin/kxconfig" "$root/usr/$libdir"/lib*.so.1; do
         exit 1
     fi
 done
+cmp "$source/CHANGELOG.md" "$root/usr/share/doc/KX_XMLConfigParser/CHANGELOG.md"
 for package in "$packages"/*.deb; do
     dpkg-deb --field "$package" Package Version Depends
 done
