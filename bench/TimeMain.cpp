@@ -42,6 +42,7 @@ void NoteContext()
     benchmark::AddCustomContext("processor", Entry("/proc/cpuinfo", "model name"));
     benchmark::AddCustomContext("system", Entry("/etc/os-release", "PRETTY_NAME"));
     benchmark::AddCustomContext("compiler", "GCC " __VERSION__);
+    benchmark::AddCustomContext("flags", KX_BENCH_FLAGS);
     for (const auto& [name, version] : bench::Versions())
     {
         benchmark::AddCustomContext("version of " + name, version);

@@ -36,6 +36,8 @@ count() {
 counted=$(count as_it_is)
 
 if [ "${1:-}" = --accept ]; then
+    [ "$(wc -l <<<"$counted")" -eq ${#operations[@]} ] ||
+        { echo "not all operations of $file were counted; is one of them called otherwise now?" >&2; exit 1; }
     { grep '^#' $file | grep -v '^# with '; echo "# with $(versions)"; echo "$counted"; } >$file.new
     mv $file.new $file
     echo "$file is written; commit it with the change that it is about"

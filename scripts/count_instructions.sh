@@ -18,7 +18,7 @@ if ! GLIBC_TUNABLES=glibc.cpu.hwcaps=$processor LD_BIND_NOW=1 \
 fi
 
 # Each dump says how many operations it holds, and which; the dumps of an operation follow each other.
-find "$dumps" -name 'out.*' | sort -t. -k3n -V | xargs awk '
+find "$dumps" -name 'out.*' | sort -V | xargs awk '
     function flush() { if (name != "") printf "%d\t%s\n", (2 in count) ? count[2] - count[1] : count[1], name }
     /^desc: Trigger: Client Request: / {
         operation = $0

@@ -7,6 +7,7 @@
 #include <libxml/tree.h>
 #include <libxml/xpath.h>
 
+#include <cstdlib>
 #include <cstring>
 #include <list>
 #include <utility>
@@ -68,6 +69,38 @@ Attributes AttributesOf(const xmlNode* element)
         attributes.emplace_back(Text(attribute->name), Text(attribute->children->content));
     }
     return attributes;
+}
+
+using Nodes = std::list<const xmlNode*>;
+
+bool IsSelected(const xmlNode* element, double below)
+{
+    return std::strcmp(Text(element->name), "limit") == 0 &&
+           (below == 0 || std::strtod(Text(element->children->content), nullptr) < below);
+}
+
+void AppendSelected(const xmlNode* parent, double below, Nodes& found)
+{
+    for (const xmlNode* child = parent->children; child != nullptr; child = child->next)
+    {
+        if (child->type != XML_ELEMENT_NODE)
+        {
+            continue;
+        }
+        if (IsSelected(child, below))
+        {
+            found.push_back(child);
+        }
+        AppendSelected(child, below, found);
+    }
+}
+
+/** A list of what the query selects, without XPath. */
+Nodes ListedByWalk(const xmlDoc* document, double below)
+{
+    Nodes found;
+    AppendSelected(xmlDocGetRootElement(document), below, found);
+    return found;
 }
 
 /** The evaluation, and a list of what it selects. */
@@ -132,6 +165,12 @@ void AddQueries()
 {
     for (const Query& query : kQueries)
     {
+        Add(query.workload, kWalk, kQueryHits,
+            [query]
+            {
+                return [document = ParserDocument(Channels(query.channels)), query]
+                { return ListedByWalk(document, query.below).size(); };
+            });
         Add(query.workload, kXPathFresh, kQueryHits,
             [query]
             {

@@ -6,8 +6,10 @@
 #include <libxml++/libxml++.h>
 #include <libxml++config.h>
 
+#include <list>
 #include <map>
 #include <memory>
+#include <utility>
 
 namespace bench
 {
@@ -126,8 +128,35 @@ void AddUpdates()
         });
 }
 
+std::list<std::pair<Glib::ustring, Glib::ustring>> AttributesOf(const xmlpp::Element& element)
+{
+    std::list<std::pair<Glib::ustring, Glib::ustring>> attributes;
+    for (const xmlpp::Attribute* const attribute : element.get_attributes())
+    {
+        attributes.emplace_back(attribute->get_name(), attribute->get_value());
+    }
+    return attributes;
+}
+
+std::size_t CountedByIteration(const xmlpp::Node* parent)
+{
+    std::size_t count = 0;
+    for (const xmlpp::Node* child = parent->get_first_child(); child != nullptr;
+         child = child->get_next_sibling())
+    {
+        count += dynamic_cast<const xmlpp::Element*>(child) != nullptr;
+    }
+    return count;
+}
+
 void AddNodes()
 {
+    Add(kIterate, kLibXmlPp, kIteratedChildren,
+        []
+        {
+            return [parser = Loaded(bench::Texts(kIteratedChildren))]
+            { return CountedByIteration(parser->get_document()->get_root_node()); };
+        });
     Add(kListChildren, kLibXmlPp, kIteratedChildren,
         []
         {
@@ -148,12 +177,10 @@ void AddNodes()
     Add(kListAttributes, kLibXmlPp, kFourAttributes,
         []
         {
-            return [parser = Loaded(FourAttributes())]
-            {
-                const auto* const item = dynamic_cast<const xmlpp::Element*>(
-                    parser->get_document()->get_root_node()->get_first_child("item"));
-                return item->get_attributes().size();
-            };
+            const Parser parser = Loaded(FourAttributes());
+            const auto* const item = dynamic_cast<const xmlpp::Element*>(
+                parser->get_document()->get_root_node()->get_first_child("item"));
+            return [parser, item] { return AttributesOf(*item).size(); };
         });
     for (const Query& query : kQueries)
     {

@@ -5,8 +5,10 @@
 
 #include <pugixml.hpp>
 
+#include <list>
 #include <map>
 #include <memory>
+#include <utility>
 
 namespace bench
 {
@@ -145,8 +147,25 @@ void AddUpdates()
         });
 }
 
+std::list<std::pair<std::string, std::string>> AttributesOf(const pugi::xml_node element)
+{
+    std::list<std::pair<std::string, std::string>> attributes;
+    for (const pugi::xml_attribute attribute : element.attributes())
+    {
+        attributes.emplace_back(attribute.name(), attribute.value());
+    }
+    return attributes;
+}
+
 void AddNodes()
 {
+    Add(kListAttributes, kPugixml, kFourAttributes,
+        []
+        {
+            const Document document = Loaded(FourAttributes());
+            return [document, item = document->child("cfg").child("item")]
+            { return AttributesOf(item).size(); };
+        });
     Add(kIterate, kPugixml, kIteratedChildren,
         []
         {

@@ -5,8 +5,10 @@
 
 #include <tinyxml2.h>
 
+#include <list>
 #include <map>
 #include <memory>
+#include <utility>
 
 namespace bench
 {
@@ -167,8 +169,26 @@ void AddUpdates()
         });
 }
 
+std::list<std::pair<std::string, std::string>> AttributesOf(const tinyxml2::XMLElement* element)
+{
+    std::list<std::pair<std::string, std::string>> attributes;
+    for (const tinyxml2::XMLAttribute* attribute = element->FirstAttribute(); attribute != nullptr;
+         attribute = attribute->Next())
+    {
+        attributes.emplace_back(attribute->Name(), attribute->Value());
+    }
+    return attributes;
+}
+
 void AddNodes()
 {
+    Add(kListAttributes, kTinyXml2, kFourAttributes,
+        []
+        {
+            const Document document = Loaded(FourAttributes());
+            return [document, item = document->RootElement()->FirstChildElement("item")]
+            { return AttributesOf(item).size(); };
+        });
     Add(kIterate, kTinyXml2, kIteratedChildren,
         []
         {

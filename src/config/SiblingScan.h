@@ -51,7 +51,7 @@ private:
 
 /** The scan of ScanSiblings(), with the segment's condition made ready as @p condition. */
 template <class Observer, class SegmentCondition, class Visitor>
-inline void ScanSiblings(const xmlNode* node, const Segment& segment, SegmentCondition condition,
+inline void ScanSiblings(const xmlNode* node, const Segment& segment, SegmentCondition& condition,
                          Visitor& visitor)
 {
     for (xmlNode* child = node->children; child != 0; child = child->next)
@@ -78,8 +78,8 @@ template <class Observer, class Visitor>
 __attribute__((noinline)) void ScanWithCondition(const xmlNode* node, TextView name,
                                                  TextView condition, Visitor& visitor)
 {
-    ScanSiblings<Observer>(node, Segment(name, condition), SuspendableCondition(condition),
-                           visitor);
+    SuspendableCondition suspendable(condition);
+    ScanSiblings<Observer>(node, Segment(name, condition), suspendable, visitor);
 }
 
 /**
@@ -96,7 +96,8 @@ inline void ScanSiblings(const xmlNode* node, const Segment& segment, Visitor& v
 {
     if (segment.condition.IsEmpty())
     {
-        ScanSiblings<Observer>(node, segment, NoCondition(), visitor);
+        NoCondition none;
+        ScanSiblings<Observer>(node, segment, none, visitor);
     }
     else
     {

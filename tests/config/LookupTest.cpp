@@ -424,6 +424,19 @@ TEST_F(ConditionTest, EmptyAttributeNameNeverHolds)
     EXPECT_FALSE(Accepts("a=''", "="));
 }
 
+TEST_F(ConditionTest, AttributeNameMayHaveAnyLength)
+{
+    for (const std::size_t length : {1u, 62u, 63u, 64u, 65u, 1000u})
+    {
+        const std::string name(length, 'n');
+        EXPECT_TRUE(Accepts(name + "='1'", name + "=1")) << length;
+        EXPECT_FALSE(Accepts(name + "='2'", name + "=1")) << length;
+        EXPECT_FALSE(Accepts(name + "n='1'", name + "=1")) << length;
+        EXPECT_TRUE(Accepts("a='1' " + name + "='1'", "a=1&" + name + "=1")) << length;
+        EXPECT_FALSE(Accepts("a='1' " + name + "='2'", "a=1&" + name + "=1")) << length;
+    }
+}
+
 TEST_F(ConditionTest, OrNeedsOneTerm)
 {
     EXPECT_TRUE(Accepts("a='1' b='x'", "a=1|b=2"));
