@@ -3,6 +3,7 @@
 #include <filesystem>
 #include <fstream>
 #include <functional>
+#include <iterator>
 #include <stdexcept>
 
 #include <stdlib.h>
@@ -288,6 +289,15 @@ std::string FourAttributes()
 std::string ScratchFile(const std::string& name)
 {
     return Folder().File(name);
+}
+
+bool IsUpdated(const std::string& path)
+{
+    std::ifstream file(path);
+    const std::string text((std::istreambuf_iterator<char>(file)),
+                           std::istreambuf_iterator<char>());
+    return text.find("<label>after</label>") != std::string::npos &&
+           text.find("</cfg>") != std::string::npos;
 }
 
 std::vector<std::size_t> Joined(std::vector<std::size_t> first,

@@ -64,6 +64,9 @@ const std::size_t kUpdatedChannels = 1000;
 /** A path in the same folder that no document has. */
 std::string ScratchFile(const std::string& name);
 
+/** @return whether the file holds the channels with "after" in the element "label". */
+bool IsUpdated(const std::string& path);
+
 const std::vector<std::size_t> kSiblingCounts = {1, 10, 1000, 100000};
 const std::vector<std::size_t> kItemCounts = {10, 1000, 100000};
 const std::vector<std::size_t> kTextCounts = {1, 100, 10000};

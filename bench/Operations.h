@@ -59,6 +59,18 @@ std::function<void(std::uint64_t)> Tried(const Operation& operation, const Resul
     };
 }
 
+/** Calls @p call once and sees that @p holds then. @return @p call, to be measured. */
+template <class Call, class Holds>
+Call Seen(Call call, Holds holds)
+{
+    call();
+    if (!holds())
+    {
+        throw std::runtime_error("an operation does not do what it should");
+    }
+    return call;
+}
+
 /**
  * Registers an operation.
  *

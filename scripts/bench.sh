@@ -9,6 +9,7 @@ need "${build_packages[@]}" "${bench_packages[@]}"
 
 results=build/bench/results
 programs=build/bench/bench
+rm -rf $results
 mkdir -p $results
 { cmake --preset bench && cmake --build --preset bench; } >build/bench.log 2>&1 || { cat build/bench.log >&2; exit 1; }
 

@@ -106,6 +106,9 @@ def counts(path):
 
 # --- Targets
 
+# A few allocations come and go: the engine seeds the tables of each parse anew.
+FEW_MORE = "10 more"
+
 Check = namedtuple("Check", "workload implementation reference of limit faster")
 Check.__new__.__defaults__ = ("times", 0, False)
 Target = namedtuple("Target", "operation against limit checks note")
@@ -132,8 +135,7 @@ def targets(results):
         Target("load, read one value, destroy", "the walk after the same parse", "1.03×",
                at_most(1.03, loads)),
         Target("the same, allocations", "the walk after the same parse", "the same",
-               # A few come and go: the engine seeds the tables of each parse anew.
-               at_most(1.001, loads, of="allocations")),
+               at_most(FEW_MORE, loads, of="allocations")),
         Target("look up, match at the only sibling", "the walk", "1.7×",
                at_most(1.7, [f"{PLAIN} 1"], both)),
         Target("look up, match at sibling 10 and beyond", "the walk", "1.1×",
@@ -172,31 +174,42 @@ def targets(results):
     ]
 
 
-def worst(results, checks):
-    """The check that comes closest to its limit or misses it most: (figure, check)."""
-    measured = []
+def measured(results, checks):
+    """What was measured of the checks: a list of (figure, check)."""
+    figures = []
     for check in checks:
         if f"{check.workload}/{check.reference}" not in getattr(results, check.of):
             continue
         ratio = results.ratio(check.workload, check.implementation, check.reference, check.of)
-        measured.append((1 / ratio if check.faster else ratio, check))
-    if not measured:
-        return None
-    return (min if measured[0][1].faster else max)(measured, key=lambda entry: entry[0])
+        figures.append((1 / ratio if check.faster else ratio, check))
+    return figures
+
+
+def worst(figures):
+    """The one that comes closest to its limit or misses it most."""
+    return (min if figures[0][1].faster else max)(figures, key=lambda entry: entry[0])
+
+
+def is_kept(results, figure, check):
+    if check.limit == FEW_MORE:
+        own, reference = (results.allocations[f"{check.workload}/{i}"] for i in (check.implementation, check.reference))
+        return own <= reference + 10
+    return figure >= check.limit if check.faster else figure <= check.limit
 
 
 def target_rows(results):
     for target in targets(results):
-        found = worst(results, target.checks)
-        if found is None:
+        figures = measured(results, target.checks)
+        if not figures:
             yield [target.operation, target.against, target.limit, "not measured", ""]
             continue
-        figure, check = found
-        kept = figure >= check.limit if check.faster else figure <= check.limit
+        figure, check = worst(figures)
         note = note_text(results, target.note)
         where = "" if len(target.checks) == 1 else f" ({place(check, target)})"
         shown = f"{figure:.1f} times" if check.faster else f"{figure:.2f}×"
-        yield [target.operation, target.against, target.limit, shown + where + note, verdict(kept)]
+        kept = [c for f, c in figures if is_kept(results, f, c)]
+        yield [target.operation, target.against, target.limit, shown + where + note,
+               partial_verdict(kept, figures, target)]
     yield from growth_targets(results)
     name, percent = dearest_lookup(results, "no_gates")
     yield ["log gates, instructions of a lookup", "a build without them", "5 %",
@@ -216,6 +229,12 @@ def growth_targets(results):
 
 def verdict(kept):
     return "kept" if kept else "**missed**"
+
+
+def partial_verdict(kept, figures, target):
+    if not kept or len(kept) == len(figures):
+        return verdict(kept)
+    return "**missed**; kept at " + ", ".join(place(check, target) for check in kept)
 
 
 def note_text(results, note):
@@ -340,10 +359,12 @@ def parsing_text(results):
         for name in results.implementations(workload):
             if name not in (LIBRARY, WALK, FRESH):
                 factors.setdefault(name, []).append(1 / results.ratio(workload, name, LIBRARY))
-    sentences = [f"{name} {min(values):.1f} to {max(values):.1f}"
-                 for name, values in sorted(factors.items(), key=lambda entry: -max(entry[1]))]
-    return ("**Who loads a file, reads one value and throws the document away is served faster by pugixml and by "
-            "TinyXML-2.** This library takes what the engine takes. How many times as fast as this library the others "
+    ordered = sorted(factors.items(), key=lambda entry: -max(entry[1]))
+    sentences = [f"{name} {min(values):.1f} to {max(values):.1f}" for name, values in ordered]
+    faster = [name for name, values in ordered if min(values) > 1]
+    claim = ("**Who loads a file, reads one value and throws the document away is served faster by "
+             f"{' and by '.join(faster)}, whatever the file.** ") if faster else ""
+    return (f"{claim}This library takes what the engine takes. How many times as fast as this library the others "
             f"are, from the least to the most favourable of the files: {', '.join(sentences)}.\n\n")
 
 

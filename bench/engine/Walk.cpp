@@ -326,12 +326,14 @@ void AddUpdates()
     Add(kUpdateAndSave, kWalk, true,
         []
         {
-            return [document = LoadedDocument(Channels(kUpdatedChannels)),
-                    path = ScratchFile("saved.xml")]
-            {
-                const int updated = Update(RootOf(document), "label", "after");
-                return updated == 1 && xmlSaveFileEnc(path.c_str(), document, "UTF-8") >= 0;
-            };
+            const std::string path = ScratchFile("saved.xml");
+            return Seen(
+                [document = LoadedDocument(Channels(kUpdatedChannels)), path]
+                {
+                    const int updated = Update(RootOf(document), "label", "after");
+                    return updated == 1 && xmlSaveFileEnc(path.c_str(), document, "UTF-8") >= 0;
+                },
+                [path] { return IsUpdated(path); });
         });
 }
 

@@ -146,12 +146,15 @@ void AddUpdates()
     Add(kUpdateAndSave, kLibrary, 0,
         [key, text]
         {
-            return [writer = LoadedWriter(Channels(kUpdatedChannels)), key, text]
-            {
-                const int updated = writer->SetValue(key, text);
-                const int saved = writer->SaveData();
-                return updated + saved;
-            };
+            const std::string path = ScratchFile("saved.xml");
+            return Seen(
+                [writer = LoadedWriter(Channels(kUpdatedChannels)), key, text]
+                {
+                    const int updated = writer->SetValue(key, text);
+                    const int saved = writer->SaveData();
+                    return updated + saved;
+                },
+                [path] { return IsUpdated(path); });
         });
 }
 

@@ -142,22 +142,27 @@ void AddUpdates()
     Add(kUpdate, kBoost, true,
         []
         {
-            return [tree = Loaded(Channels(kUpdatedChannels))]
-            {
-                tree->put("cfg.label", "after");
-                return true;
-            };
+            const auto tree = Loaded(Channels(kUpdatedChannels));
+            return Seen(
+                [tree]
+                {
+                    tree->put("cfg.label", "after");
+                    return true;
+                },
+                [tree] { return tree->get<std::string>("cfg.label") == "after"; });
         });
     Add(kUpdateAndSave, kBoost, true,
         []
         {
-            return [tree = Loaded(Channels(kUpdatedChannels)),
-                    path = ScratchFile("saved-by-boost.xml")]
-            {
-                tree->put("cfg.label", "after");
-                pt::write_xml(path, *tree);
-                return true;
-            };
+            const std::string path = ScratchFile("saved-by-boost.xml");
+            return Seen(
+                [tree = Loaded(Channels(kUpdatedChannels)), path]
+                {
+                    tree->put("cfg.label", "after");
+                    pt::write_xml(path, *tree);
+                    return true;
+                },
+                [path] { return IsUpdated(path); });
         });
 }
 

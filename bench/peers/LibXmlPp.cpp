@@ -114,17 +114,30 @@ bool Update(const Parser& parser)
 void AddUpdates()
 {
     Add(kUpdate, kLibXmlPp, true,
-        [] { return [parser = Loaded(Channels(kUpdatedChannels))] { return Update(parser); }; });
+        []
+        {
+            const auto parser = Loaded(Channels(kUpdatedChannels));
+            return Seen([parser] { return Update(parser); },
+                        [parser]
+                        {
+                            xmlpp::Node* const root = parser->get_document()->get_root_node();
+                            auto* const label =
+                                dynamic_cast<xmlpp::Element*>(root->get_first_child("label"));
+                            return label->get_child_text()->get_content() == "after";
+                        });
+        });
     Add(kUpdateAndSave, kLibXmlPp, true,
         []
         {
-            return [parser = Loaded(Channels(kUpdatedChannels)),
-                    path = ScratchFile("saved-by-libxmlpp.xml")]
-            {
-                Update(parser);
-                parser->get_document()->write_to_file(path, "UTF-8");
-                return true;
-            };
+            const std::string path = ScratchFile("saved-by-libxmlpp.xml");
+            return Seen(
+                [parser = Loaded(Channels(kUpdatedChannels)), path]
+                {
+                    Update(parser);
+                    parser->get_document()->write_to_file(path, "UTF-8");
+                    return true;
+                },
+                [path] { return IsUpdated(path); });
         });
 }
 

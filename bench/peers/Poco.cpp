@@ -96,22 +96,27 @@ void AddUpdates()
     Add(kUpdate, kPoco, true,
         []
         {
-            return [configuration = Loaded(Channels(kUpdatedChannels))]() mutable
-            {
-                configuration->setString("label", "after");
-                return true;
-            };
+            auto configuration = Loaded(Channels(kUpdatedChannels));
+            return Seen(
+                [configuration]() mutable
+                {
+                    configuration->setString("label", "after");
+                    return true;
+                },
+                [configuration] { return configuration->getString("label") == "after"; });
         });
     Add(kUpdateAndSave, kPoco, true,
         []
         {
-            return [configuration = Loaded(Channels(kUpdatedChannels)),
-                    path = ScratchFile("saved-by-poco.xml")]() mutable
-            {
-                configuration->setString("label", "after");
-                configuration->save(path);
-                return true;
-            };
+            const std::string path = ScratchFile("saved-by-poco.xml");
+            return Seen(
+                [configuration = Loaded(Channels(kUpdatedChannels)), path]() mutable
+                {
+                    configuration->setString("label", "after");
+                    configuration->save(path);
+                    return true;
+                },
+                [path] { return IsUpdated(path); });
         });
 }
 

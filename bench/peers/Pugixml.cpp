@@ -138,12 +138,15 @@ void AddUpdates()
     Add(kUpdateAndSave, kPugixml, true,
         []
         {
-            return [document = Loaded(Channels(kUpdatedChannels)),
-                    path = ScratchFile("saved-by-pugixml.xml")]
-            {
-                return document->child("cfg").child("label").text().set("after") &&
-                       document->save_file(path.c_str(), "", pugi::format_raw, pugi::encoding_utf8);
-            };
+            const std::string path = ScratchFile("saved-by-pugixml.xml");
+            return Seen(
+                [document = Loaded(Channels(kUpdatedChannels)), path]
+                {
+                    return document->child("cfg").child("label").text().set("after") &&
+                           document->save_file(path.c_str(), "", pugi::format_raw,
+                                               pugi::encoding_utf8);
+                },
+                [path] { return IsUpdated(path); });
         });
 }
 

@@ -160,12 +160,14 @@ void AddUpdates()
     Add(kUpdateAndSave, kTinyXml2, true,
         []
         {
-            return [document = Loaded(Channels(kUpdatedChannels)),
-                    path = ScratchFile("saved-by-tinyxml2.xml")]
-            {
-                document->RootElement()->FirstChildElement("label")->SetText("after");
-                return document->SaveFile(path.c_str()) == tinyxml2::XML_SUCCESS;
-            };
+            const std::string path = ScratchFile("saved-by-tinyxml2.xml");
+            return Seen(
+                [document = Loaded(Channels(kUpdatedChannels)), path]
+                {
+                    document->RootElement()->FirstChildElement("label")->SetText("after");
+                    return document->SaveFile(path.c_str()) == tinyxml2::XML_SUCCESS;
+                },
+                [path] { return IsUpdated(path); });
         });
 }
 
