@@ -6,7 +6,7 @@ set -euo pipefail
 cd "$(dirname "$0")/.."
 . scripts/packages.sh
 
-need "${build_packages[@]}" clang llvm libgtest-dev libgmock-dev fontconfig-config shared-mime-info xkb-data
+need "${build_packages[@]}" "${test_packages[@]}" llvm libclang-rt-dev
 
 build=build/coverage
 log=$build/coverage.log

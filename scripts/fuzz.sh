@@ -12,7 +12,7 @@ if [ "${1:-all}" != all ]; then
     targets=("$1")
 fi
 
-need "${build_packages[@]}" clang libgtest-dev libgmock-dev
+need "${build_packages[@]}" "${test_packages[@]}" libclang-rt-dev
 
 build=build/fuzz
 mkdir -p $build/findings

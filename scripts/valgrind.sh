@@ -5,8 +5,7 @@ set -euo pipefail
 cd "$(dirname "$0")/.."
 . scripts/packages.sh
 
-need "${build_packages[@]}" valgrind clang libgtest-dev libgmock-dev libc6-dbg \
-    fontconfig-config shared-mime-info xkb-data
+need "${build_packages[@]}" "${test_packages[@]}" valgrind libc6-dbg
 
 build=build/dev
 log=build/valgrind.log

@@ -13,7 +13,7 @@ Each fenced block of the page is dealt with by its language, in the order of the
            "output" block follows, the program is run and must print that.
   output   what the cpp block before it prints
   console  lines after "$ " are commands, the lines below each are what it must print; "> " continues a command,
-           a line "..." stands for any number of lines
+           a line "..." stands for any number of lines, and "..." at the end of a line for its rest
   sh       must run without a failure
   python   must be a program; commands run it
   json     must be well-formed; after "printed by", what the command printed, laid out for reading
@@ -90,7 +90,12 @@ def matches(expected, actual):
         return not actual
     if expected[0] == "...":
         return any(matches(expected[1:], actual[i:]) for i in range(len(actual) + 1))
-    return bool(actual) and expected[0] == actual[0] and matches(expected[1:], actual[1:])
+    return bool(actual) and line_matches(expected[0], actual[0]) and matches(expected[1:], actual[1:])
+
+
+def line_matches(expected, actual):
+    """Whether the line is the same; "..." at the end of what is expected stands for any rest."""
+    return actual.startswith(expected[:-3]) if expected.endswith("...") else expected == actual
 
 
 class Checker:

@@ -4,6 +4,7 @@
 #include "DomTest.h"
 
 #include <libxml/parser.h>
+#include <libxml/valid.h>
 #include <libxml/xpath.h>
 
 #include <sys/wait.h>
@@ -25,9 +26,12 @@ bool Failing(std::size_t n, const Operation& operation)
     return failed;
 }
 
-/** Calls @p attempt(n) for n from 1 on, as long as it answers that the n-th request failed. */
+/**
+ * Calls @p attempt(n) for n from 1 on, as long as it answers that the n-th request failed, which
+ * the first @p fewest must have done.
+ */
 template <class Attempt>
-void FailInTurn(const Attempt& attempt)
+void FailInTurn(const Attempt& attempt, std::size_t fewest = 1)
 {
     const std::size_t kEnough = 5000;
     for (std::size_t n = 1; n < kEnough; ++n)
@@ -35,8 +39,7 @@ void FailInTurn(const Attempt& attempt)
         SCOPED_TRACE("request " + std::to_string(n) + " fails");
         if (!attempt(n))
         {
-            // The first request must have been in reach.
-            EXPECT_LT(1u, n);
+            EXPECT_LT(fewest, n);
             return;
         }
     }
@@ -162,6 +165,13 @@ TEST_F(OutOfMemoryTest, SettingContentLosesNoMemory)
 
 TEST_F(OutOfMemoryTest, AttributeStaysAnIdWhileItsValueCannotBeChanged)
 {
+    // Older engines need memory to find the ID that an attribute is; newer ones keep it there.
+    const xmlDocPtr lookedUp = Parse("<!DOCTYPE a [<!ATTLIST a id ID #IMPLIED>]><a id='i'/>");
+    const xmlNodePtr attribute = NodeOf(lookedUp, "/a/@id");
+    const EngineMemory memory;
+    EXPECT_EQ(0, xmlRemoveID(lookedUp, reinterpret_cast<xmlAttrPtr>(attribute)));
+    const std::size_t fewest = memory.Requests();
+
     const auto changes = {+[](xmlNodePtr id) { return CXmlNode(id).SetContent("other"); },
                           +[](xmlNodePtr id) { return CXmlNode(id).ClearNode(); },
                           +[](xmlNodePtr id) { return CXmlNode(id->children).SetContent("other"); },
@@ -187,7 +197,8 @@ TEST_F(OutOfMemoryTest, AttributeStaysAnIdWhileItsValueCannotBeChanged)
                 EXPECT_EQ(0, CXmlParser().RemoveNode(CXmlNode(id)));
                 EXPECT_EQ(nullptr, NodeOf(document, "id('a rather long value of it')"));
                 return failed;
-            });
+            },
+            fewest);
     }
 }
 

@@ -139,10 +139,10 @@ private:
 
 std::string Query(Objects& objects)
 {
-    const xmlXPathObjectPtr result = objects.parser.GetNodeSet(kXPath, objects.root);
-    const std::string seen = Of(static_cast<const void*>(result));
-    xmlXPathFreeObject(result);
-    return seen;
+    // To name what is seen can need memory as well.
+    const std::unique_ptr<xmlXPathObject, void (*)(xmlXPathObjectPtr)> result(
+        objects.parser.GetNodeSet(kXPath, objects.root), xmlXPathFreeObject);
+    return Of(static_cast<const void*>(result.get()));
 }
 
 std::string CreateNew(Objects& objects)

@@ -188,11 +188,24 @@ TEST_F(KxconfigSet, SaysThatADeviceIsFull)
 
 TEST_F(KxconfigSet, RefusesAValueThatIsNoXmlText)
 {
-    for (const std::string value : {"x&y", "x&y=2", "&", "a & b"})
+    for (const std::string value :
+         {"x&y", "x&y=2", "&", "a & b", "a & b;", "&;", "&#;", "&#x;", "&#1a;", "&#xg;", "&amp;&"})
     {
         ExpectRefused({"set", m_file, "cfg.name", value}, 2,
                       "VALUE is not XML text: write & as &amp;");
     }
+}
+
+TEST_F(KxconfigSet, RefusesAValueThatIsNoXmlTextWhateverTheKeySelects)
+{
+    ExpectRefused({"set", m_file, "cfg.missing", "x&y"}, 2,
+                  "VALUE is not XML text: write & as &amp;");
+}
+
+TEST_F(KxconfigSet, TakesReferencesToCharactersAndEntities)
+{
+    EXPECT_EQ("/cfg/name: \"box\" -> \"A & JK\"\n",
+              Tool({"set", m_file, "cfg.name", "&#65; &amp; &#x4a;&#x4B;"}).out);
 }
 
 TEST_F(KxconfigSet, DryRunFailsWhereTheRealRunWould)

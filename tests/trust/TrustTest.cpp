@@ -181,7 +181,7 @@ TEST_F(TrustTest, PathsEndAtANulByte)
     EXPECT_TRUE(Loads(file + std::string("\0.txt", 5)));
 }
 
-TEST_F(TrustTest, CompressedFilesAreReadLikeOthers)
+TEST_F(TrustTest, CompressedFilesAreReadIfTheEngineReadsThem)
 {
     static const unsigned char kGzip[] = {0x1f, 0x8b, 0x08, 0x00, 0x00, 0x00, 0x00, 0x00, 0x02,
                                           0x03, 0xb3, 0x49, 0x4e, 0x4b, 0xb7, 0xb3, 0x49, 0xb4,
@@ -189,7 +189,11 @@ TEST_F(TrustTest, CompressedFilesAreReadLikeOthers)
                                           0x00, 0xc5, 0x27, 0x99, 0xff, 0x13, 0x00, 0x00, 0x00};
     const std::string file =
         m_folder.Write("cfg.xml", std::string(reinterpret_cast<const char*>(kGzip), sizeof kGzip));
-    EXPECT_EQ("v", CXMLReader(file).GetValue("cfg.a"));
+    // Without zlib an engine does not, nor does one from 2.15 on that is not asked to.
+    const xmlDocPtr engines = xmlReadFile(file.c_str(), nullptr, 0);
+    EXPECT_EQ(engines != nullptr ? "v" : "", CXMLReader(file).GetValue("cfg.a"));
+    EXPECT_TRUE(engines != nullptr || LIBXML_VERSION >= 21500 || xmlHasFeature(XML_WITH_ZLIB) == 0);
+    xmlFreeDoc(engines);
 }
 
 // --- Documents
