@@ -1,6 +1,7 @@
 #include "Commands.h"
 #include "Document.h"
 #include "KeyList.h"
+#include "Locations.h"
 #include "Nodes.h"
 #include "Output.h"
 #include "RoundTrip.h"
@@ -35,6 +36,13 @@ public:
         return m_levels.emplace(level, Text(name)).second;
     }
 
+    std::string LocationOf(const xmlNode* node) { return m_locations.Of(node); }
+
+    std::string Place(const xmlNode* node)
+    {
+        return LocationOf(node) + " (line " + LineOf(node) + ")";
+    }
+
     /** Prints them by line. @return whether there are any. */
     bool PrintFor(const std::string& file) const
     {
@@ -54,15 +62,11 @@ private:
         std::string text;
     };
 
+    Locations m_locations;
     std::multimap<long, Warning> m_byLine;
     std::set<std::string> m_texts;
     std::set<std::pair<const xmlNode*, std::string>> m_levels;
 };
-
-std::string Place(const xmlNode* node)
-{
-    return LocationOf(node) + " (line " + LineOf(node) + ")";
-}
 
 // Keys: what a lookup finds, and what it would find if the elements stood in another order.
 
@@ -73,7 +77,7 @@ void CheckMatches(const Trail& trail, const std::string& key, Warnings& warnings
     {
         warnings.Warn(found[1]->element, "ambiguous key",
                       Quoted(key) + " matches " + std::to_string(found.size()) +
-                          " elements, the first of them " + Place(found[0]->element));
+                          " elements, the first of them " + warnings.Place(found[0]->element));
     }
 }
 
@@ -109,18 +113,18 @@ void CheckOrder(const TrailLevel& level, Warnings& warnings)
     }
     const std::string segment =
         Quoted(Text(level.steps.front().name) + "@" + Text(level.steps.front().condition));
-    const std::string other = Place(order.other->element);
+    const std::string other = warnings.Place(order.other->element);
     if (order.taken != nullptr)
     {
         warnings.Warn(order.taken->element, "suspended condition",
-                      LocationOf(order.taken->element) + " is taken for " + segment +
+                      warnings.LocationOf(order.taken->element) + " is taken for " + segment +
                           " though it does not fulfil it: " + other + " suspends the condition");
     }
     else if (order.rejected != nullptr && warnings.IsNew(level.parent, level.steps.front().name))
     {
         warnings.Warn(order.rejected->element, "condition depends on order",
-                      LocationOf(order.rejected->element) + " would be taken for " + segment +
-                          " if " + other + ", of another name, came right before it");
+                      warnings.LocationOf(order.rejected->element) + " would be taken for " +
+                          segment + " if " + other + ", of another name, came right before it");
     }
 }
 
@@ -174,15 +178,15 @@ void CheckVisible(const xmlNode* element, Warnings& warnings)
     {
         warnings.Warn(
             element, "unreachable element",
-            LocationOf(element) +
+            warnings.LocationOf(element) +
                 " cannot be named by a key: its name holds a \".\", which ends a segment");
     }
     const std::string text = OwnText(element);
     if (OnlyTextOf(element) == nullptr && !text.empty())
     {
         warnings.Warn(element, "invisible value",
-                      LocationOf(element) + " has no value though it holds " + Quoted(text) + ": " +
-                          WhyNoValue(element));
+                      warnings.LocationOf(element) + " has no value though it holds " +
+                          Quoted(text) + ": " + WhyNoValue(element));
     }
 }
 
@@ -235,8 +239,8 @@ void CheckGroup(const Group& group, Warnings& warnings)
         if (!bearer.second)
         {
             warnings.Warn(element, "repeated attribute",
-                          LocationOf(element) + " has the same " + telling + "=" + Quoted(value) +
-                              " as " + Place(bearer.first->second));
+                          warnings.LocationOf(element) + " has the same " + telling + "=" +
+                              Quoted(value) + " as " + warnings.Place(bearer.first->second));
         }
     }
 }

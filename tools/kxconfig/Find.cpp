@@ -1,5 +1,6 @@
 #include "Commands.h"
 #include "Document.h"
+#include "Locations.h"
 #include "Nodes.h"
 #include "Output.h"
 
@@ -43,11 +44,11 @@ const char* TypeName(const xmlNode* node)
 
 /** A namespace is no node of the tree: in a result, its next is the element that it was found on.
  */
-std::string LocationOfNamespace(const xmlNs* space)
+std::string LocationOfNamespace(const xmlNs* space, Locations& locations)
 {
     const auto element = reinterpret_cast<const xmlNode*>(space->next);
     const std::string prefix = space->prefix == nullptr ? "" : Text(space->prefix);
-    return LocationOf(element) + "/namespace::" + prefix;
+    return locations.Of(element) + "/namespace::" + prefix;
 }
 
 std::string Attributes(const xmlNode* element)
@@ -71,14 +72,14 @@ bool ShowsContent(const xmlNode* node)
            (node->type != XML_ELEMENT_NODE || OnlyTextOf(node) != nullptr);
 }
 
-std::string Line(const xmlNode* node)
+std::string Line(const xmlNode* node, Locations& locations)
 {
     if (node->type == XML_NAMESPACE_DECL)
     {
         const auto space = reinterpret_cast<const xmlNs*>(node);
-        return LocationOfNamespace(space) + " namespace " + Quoted(Text(space->href));
+        return LocationOfNamespace(space, locations) + " namespace " + Quoted(Text(space->href));
     }
-    std::string line = LocationOf(node) + " " + TypeName(node);
+    std::string line = locations.Of(node) + " " + TypeName(node);
     if (node->type == XML_ELEMENT_NODE)
     {
         line += Attributes(node);
@@ -101,17 +102,17 @@ Json AttributesInJson(const xmlNode* element)
     return attributes;
 }
 
-Json InJson(const xmlNode* node)
+Json InJson(const xmlNode* node, Locations& locations)
 {
     if (node->type == XML_NAMESPACE_DECL)
     {
         const auto space = reinterpret_cast<const xmlNs*>(node);
-        return {{"location", LocationOfNamespace(space)},
+        return {{"location", LocationOfNamespace(space, locations)},
                 {"type", TypeName(node)},
                 {"value", Text(space->href)}};
     }
     const long line = LineNumberOf(node);
-    Json result = {{"location", LocationOf(node)},
+    Json result = {{"location", locations.Of(node)},
                    {"line", line > 0 ? Json(line) : Json()},
                    {"type", TypeName(node)},
                    {"value", ShowsContent(node) ? Json(ContentOf(node)) : Json()}};
@@ -126,9 +127,11 @@ Json InJson(const xmlNode* node)
 int PrintNodes(const xmlNodeSet* nodes)
 {
     const int count = nodes == nullptr ? 0 : nodes->nodeNr;
+    Locations locations;
     for (int i = 0; i < count; ++i)
     {
-        Print(Line(nodes->nodeTab[i]), InJson(nodes->nodeTab[i]));
+        const xmlNode* const node = nodes->nodeTab[i];
+        Print(Line(node, locations), InJson(node, locations));
     }
     return count;
 }

@@ -2,9 +2,7 @@
 
 #include <cstdlib>
 #include <cstring>
-#include <iomanip>
 #include <iostream>
-#include <sstream>
 
 #include <unistd.h>
 
@@ -125,24 +123,25 @@ std::string Painted(Colour colour, const std::string& text)
 
 std::string OnOneLine(const std::string& text)
 {
-    std::ostringstream line;
+    const char* const digits = "0123456789abcdef";
+    std::string line;
     for (const char c : text)
     {
         const auto byte = static_cast<unsigned char>(c);
         if (c == '\n')
         {
-            line << "\\n";
+            line += "\\n";
         }
         else if (byte < 0x20 || byte == 0x7F)
         {
-            line << "\\x" << std::hex << std::setw(2) << std::setfill('0') << unsigned{byte};
+            line += {'\\', 'x', digits[byte >> 4], digits[byte & 0xF]};
         }
         else
         {
-            line << c;
+            line += c;
         }
     }
-    return line.str();
+    return line;
 }
 
 std::string Quoted(const std::string& text)
@@ -150,7 +149,8 @@ std::string Quoted(const std::string& text)
     std::string quoted = "\"";
     for (const char c : text)
     {
-        quoted += c == '"' || c == '\\' ? std::string("\\") + c : std::string(1, c);
+        quoted += c == '"' || c == '\\' ? "\\" : "";
+        quoted += c;
     }
     return OnOneLine(quoted + '"');
 }
