@@ -296,7 +296,8 @@ ExitStatus Check(const std::string& file, const std::vector<std::string>& keys)
     }
     const auto document = static_cast<xmlDoc*>(reader->GetDataPtr());
     Warnings warnings;
-    for (const std::string& key : keys.empty() ? ListKeys(RootOf(*reader)) : keys)
+    Levels levels(document);
+    for (const std::string& key : keys.empty() ? ListKeys(RootOf(*reader), levels) : keys)
     {
         CheckLookup(document, key, warnings);
     }
