@@ -84,22 +84,28 @@ void CheckMatches(const Trail& trail, const std::string& key, Warnings& warnings
 /** The elements on a level whose order matters to a condition. */
 struct Order
 {
-    const TrailStep* other = nullptr;    ///< would suspend the condition if it came first
-    const TrailStep* rejected = nullptr; ///< would then be taken
-    const TrailStep* taken = nullptr;    ///< is taken like that as the file stands
+    const TrailStep* other = nullptr;     ///< would suspend the condition if it came first
+    const TrailStep* rejected = nullptr;  ///< would then be taken
+    const TrailStep* taken = nullptr;     ///< is taken like that as the file stands
+    const TrailStep* suspender = nullptr; ///< suspended the condition for it
 };
 
 Order OrderOf(const TrailLevel& level)
 {
     Order order;
+    const TrailStep* suspender = nullptr; // of the step that is looked at
     for (const TrailStep& step : level.steps)
     {
         const bool isOther = step.verdict == Verdict::OtherName;
         const bool isRejected = step.verdict == Verdict::Rejected;
-        const bool isTaken = step.suspended && !Fulfils(step.element, step.condition);
         order.other = isOther && order.other == nullptr ? &step : order.other;
         order.rejected = isRejected && order.rejected == nullptr ? &step : order.rejected;
-        order.taken = isTaken && order.taken == nullptr ? &step : order.taken;
+        if (step.suspended && order.taken == nullptr && !Fulfils(step.element, step.condition))
+        {
+            order.taken = &step;
+            order.suspender = suspender;
+        }
+        suspender = !isOther ? nullptr : suspender != nullptr ? suspender : &step;
     }
     return order;
 }
@@ -113,18 +119,20 @@ void CheckOrder(const TrailLevel& level, Warnings& warnings)
     }
     const std::string segment =
         Quoted(Text(level.steps.front().name) + "@" + Text(level.steps.front().condition));
-    const std::string other = warnings.Place(order.other->element);
     if (order.taken != nullptr)
     {
-        warnings.Warn(order.taken->element, "suspended condition",
-                      warnings.LocationOf(order.taken->element) + " is taken for " + segment +
-                          " though it does not fulfil it: " + other + " suspends the condition");
+        warnings.Warn(
+            order.taken->element, "suspended condition",
+            warnings.LocationOf(order.taken->element) + " is taken for " + segment +
+                " though it does not fulfil it: " + warnings.Place(order.suspender->element) +
+                ", of another name and in front of it, suspends the condition");
     }
     else if (order.rejected != nullptr && warnings.IsNew(level.parent, level.steps.front().name))
     {
         warnings.Warn(order.rejected->element, "condition depends on order",
                       warnings.LocationOf(order.rejected->element) + " would be taken for " +
-                          segment + " if " + other + ", of another name, came right before it");
+                          segment + " if " + warnings.Place(order.other->element) +
+                          ", of another name, came right before it");
     }
 }
 
