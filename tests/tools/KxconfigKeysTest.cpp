@@ -123,6 +123,20 @@ TEST_F(KxconfigKeys, PrintsAKeyThatCannotTellOnceWithAllItsValues)
     EXPECT_EQ("cfg.a\t\"1\\n2\"\n", Keys("<cfg><a x='1.5'>1</a><a x='2|3'>2</a></cfg>"));
 }
 
+TEST_F(KxconfigKeys, ShowsNoControlCharactersToATerminal)
+{
+    // U+009B starts a command to a terminal, as ESC [ does; the letters around it stay.
+    EXPECT_EQ("cfg.a\t\"x\\xc2\\x9b31m\xC2\xA0\xC3\xA4\\x7f\\x0d\"\n",
+              Keys("<cfg><a>x&#x9B;31m&#xA0;&#xE4;&#x7F;&#13;</a></cfg>"));
+}
+
+TEST_F(KxconfigKeys, PrintsTheTextOfAnyEncodingInUtf8)
+{
+    EXPECT_EQ("cfg.a\t\"gr\xC3\xBCn\"\n",
+              Keys("<?xml version='1.0' encoding='ISO-8859-1'?><cfg><a>gr\xFCn</a></cfg>"));
+    EXPECT_EQ("cfg.a\t\"1\"\n", Keys("\xEF\xBB\xBF<cfg><a>1</a></cfg>"));
+}
+
 TEST_F(KxconfigKeys, LeavesOutNamesThatAKeyCannotHold)
 {
     EXPECT_EQ("cfg.b\t\"2\"\n", Keys("<cfg><a.x>1</a.x><b>2</b></cfg>"));

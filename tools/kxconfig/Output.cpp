@@ -53,6 +53,23 @@ std::string Written(const Json& json)
     return json.dump(2, ' ', false, Json::error_handler_t::replace);
 }
 
+std::string Escaped(unsigned char byte)
+{
+    const char* const digits = "0123456789abcdef";
+    return {'\\', 'x', digits[byte >> 4], digits[byte & 0xF]};
+}
+
+/** @return whether one of U+0080 to U+009F stands at @p position: terminals obey them too. */
+bool IsControlOfTwoBytes(const std::string& text, size_t position)
+{
+    if (text[position] != '\xC2' || position + 1 == text.size())
+    {
+        return false;
+    }
+    const auto second = static_cast<unsigned char>(text[position + 1]);
+    return second >= 0x80 && second <= 0x9F;
+}
+
 } // namespace
 
 void AnswerInJson()
@@ -123,22 +140,25 @@ std::string Painted(Colour colour, const std::string& text)
 
 std::string OnOneLine(const std::string& text)
 {
-    const char* const digits = "0123456789abcdef";
     std::string line;
-    for (const char c : text)
+    for (size_t i = 0; i != text.size(); ++i)
     {
-        const auto byte = static_cast<unsigned char>(c);
-        if (c == '\n')
+        const auto byte = static_cast<unsigned char>(text[i]);
+        if (text[i] == '\n')
         {
             line += "\\n";
         }
         else if (byte < 0x20 || byte == 0x7F)
         {
-            line += {'\\', 'x', digits[byte >> 4], digits[byte & 0xF]};
+            line += Escaped(byte);
+        }
+        else if (IsControlOfTwoBytes(text, i))
+        {
+            line += Escaped(byte) + Escaped(static_cast<unsigned char>(text[++i]));
         }
         else
         {
-            line += c;
+            line += text[i];
         }
     }
     return line;
