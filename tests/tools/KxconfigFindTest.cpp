@@ -87,6 +87,9 @@ TEST_F(KxconfigFind, PrintsThePrefixOfAnAttribute)
 {
     const std::string file = m_folder.Write("prefix.xml", "<a xmlns:p='urn:p' p:id='1' id='2'/>");
     EXPECT_EQ("/a element p:id=\"1\" id=\"2\"\n", Tool({"find", file, "/a"}).out);
+    const nlohmann::json answer = nlohmann::json::parse(Tool({"--json", "find", file, "/a"}).out);
+    const nlohmann::json attributes = {{"p:id", "1"}, {"id", "2"}};
+    EXPECT_EQ(attributes, answer.at("results")[0].at("attributes"));
 }
 
 TEST_F(KxconfigFind, BlamesTheExpressionAndNotTheFile)

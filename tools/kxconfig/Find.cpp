@@ -51,6 +51,12 @@ std::string LocationOfNamespace(const xmlNs* space, Locations& locations)
     return locations.Of(element) + "/namespace::" + prefix;
 }
 
+std::string NameWithPrefix(const xmlAttr* attribute)
+{
+    const bool hasPrefix = attribute->ns != nullptr && attribute->ns->prefix != nullptr;
+    return (hasPrefix ? Text(attribute->ns->prefix) + ":" : "") + Text(attribute->name);
+}
+
 std::string Attributes(const xmlNode* element)
 {
     std::string attributes;
@@ -58,9 +64,7 @@ std::string Attributes(const xmlNode* element)
          attribute = attribute->next)
     {
         const auto node = reinterpret_cast<const xmlNode*>(attribute);
-        const bool hasPrefix = attribute->ns != nullptr && attribute->ns->prefix != nullptr;
-        const std::string prefix = hasPrefix ? Text(attribute->ns->prefix) + ":" : "";
-        attributes += " " + prefix + Text(attribute->name) + "=" + Quoted(ContentOf(node));
+        attributes += " " + NameWithPrefix(attribute) + "=" + Quoted(ContentOf(node));
     }
     return attributes;
 }
@@ -97,7 +101,8 @@ Json AttributesInJson(const xmlNode* element)
     for (const xmlAttr* attribute = element->properties; attribute != nullptr;
          attribute = attribute->next)
     {
-        attributes[Text(attribute->name)] = ContentOf(reinterpret_cast<const xmlNode*>(attribute));
+        attributes[NameWithPrefix(attribute)] =
+            ContentOf(reinterpret_cast<const xmlNode*>(attribute));
     }
     return attributes;
 }
