@@ -165,15 +165,15 @@ TEST_F(KxconfigFind, GivesLongNamesWhole)
 TEST_F(KxconfigFind, NeedsNoTimeWorthMentioningForManyNodes)
 {
     std::string xml = "<cfg>";
-    for (int i = 0; i != 100000; ++i)
+    for (int i = 0; i != 50000; ++i)
     {
         xml += "<a/>";
     }
     const std::string file = m_folder.Write("many.xml", xml + "</cfg>");
     const auto start = std::chrono::steady_clock::now();
     const Outcome outcome = Tool({"find", file, "//a"});
-    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(30));
-    EXPECT_THAT(outcome.out, testing::EndsWith("/cfg/a[100000] element\n"));
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(20));
+    EXPECT_THAT(outcome.out, testing::EndsWith("/cfg/a[50000] element\n"));
 }
 
 TEST_F(KxconfigFind, SaysWhatWasNotFound)

@@ -136,7 +136,14 @@ int PrintNodes(const xmlNodeSet* nodes)
     for (int i = 0; i < count; ++i)
     {
         const xmlNode* const node = nodes->nodeTab[i];
-        Print(Line(node, locations), InJson(node, locations));
+        if (AnswersInJson())
+        {
+            PrintResult(InJson(node, locations));
+        }
+        else
+        {
+            PrintLine(Line(node, locations));
+        }
     }
     return count;
 }

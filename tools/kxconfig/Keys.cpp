@@ -19,7 +19,14 @@ ExitStatus Keys(const std::string& file)
     {
         // More than one element's where a key cannot tell.
         const std::string value = values.Under(key);
-        Print(key + '\t' + Quoted(value), {{"key", key}, {"value", value}});
+        if (AnswersInJson())
+        {
+            PrintResult({{"key", key}, {"value", value}});
+        }
+        else
+        {
+            PrintLine(key + '\t' + Quoted(value));
+        }
     }
     if (keys.empty())
     {

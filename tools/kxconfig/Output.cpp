@@ -77,6 +77,11 @@ void AnswerInJson()
     g_inJson = true;
 }
 
+bool AnswersInJson()
+{
+    return g_inJson;
+}
+
 void AnswerFor(const std::string& verb, const std::string& file)
 {
     g_answer["file"] = file;
