@@ -56,10 +56,18 @@ TEST_F(KxconfigCheck, WarnsOfAConditionThatIsSuspended)
 {
     Write("<cfg>\n<z/>\n<a i=\"1\">1</a>\n<a i=\"2\">2</a></cfg>");
     ExpectWarnings({"4: /cfg/a[1] is taken for \"a@i=2\" though it does not fulfil it: /cfg/z "
-                    "(line 3) suspends the condition",
+                    "(line 3), of another name and in front of it, suspends the condition",
                     "5: /cfg/a[2] would be taken for \"a@i=1\" if /cfg/z (line 3), of another "
                     "name, came right before it",
                     "5: \"cfg.a@i=2\" matches 2 elements, the first of them /cfg/a[1] (line 4)"});
+}
+
+TEST_F(KxconfigCheck, NamesTheElementThatSuspendsTheCondition)
+{
+    // The first of another name suspends the condition only for one that fulfils it anyway.
+    Write("<cfg>\n<z/>\n<a i=\"1\">1</a>\n<a i=\"2\"/>\n<y/>\n<x/>\n<a i=\"3\"/></cfg>");
+    ExpectWarnings({"8: /cfg/a[3] is taken for \"a@i=1\" though it does not fulfil it: /cfg/y "
+                    "(line 6), of another name and in front of it, suspends the condition"});
 }
 
 TEST_F(KxconfigCheck, WarnsOncePerLevelOfConditionsThatDependOnTheOrder)
@@ -136,7 +144,35 @@ TEST_F(KxconfigCheck, TellsWhatSavingChangesFirst)
             "\"A</a></cfg>\""});
     expect(kDeclaration + "<cfg>\r\n</cfg>\n",
            {"2: saving changes line ends (carriage returns): \"\\x0d\" becomes \"\""});
-    expect(kDeclaration + "<cfg/>", {"2: saving changes the end of the file: \"\" becomes \"\""});
+    expect(kDeclaration + "<cfg/>", {"2: saving changes the end of the file: \"\\n\" is added"});
+    expect(kDeclaration + "<cfg/>\n\n", {"3: saving changes the end of the file: \"\\n\" is lost"});
+}
+
+TEST_F(KxconfigCheck, TellsOfAFileOfOtherBytesThanItsCharacters)
+{
+    std::string utf16 = "\xFF\xFE";
+    for (const char c : std::string("<cfg/>\n"))
+    {
+        utf16 += {c, '\0'};
+    }
+    m_file = m_folder.Write("cfg.xml", utf16);
+    ExpectWarnings({"1: saving changes every character: UTF-16 becomes UTF-8"});
+}
+
+TEST_F(KxconfigCheck, TellsThatACompressedFileIsSavedPlain)
+{
+    const std::string plain = m_folder.Write("cfg.xml", kDeclaration + "<cfg/>\n");
+    if (RunShell("gzip " + plain).status != 0)
+    {
+        GTEST_SKIP() << "needs gzip";
+    }
+    m_file = plain + ".gz";
+    if (Tool({"get", m_file, "cfg.a"}).status == 3)
+    {
+        GTEST_SKIP() << "needs an engine that reads compressed files";
+    }
+    ExpectWarnings(
+        {"1: saving changes the whole file, which is compressed: it is saved as plain text"});
 }
 
 TEST_F(KxconfigCheck, LeavesTheFileAlone)

@@ -1,6 +1,11 @@
 #include "ToolTest.h"
 
+#include <libxml/parser.h>
+#include <libxml/tree.h>
+#include <nlohmann/json.hpp>
+
 #include <algorithm>
+#include <chrono>
 
 using namespace kxtest;
 
@@ -22,6 +27,39 @@ protected:
         return outcome.out;
     }
 };
+
+/** Adds the paths that the engine gives @p node, its attributes and what is below it. */
+void AddPaths(xmlNode* node, std::vector<std::string>& paths)
+{
+    const auto add = [&paths](const void* any)
+    {
+        xmlChar* const path = xmlGetNodePath(static_cast<xmlNode*>(const_cast<void*>(any)));
+        paths.emplace_back(reinterpret_cast<const char*>(path));
+        xmlFree(path);
+    };
+    add(node);
+    const bool isElement = node->type == XML_ELEMENT_NODE;
+    for (xmlAttr* attribute = isElement ? node->properties : nullptr; attribute != nullptr;
+         attribute = attribute->next)
+    {
+        add(attribute);
+    }
+    for (xmlNode* child = isElement || node->type == XML_DOCUMENT_NODE ? node->children : nullptr;
+         child != nullptr; child = child->next)
+    {
+        AddPaths(child, paths);
+    }
+}
+
+/** @return the engine's paths of all nodes of @p file, which has no DTD, in document order. */
+std::vector<std::string> PathsOfTheEngine(const std::string& file)
+{
+    xmlDoc* const document = xmlParseFile(file.c_str());
+    std::vector<std::string> paths;
+    AddPaths(reinterpret_cast<xmlNode*>(document), paths);
+    xmlFreeDoc(document);
+    return paths;
+}
 
 } // namespace
 
@@ -49,6 +87,9 @@ TEST_F(KxconfigFind, PrintsThePrefixOfAnAttribute)
 {
     const std::string file = m_folder.Write("prefix.xml", "<a xmlns:p='urn:p' p:id='1' id='2'/>");
     EXPECT_EQ("/a element p:id=\"1\" id=\"2\"\n", Tool({"find", file, "/a"}).out);
+    const nlohmann::json answer = nlohmann::json::parse(Tool({"--json", "find", file, "/a"}).out);
+    const nlohmann::json attributes = {{"p:id", "1"}, {"id", "2"}};
+    EXPECT_EQ(attributes, answer.at("results")[0].at("attributes"));
 }
 
 TEST_F(KxconfigFind, BlamesTheExpressionAndNotTheFile)
@@ -84,6 +125,55 @@ TEST_F(KxconfigFind, PrintsMoreThan255Nodes)
     EXPECT_EQ(0, outcome.status);
     EXPECT_EQ(1000, std::count(outcome.out.begin(), outcome.out.end(), '\n'));
     EXPECT_THAT(outcome.out, testing::EndsWith("/cfg/a[1000] element\n"));
+}
+
+TEST_F(KxconfigFind, GivesTheLocationsOfTheEngine)
+{
+    const std::string file = m_folder.Write(
+        "all.xml", "<!--c--><?pi?><!--d--><cfg xmlns:p='urn:p' xmlns:q='urn:p' a='1' p:a='2'>"
+                   "t<![CDATA[u]]><e/>v<!--c--><e i='1'/><p:e/><q:e/><p:e xmlns:p='urn:r'/><!--c-->"
+                   "<e xmlns='urn:d'><f/><g/><f xmlns=''/><p:f/></e><h><e xmlns='urn:d'/></h>"
+                   "<?pi?><?po?><?pi?><k><l/>only</k><k><l/><m/><l/></k><m/></cfg><!--e-->");
+    const Outcome outcome = Tool({"--json", "find", file, "/ | //node() | //@*"});
+    const nlohmann::json answer = nlohmann::json::parse(outcome.out);
+    std::vector<std::string> locations;
+    for (const nlohmann::json& result : answer.at("results"))
+    {
+        locations.push_back(result.at("location"));
+    }
+    EXPECT_EQ(PathsOfTheEngine(file), locations);
+}
+
+TEST_F(KxconfigFind, TellsAPrefixWithoutANamespaceFromOneWithIt)
+{
+    // To the engine the undeclared prefix is a part of the name.
+    const std::string file =
+        m_folder.Write("undeclared.xml", "<a><p:b/><c xmlns:p='urn:p'><p:b/></c><p:b/></a>");
+    EXPECT_EQ("/a/p:b[1] element\n/a/c/p:b element\n/a/p:b[2] element\n",
+              Tool({"find", file, "//*[contains(name(), 'b')]"}).out);
+}
+
+TEST_F(KxconfigFind, GivesLongNamesWhole)
+{
+    const std::string name(600, 'n');
+    const std::string file =
+        m_folder.Write("long.xml", "<a xmlns:p='urn:p'><p:" + name + "/><" + name + "/></a>");
+    EXPECT_EQ("/a/p:" + name + " element\n/a/" + name + " element\n",
+              Tool({"find", file, "/a/*"}).out);
+}
+
+TEST_F(KxconfigFind, NeedsNoTimeWorthMentioningForManyNodes)
+{
+    std::string xml = "<cfg>";
+    for (int i = 0; i != 50000; ++i)
+    {
+        xml += "<a/>";
+    }
+    const std::string file = m_folder.Write("many.xml", xml + "</cfg>");
+    const auto start = std::chrono::steady_clock::now();
+    const Outcome outcome = Tool({"find", file, "//a"});
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(20));
+    EXPECT_THAT(outcome.out, testing::EndsWith("/cfg/a[50000] element\n"));
 }
 
 TEST_F(KxconfigFind, SaysWhatWasNotFound)

@@ -81,7 +81,10 @@ TEST_F(KxconfigGet, RefusesBadUsage)
 {
     ExpectComplaint(Tool({}), 2,
                     "a command is required: get, set, explain, check, keys or find" + kUsage);
-    ExpectComplaint(Tool({"frobnicate"}), 2,
+    ExpectComplaint(Tool({"frobnicate"}), 2, "unknown command \"frobnicate\"" + kUsage);
+    ExpectComplaint(Tool({"frobnicate", kGateway, "a.b"}), 2,
+                    "unknown command \"frobnicate\"" + kUsage);
+    ExpectComplaint(Tool({"get", kGateway, "a.b", "frobnicate"}), 2,
                     "The following argument was not expected: frobnicate" + kUsage);
     ExpectComplaint(Tool({"--frobnicate"}), 2,
                     "The following argument was not expected: --frobnicate" + kUsage);

@@ -1,5 +1,12 @@
 #include "ToolTest.h"
 
+#include "CXMLReader.h"
+
+#include <nlohmann/json.hpp>
+
+#include <chrono>
+#include <random>
+#include <set>
 #include <sstream>
 
 using namespace kxtest;
@@ -17,6 +24,69 @@ protected:
         EXPECT_EQ("", outcome.err);
         return outcome.out;
     }
+
+    /** Expects each key once, and with it exactly what the library gives for it. @return their
+     * number. */
+    static int ExpectValuesOfTheLibrary(const std::string& file)
+    {
+        const nlohmann::json answer = nlohmann::json::parse(Tool({"--json", "keys", file}).out);
+        CXMLReader reader(file);
+        std::set<std::string> keys;
+        for (const nlohmann::json& result : answer.at("results"))
+        {
+            const std::string key = result.at("key");
+            EXPECT_TRUE(keys.insert(key).second) << key;
+            std::string value;
+            EXPECT_EQ(0, reader.GetValue(key, value)) << key;
+            EXPECT_EQ(value, result.at("value").get<std::string>()) << key;
+        }
+        return static_cast<int>(keys.size());
+    }
+};
+
+/** Makes small documents in which names repeat, attributes do and do not tell, and orders vary. */
+class RandomDocument
+{
+public:
+    explicit RandomDocument(unsigned seed) : m_random(seed) {}
+
+    std::string Make()
+    {
+        return "<!DOCTYPE cfg [<!ATTLIST a i CDATA '3'><!ATTLIST b p:i CDATA '1' j CDATA '2'>]>"
+               "<cfg xmlns:p='urn:p'>" +
+               Elements(3) + "</cfg>";
+    }
+
+private:
+    std::string OneOf(const std::vector<std::string>& choices)
+    {
+        return choices[m_random() % choices.size()];
+    }
+
+    std::string Elements(int depth)
+    {
+        std::string elements;
+        for (auto count = 1 + m_random() % 6; count != 0; --count)
+        {
+            elements += Element(depth) + OneOf({"", "", "", "<!--c-->", "t", "<?p i?>"});
+        }
+        return elements;
+    }
+
+    std::string Element(int depth)
+    {
+        const std::string name = OneOf({"a", "a", "b", "p:a", "u:a", "c.d"});
+        const std::string attributes = OneOf({"", " i='1'", " i='2'", " i=''", " i='x.y'"}) +
+                                       OneOf({"", " p:i='1'", " p:i='4'"}) +
+                                       OneOf({"", " j='1'", " j='2'", " j='a=b@c'", " j='1|2'"});
+        const std::string content =
+            depth == 0 || m_random() % 3 == 0
+                ? OneOf({"v", "w", "x\ny", " ", "", "<![CDATA[z]]>", "v<!--c-->w"})
+                : Elements(depth - 1);
+        return "<" + name + attributes + ">" + content + "</" + name + ">";
+    }
+
+    std::mt19937 m_random;
 };
 
 } // namespace
@@ -53,6 +123,20 @@ TEST_F(KxconfigKeys, PrintsAKeyThatCannotTellOnceWithAllItsValues)
     EXPECT_EQ("cfg.a\t\"1\\n2\"\n", Keys("<cfg><a x='1.5'>1</a><a x='2|3'>2</a></cfg>"));
 }
 
+TEST_F(KxconfigKeys, ShowsNoControlCharactersToATerminal)
+{
+    // U+009B starts a command to a terminal, as ESC [ does; the letters around it stay.
+    EXPECT_EQ("cfg.a\t\"x\\xc2\\x9b31m\xC2\xA0\xC3\xA4\\x7f\\x0d\"\n",
+              Keys("<cfg><a>x&#x9B;31m&#xA0;&#xE4;&#x7F;&#13;</a></cfg>"));
+}
+
+TEST_F(KxconfigKeys, PrintsTheTextOfAnyEncodingInUtf8)
+{
+    EXPECT_EQ("cfg.a\t\"gr\xC3\xBCn\"\n",
+              Keys("<?xml version='1.0' encoding='ISO-8859-1'?><cfg><a>gr\xFCn</a></cfg>"));
+    EXPECT_EQ("cfg.a\t\"1\"\n", Keys("\xEF\xBB\xBF<cfg><a>1</a></cfg>"));
+}
+
 TEST_F(KxconfigKeys, LeavesOutNamesThatAKeyCannotHold)
 {
     EXPECT_EQ("cfg.b\t\"2\"\n", Keys("<cfg><a.x>1</a.x><b>2</b></cfg>"));
@@ -82,6 +166,64 @@ TEST_F(KxconfigKeys, WhatItPrintsCanBeGivenToGet)
         }
         EXPECT_GE(keys, 4);
     }
+}
+
+TEST_F(KxconfigKeys, GivesWhatTheLibraryGivesForEveryKey)
+{
+    int keys = 0;
+    for (unsigned seed = 1; seed != 61; ++seed)
+    {
+        const std::string xml = RandomDocument(seed).Make();
+        SCOPED_TRACE(xml);
+        keys += ExpectValuesOfTheLibrary(m_folder.Write("random.xml", xml));
+    }
+    EXPECT_GT(keys, 600);
+}
+
+TEST_F(KxconfigKeys, TakesTheTextsOnTheWayToAnElement)
+{
+    // The first a holds a text and ends the way there; a lookup gives it all the same.
+    EXPECT_EQ("cfg.a\t\"1\"\ncfg.a.b\t\"1\\n2\"\n", Keys("<cfg><a>1</a><a><b>2</b></a></cfg>"));
+}
+
+TEST_F(KxconfigKeys, TellsApartByAnAttributeWithAPrefix)
+{
+    // A condition finds it by its name without the prefix.
+    EXPECT_EQ("cfg.a@i=1\t\"x\"\ncfg.a@i=2\t\"y\"\n",
+              Keys("<cfg xmlns:p='urn:p'><a p:i='1'>x</a><a p:i='2'>y</a></cfg>"));
+    // Of two with that name it finds the first.
+    EXPECT_EQ("cfg.a@i=1\t\"x\"\ncfg.a@i=3\t\"y\"\n",
+              Keys("<cfg xmlns:p='urn:p'><a p:i='1' i='2'>x</a><a i='3' p:i='1'>y</a></cfg>"));
+}
+
+TEST_F(KxconfigKeys, TellsApartByTheDefaultOfAnAttribute)
+{
+    EXPECT_EQ("cfg.a@i=1\t\"x\"\ncfg.a@i=2\t\"y\"\n",
+              Keys("<!DOCTYPE cfg [<!ATTLIST a i CDATA '1'>]>"
+                   "<cfg><a>x</a><a i='2'>y</a></cfg>"));
+    // A default that another element bears as its own tells neither.
+    EXPECT_EQ("cfg.a\t\"x\\ny\\nz\"\ncfg.a@i=2\t\"z\"\n",
+              Keys("<!DOCTYPE cfg [<!ATTLIST a i CDATA '1'>]>"
+                   "<cfg><a>x</a><a i='1'>y</a><a i='2'>z</a></cfg>"));
+    EXPECT_EQ("cfg.a\t\"x\\ny\"\n", Keys("<!DOCTYPE cfg [<!ATTLIST a i CDATA #IMPLIED>]>"
+                                         "<cfg><a>x</a><a>y</a></cfg>"));
+}
+
+TEST_F(KxconfigKeys, NeedsNoTimeWorthMentioningForManyElements)
+{
+    // The element in front suspends the condition for the first net: no key is free of it. Looking
+    // each key up would take minutes.
+    std::string xml = "<cfg><name>box</name>";
+    for (int i = 0; i != 20000; ++i)
+    {
+        xml += "<net id='" + std::to_string(i) + "'><ip>x</ip></net>";
+    }
+    const std::string file = m_folder.Write("many.xml", xml + "</cfg>");
+    const auto start = std::chrono::steady_clock::now();
+    const Outcome outcome = Tool({"keys", file});
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(30));
+    EXPECT_EQ(0, outcome.status);
+    EXPECT_THAT(outcome.out, testing::EndsWith("\ncfg.net@id=19999.ip\t\"x\\nx\"\n"));
 }
 
 TEST_F(KxconfigKeys, SaysThatThereIsNone)

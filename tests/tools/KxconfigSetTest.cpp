@@ -37,11 +37,38 @@ protected:
         EXPECT_EQ(1, FilesInFolder());
     }
 
+    /**
+     * Sets the second net's ip to "x" while somebody else runs @p change, a script of the shell,
+     * after the file is loaded and before it is saved.
+     *
+     * The tool is asked for the record of the key, which is longer than a pipe can hold. So when
+     * the first byte comes out the file is loaded, and the tool waits until the rest is read.
+     */
+    Outcome SetWhile(const std::string& change, const std::string& options = "") const
+    {
+        const std::string key = "cfg.net@id=2|id=" + std::string(100000, 'x') + ".ip";
+        const std::string pipe = m_pipes.Path("pipe");
+        return RunShell("mkfifo " + pipe + "; " + InShell(KX_CONFIG_TOOL) +
+                        " --log-mask value set " + options + " " + m_file + " '" + key + "' x 2>" +
+                        pipe + " & exec 3<" + pipe + "; read -r -N 1 -u 3; " + change +
+                        "; cat <&3 >&2; wait $!");
+    }
+
+    void ExpectNotSaved(const Outcome& outcome) const
+    {
+        EXPECT_EQ(4, outcome.status);
+        EXPECT_EQ("", outcome.out);
+        EXPECT_THAT(outcome.err, testing::EndsWith("\nkxconfig: not saved: " + m_file +
+                                                   " was changed by somebody else meanwhile\n"));
+    }
+
     long FilesInFolder() const
     {
         const std::filesystem::directory_iterator files(m_folder.Path(""));
         return std::distance(begin(files), end(files));
     }
+
+    const TemporaryFolder m_pipes;
 };
 
 } // namespace
@@ -281,6 +308,46 @@ TEST_F(KxconfigSet, DoesNotTakeAFileFromItsGroup)
     EXPECT_EQ(4,
               RunProgram({KX_CONFIG_TOOL, "set", m_file, "cfg.name", "crate"}, {}, 65534).status);
     ExpectUntouched();
+}
+
+TEST_F(KxconfigSet, SavesAfterAWaitInWhichNothingHappens)
+{
+    const Outcome outcome = SetWhile("true");
+    EXPECT_EQ(0, outcome.status);
+    EXPECT_EQ("/cfg/net[2]/ip: \"b\" -> \"x\"\n", outcome.out);
+    EXPECT_THAT(ReadFile(m_file), testing::HasSubstr("<ip>x</ip>"));
+}
+
+TEST_F(KxconfigSet, DoesNotOverwriteWhatSomebodyElseWroteMeanwhile)
+{
+    const std::string theirs = "<cfg><net id='1'><ip>theirs</ip></net></cfg>";
+    ExpectNotSaved(SetWhile("printf %s \"" + theirs + "\" >" + m_file));
+    EXPECT_EQ(theirs, ReadFile(m_file));
+    EXPECT_EQ(1, FilesInFolder());
+}
+
+TEST_F(KxconfigSet, DoesNotReplaceAFileThatSomebodyElseReplacedMeanwhile)
+{
+    // Of the same size and of the same time: only the file is another.
+    const std::string theirs = m_folder.Path("theirs");
+    ExpectNotSaved(SetWhile("sed s/box/fox/ " + m_file + " >" + theirs + "; touch -r " + m_file +
+                            " " + theirs + "; mv " + theirs + " " + m_file));
+    EXPECT_THAT(ReadFile(m_file), testing::HasSubstr("<name>fox</name>"));
+    EXPECT_EQ(1, FilesInFolder());
+}
+
+TEST_F(KxconfigSet, DoesNotBringBackAFileThatSomebodyElseRemovedMeanwhile)
+{
+    ExpectNotSaved(SetWhile("rm " + m_file));
+    EXPECT_EQ(0, FilesInFolder());
+}
+
+TEST_F(KxconfigSet, SavesElsewhereWhateverHappensToTheFile)
+{
+    const std::string copy = m_folder.Path("copy.xml");
+    EXPECT_EQ(0, SetWhile("echo >" + m_file, "--output " + copy).status);
+    EXPECT_EQ("\n", ReadFile(m_file));
+    EXPECT_THAT(ReadFile(copy), testing::HasSubstr("<ip>x</ip>"));
 }
 
 TEST_F(KxconfigSet, FollowsALinkToAFileThatIsYetToBe)

@@ -1,6 +1,7 @@
 #include "Commands.h"
 #include "Document.h"
 #include "KeyList.h"
+#include "Locations.h"
 #include "Nodes.h"
 #include "Output.h"
 #include "RoundTrip.h"
@@ -35,6 +36,13 @@ public:
         return m_levels.emplace(level, Text(name)).second;
     }
 
+    std::string LocationOf(const xmlNode* node) { return m_locations.Of(node); }
+
+    std::string Place(const xmlNode* node)
+    {
+        return LocationOf(node) + " (line " + LineOf(node) + ")";
+    }
+
     /** Prints them by line. @return whether there are any. */
     bool PrintFor(const std::string& file) const
     {
@@ -54,15 +62,11 @@ private:
         std::string text;
     };
 
+    Locations m_locations;
     std::multimap<long, Warning> m_byLine;
     std::set<std::string> m_texts;
     std::set<std::pair<const xmlNode*, std::string>> m_levels;
 };
-
-std::string Place(const xmlNode* node)
-{
-    return LocationOf(node) + " (line " + LineOf(node) + ")";
-}
 
 // Keys: what a lookup finds, and what it would find if the elements stood in another order.
 
@@ -73,29 +77,35 @@ void CheckMatches(const Trail& trail, const std::string& key, Warnings& warnings
     {
         warnings.Warn(found[1]->element, "ambiguous key",
                       Quoted(key) + " matches " + std::to_string(found.size()) +
-                          " elements, the first of them " + Place(found[0]->element));
+                          " elements, the first of them " + warnings.Place(found[0]->element));
     }
 }
 
 /** The elements on a level whose order matters to a condition. */
 struct Order
 {
-    const TrailStep* other = nullptr;    ///< would suspend the condition if it came first
-    const TrailStep* rejected = nullptr; ///< would then be taken
-    const TrailStep* taken = nullptr;    ///< is taken like that as the file stands
+    const TrailStep* other = nullptr;     ///< would suspend the condition if it came first
+    const TrailStep* rejected = nullptr;  ///< would then be taken
+    const TrailStep* taken = nullptr;     ///< is taken like that as the file stands
+    const TrailStep* suspender = nullptr; ///< suspended the condition for it
 };
 
 Order OrderOf(const TrailLevel& level)
 {
     Order order;
+    const TrailStep* suspender = nullptr; // of the step that is looked at
     for (const TrailStep& step : level.steps)
     {
         const bool isOther = step.verdict == Verdict::OtherName;
         const bool isRejected = step.verdict == Verdict::Rejected;
-        const bool isTaken = step.suspended && !Fulfils(step.element, step.condition);
         order.other = isOther && order.other == nullptr ? &step : order.other;
         order.rejected = isRejected && order.rejected == nullptr ? &step : order.rejected;
-        order.taken = isTaken && order.taken == nullptr ? &step : order.taken;
+        if (step.suspended && order.taken == nullptr && !Fulfils(step.element, step.condition))
+        {
+            order.taken = &step;
+            order.suspender = suspender;
+        }
+        suspender = !isOther ? nullptr : suspender != nullptr ? suspender : &step;
     }
     return order;
 }
@@ -109,18 +119,20 @@ void CheckOrder(const TrailLevel& level, Warnings& warnings)
     }
     const std::string segment =
         Quoted(Text(level.steps.front().name) + "@" + Text(level.steps.front().condition));
-    const std::string other = Place(order.other->element);
     if (order.taken != nullptr)
     {
-        warnings.Warn(order.taken->element, "suspended condition",
-                      LocationOf(order.taken->element) + " is taken for " + segment +
-                          " though it does not fulfil it: " + other + " suspends the condition");
+        warnings.Warn(
+            order.taken->element, "suspended condition",
+            warnings.LocationOf(order.taken->element) + " is taken for " + segment +
+                " though it does not fulfil it: " + warnings.Place(order.suspender->element) +
+                ", of another name and in front of it, suspends the condition");
     }
     else if (order.rejected != nullptr && warnings.IsNew(level.parent, level.steps.front().name))
     {
         warnings.Warn(order.rejected->element, "condition depends on order",
-                      LocationOf(order.rejected->element) + " would be taken for " + segment +
-                          " if " + other + ", of another name, came right before it");
+                      warnings.LocationOf(order.rejected->element) + " would be taken for " +
+                          segment + " if " + warnings.Place(order.other->element) +
+                          ", of another name, came right before it");
     }
 }
 
@@ -174,15 +186,15 @@ void CheckVisible(const xmlNode* element, Warnings& warnings)
     {
         warnings.Warn(
             element, "unreachable element",
-            LocationOf(element) +
+            warnings.LocationOf(element) +
                 " cannot be named by a key: its name holds a \".\", which ends a segment");
     }
     const std::string text = OwnText(element);
     if (OnlyTextOf(element) == nullptr && !text.empty())
     {
         warnings.Warn(element, "invisible value",
-                      LocationOf(element) + " has no value though it holds " + Quoted(text) + ": " +
-                          WhyNoValue(element));
+                      warnings.LocationOf(element) + " has no value though it holds " +
+                          Quoted(text) + ": " + WhyNoValue(element));
     }
 }
 
@@ -235,8 +247,8 @@ void CheckGroup(const Group& group, Warnings& warnings)
         if (!bearer.second)
         {
             warnings.Warn(element, "repeated attribute",
-                          LocationOf(element) + " has the same " + telling + "=" + Quoted(value) +
-                              " as " + Place(bearer.first->second));
+                          warnings.LocationOf(element) + " has the same " + telling + "=" +
+                              Quoted(value) + " as " + warnings.Place(bearer.first->second));
         }
     }
 }
@@ -292,7 +304,8 @@ ExitStatus Check(const std::string& file, const std::vector<std::string>& keys)
     }
     const auto document = static_cast<xmlDoc*>(reader->GetDataPtr());
     Warnings warnings;
-    for (const std::string& key : keys.empty() ? ListKeys(RootOf(*reader)) : keys)
+    Levels levels(document);
+    for (const std::string& key : keys.empty() ? ListKeys(RootOf(*reader), levels) : keys)
     {
         CheckLookup(document, key, warnings);
     }

@@ -1,5 +1,6 @@
 #include "Commands.h"
 #include "Document.h"
+#include "Locations.h"
 #include "Nodes.h"
 #include "Output.h"
 #include "Trail.h"
@@ -88,11 +89,11 @@ const char* VerdictInJson(const TrailStep& step)
     }
 }
 
-Json StepInJson(const TrailStep& step)
+Json StepInJson(const TrailStep& step, const std::string& location)
 {
     Json result = {{"event", "element"},
                    {"line", LineNumberOf(step.element)},
-                   {"location", LocationOf(step.element)},
+                   {"location", location},
                    {"sought", SoughtInJson(step)},
                    {"verdict", VerdictInJson(step)},
                    {"terms", TermsInJson(step)},
@@ -138,7 +139,7 @@ public:
 private:
     void TellStart(const TrailLevel& level, int depth)
     {
-        std::string line = "below " + LocationOf(level.parent) + ": ";
+        std::string line = "below " + m_locations.Of(level.parent) + ": ";
         if (level.keyEnds)
         {
             line += "the key ends in \".\", so nothing is sought";
@@ -154,7 +155,7 @@ private:
         }
         Say(depth, line,
             {{"event", "level"},
-             {"location", LocationOf(level.parent)},
+             {"location", m_locations.Of(level.parent)},
              {"sought", level.steps.empty() ? Json() : SoughtInJson(level.steps.front())}});
     }
 
@@ -211,14 +212,14 @@ private:
 
     void TellStep(const TrailStep& step, const xmlNode* suspender, int depth)
     {
+        const std::string location = m_locations.Of(step.element);
         Say(depth,
-            "line " + LineOf(step.element) + ": " + LocationOf(step.element) + ": " +
-                ToldVerdict(step, suspender),
-            StepInJson(step));
+            "line " + LineOf(step.element) + ": " + location + ": " + ToldVerdict(step, suspender),
+            StepInJson(step, location));
         TellBelow(step, depth + 1);
     }
 
-    std::string ToldVerdict(const TrailStep& step, const xmlNode* suspender) const
+    std::string ToldVerdict(const TrailStep& step, const xmlNode* suspender)
     {
         switch (step.verdict)
         {
@@ -246,7 +247,7 @@ private:
         return told;
     }
 
-    std::string Acceptance(const TrailStep& step, const xmlNode* suspender) const
+    std::string Acceptance(const TrailStep& step, const xmlNode* suspender)
     {
         if (!step.suspended)
         {
@@ -255,7 +256,7 @@ private:
         }
         const std::string wouldHold =
             Fulfils(step.element, step.condition) ? "fulfils anyway" : "does not fulfil";
-        return " by name alone: " + LocationOf(suspender) + " (line " + LineOf(suspender) +
+        return " by name alone: " + m_locations.Of(suspender) + " (line " + LineOf(suspender) +
                ") suspended the condition " + Quoted(Text(step.condition)) + ", which it " +
                wouldHold;
     }
@@ -330,6 +331,7 @@ private:
     }
 
     const Walk m_walk;
+    Locations m_locations;
 };
 
 std::string StatusName(int status)
@@ -367,12 +369,12 @@ void TellRoot(const xmlNode* root, const std::string& key)
         told = "the key starts with " + Quoted(key.substr(0, dot)) + ", not with the root's name " +
                Quoted(name) + ": nothing is sought, and that counts as success";
     }
-    Print("line " + LineOf(root) + ": " + LocationOf(root) + ": " + told,
-          {{"event", "root"},
-           {"line", LineNumberOf(root)},
-           {"location", LocationOf(root)},
-           {"told", told},
-           {"depth", 0}});
+    const std::string location = Locations().Of(root);
+    Print("line " + LineOf(root) + ": " + location + ": " + told, {{"event", "root"},
+                                                                   {"line", LineNumberOf(root)},
+                                                                   {"location", location},
+                                                                   {"told", told},
+                                                                   {"depth", 0}});
 }
 
 void TellTrail(const Trail& trail, Walk walk)

@@ -1,5 +1,6 @@
 #include "Commands.h"
 #include "Document.h"
+#include "Locations.h"
 #include "Nodes.h"
 #include "Output.h"
 
@@ -43,11 +44,17 @@ const char* TypeName(const xmlNode* node)
 
 /** A namespace is no node of the tree: in a result, its next is the element that it was found on.
  */
-std::string LocationOfNamespace(const xmlNs* space)
+std::string LocationOfNamespace(const xmlNs* space, Locations& locations)
 {
     const auto element = reinterpret_cast<const xmlNode*>(space->next);
     const std::string prefix = space->prefix == nullptr ? "" : Text(space->prefix);
-    return LocationOf(element) + "/namespace::" + prefix;
+    return locations.Of(element) + "/namespace::" + prefix;
+}
+
+std::string NameWithPrefix(const xmlAttr* attribute)
+{
+    const bool hasPrefix = attribute->ns != nullptr && attribute->ns->prefix != nullptr;
+    return (hasPrefix ? Text(attribute->ns->prefix) + ":" : "") + Text(attribute->name);
 }
 
 std::string Attributes(const xmlNode* element)
@@ -57,9 +64,7 @@ std::string Attributes(const xmlNode* element)
          attribute = attribute->next)
     {
         const auto node = reinterpret_cast<const xmlNode*>(attribute);
-        const bool hasPrefix = attribute->ns != nullptr && attribute->ns->prefix != nullptr;
-        const std::string prefix = hasPrefix ? Text(attribute->ns->prefix) + ":" : "";
-        attributes += " " + prefix + Text(attribute->name) + "=" + Quoted(ContentOf(node));
+        attributes += " " + NameWithPrefix(attribute) + "=" + Quoted(ContentOf(node));
     }
     return attributes;
 }
@@ -71,14 +76,14 @@ bool ShowsContent(const xmlNode* node)
            (node->type != XML_ELEMENT_NODE || OnlyTextOf(node) != nullptr);
 }
 
-std::string Line(const xmlNode* node)
+std::string Line(const xmlNode* node, Locations& locations)
 {
     if (node->type == XML_NAMESPACE_DECL)
     {
         const auto space = reinterpret_cast<const xmlNs*>(node);
-        return LocationOfNamespace(space) + " namespace " + Quoted(Text(space->href));
+        return LocationOfNamespace(space, locations) + " namespace " + Quoted(Text(space->href));
     }
-    std::string line = LocationOf(node) + " " + TypeName(node);
+    std::string line = locations.Of(node) + " " + TypeName(node);
     if (node->type == XML_ELEMENT_NODE)
     {
         line += Attributes(node);
@@ -96,22 +101,23 @@ Json AttributesInJson(const xmlNode* element)
     for (const xmlAttr* attribute = element->properties; attribute != nullptr;
          attribute = attribute->next)
     {
-        attributes[Text(attribute->name)] = ContentOf(reinterpret_cast<const xmlNode*>(attribute));
+        attributes[NameWithPrefix(attribute)] =
+            ContentOf(reinterpret_cast<const xmlNode*>(attribute));
     }
     return attributes;
 }
 
-Json InJson(const xmlNode* node)
+Json InJson(const xmlNode* node, Locations& locations)
 {
     if (node->type == XML_NAMESPACE_DECL)
     {
         const auto space = reinterpret_cast<const xmlNs*>(node);
-        return {{"location", LocationOfNamespace(space)},
+        return {{"location", LocationOfNamespace(space, locations)},
                 {"type", TypeName(node)},
                 {"value", Text(space->href)}};
     }
     const long line = LineNumberOf(node);
-    Json result = {{"location", LocationOf(node)},
+    Json result = {{"location", locations.Of(node)},
                    {"line", line > 0 ? Json(line) : Json()},
                    {"type", TypeName(node)},
                    {"value", ShowsContent(node) ? Json(ContentOf(node)) : Json()}};
@@ -126,9 +132,18 @@ Json InJson(const xmlNode* node)
 int PrintNodes(const xmlNodeSet* nodes)
 {
     const int count = nodes == nullptr ? 0 : nodes->nodeNr;
+    Locations locations;
     for (int i = 0; i < count; ++i)
     {
-        Print(Line(nodes->nodeTab[i]), InJson(nodes->nodeTab[i]));
+        const xmlNode* const node = nodes->nodeTab[i];
+        if (AnswersInJson())
+        {
+            PrintResult(InJson(node, locations));
+        }
+        else
+        {
+            PrintLine(Line(node, locations));
+        }
     }
     return count;
 }

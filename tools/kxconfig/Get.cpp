@@ -1,5 +1,6 @@
 #include "Commands.h"
 #include "Document.h"
+#include "Locations.h"
 #include "Nodes.h"
 #include "Output.h"
 #include "Trail.h"
@@ -10,9 +11,10 @@ namespace
 /** The lookup runs all values together; a script wants them one by one, and from where. */
 void PrintEachResult(const Trail& trail)
 {
+    Locations locations;
     for (const TrailStep* const step : trail.StepsWithText())
     {
-        PrintResult({{"location", LocationOf(step->element)},
+        PrintResult({{"location", locations.Of(step->element)},
                      {"line", LineNumberOf(step->element)},
                      {"value", *step->text}});
     }

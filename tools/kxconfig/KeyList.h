@@ -1,13 +1,13 @@
 #ifndef KX_TOOLS_KEYLIST_H
 #define KX_TOOLS_KEYLIST_H
 
+#include "Levels.h"
+
 #include <string>
 #include <vector>
 
-struct _xmlNode;
-
 /** @return the key path of each element with a value, in document order and each key once; with a
  * condition where others bear the same name and an attribute tells them apart. */
-std::vector<std::string> ListKeys(const _xmlNode* root);
+std::vector<std::string> ListKeys(const xmlNode* root, Levels& levels);
 
 #endif

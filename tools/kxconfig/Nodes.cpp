@@ -48,11 +48,6 @@ std::string Taken(xmlChar* text)
     return copy;
 }
 
-std::string LocationOf(const xmlNode* node)
-{
-    return Taken(xmlGetNodePath(const_cast<xmlNode*>(node)));
-}
-
 long LineNumberOf(const xmlNode* node)
 {
     // For an element the engine would guess from its children, which an update replaces.

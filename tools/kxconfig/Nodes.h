@@ -19,9 +19,6 @@ inline std::string Text(std::string_view view)
 /** The same of a text that the caller owns, which is freed. */
 std::string Taken(xmlChar* text);
 
-/** @return the location path of @p node, such as /cfg/net[2]/ip. */
-std::string LocationOf(const xmlNode* node);
-
 /** @return the line of the file that @p node stands on; negative for the document. */
 long LineNumberOf(const xmlNode* node);
 

@@ -2,9 +2,7 @@
 
 #include <cstdlib>
 #include <cstring>
-#include <iomanip>
 #include <iostream>
-#include <sstream>
 
 #include <unistd.h>
 
@@ -55,11 +53,33 @@ std::string Written(const Json& json)
     return json.dump(2, ' ', false, Json::error_handler_t::replace);
 }
 
+std::string Escaped(unsigned char byte)
+{
+    const char* const digits = "0123456789abcdef";
+    return {'\\', 'x', digits[byte >> 4], digits[byte & 0xF]};
+}
+
+/** @return whether one of U+0080 to U+009F stands at @p position: terminals obey them too. */
+bool IsControlOfTwoBytes(const std::string& text, size_t position)
+{
+    if (text[position] != '\xC2' || position + 1 == text.size())
+    {
+        return false;
+    }
+    const auto second = static_cast<unsigned char>(text[position + 1]);
+    return second >= 0x80 && second <= 0x9F;
+}
+
 } // namespace
 
 void AnswerInJson()
 {
     g_inJson = true;
+}
+
+bool AnswersInJson()
+{
+    return g_inJson;
 }
 
 void AnswerFor(const std::string& verb, const std::string& file)
@@ -125,24 +145,28 @@ std::string Painted(Colour colour, const std::string& text)
 
 std::string OnOneLine(const std::string& text)
 {
-    std::ostringstream line;
-    for (const char c : text)
+    std::string line;
+    for (size_t i = 0; i != text.size(); ++i)
     {
-        const auto byte = static_cast<unsigned char>(c);
-        if (c == '\n')
+        const auto byte = static_cast<unsigned char>(text[i]);
+        if (text[i] == '\n')
         {
-            line << "\\n";
+            line += "\\n";
         }
         else if (byte < 0x20 || byte == 0x7F)
         {
-            line << "\\x" << std::hex << std::setw(2) << std::setfill('0') << unsigned{byte};
+            line += Escaped(byte);
+        }
+        else if (IsControlOfTwoBytes(text, i))
+        {
+            line += Escaped(byte) + Escaped(static_cast<unsigned char>(text[++i]));
         }
         else
         {
-            line << c;
+            line += text[i];
         }
     }
-    return line.str();
+    return line;
 }
 
 std::string Quoted(const std::string& text)
@@ -150,7 +174,8 @@ std::string Quoted(const std::string& text)
     std::string quoted = "\"";
     for (const char c : text)
     {
-        quoted += c == '"' || c == '\\' ? std::string("\\") + c : std::string(1, c);
+        quoted += c == '"' || c == '\\' ? "\\" : "";
+        quoted += c;
     }
     return OnOneLine(quoted + '"');
 }

@@ -14,6 +14,9 @@ using Json = nlohmann::ordered_json;
 /** From now on results and complaints are kept for one JSON object, which Finish() prints. */
 void AnswerInJson();
 
+/** @return whether they are: whoever has many results need not make the lines, or the objects. */
+bool AnswersInJson();
+
 /** Names the verb and the file in that object. */
 void AnswerFor(const std::string& verb, const std::string& file);
 

@@ -90,10 +90,6 @@ bool IsInTag(const std::string& text, size_t position)
 /** @return what it probably is that differs first, at @p position. */
 std::string KindOfDifference(const std::string& before, const std::string& after, size_t position)
 {
-    if (position == before.size() || position == after.size())
-    {
-        return "the end of the file";
-    }
     if (before[position] == '\r')
     {
         return "line ends (carriage returns)";
@@ -110,14 +106,41 @@ std::string KindOfDifference(const std::string& before, const std::string& after
     return IsInTag(before, position) ? "white space or quotes in a tag" : "the text";
 }
 
+/** @return what one text has and the other, which is the beginning of it, has not. */
+std::string DifferenceAtTheEnd(const std::string& before, const std::string& after)
+{
+    const bool isAdded = before.size() < after.size();
+    const std::string& longer = isAdded ? after : before;
+    const std::string end = longer.substr(std::min(before.size(), after.size()));
+    const bool fits = end.size() <= kShownText;
+    return "the end of the file: " + Quoted(end.substr(0, kShownText)) + (fits ? "" : "...") +
+           (isAdded ? " is added" : " is lost");
+}
+
 Difference FirstDifference(const std::string& before, const std::string& after, long line)
 {
     const auto length = static_cast<std::ptrdiff_t>(std::min(before.size(), after.size()));
     const auto end = std::mismatch(before.begin(), before.begin() + length, after.begin()).first;
     const auto position = static_cast<size_t>(end - before.begin());
     line += std::count(before.begin(), end, '\n');
+    if (position == before.size() || position == after.size())
+    {
+        return {line, DifferenceAtTheEnd(before, after)};
+    }
     return {line, KindOfDifference(before, after, position) + ": " + Shown(before, position) +
                       " becomes " + Shown(after, position)};
+}
+
+/** @return what is said of a file that bytes cannot be compared of; empty if they can. */
+std::string WhyNotCompared(const std::string& bytes)
+{
+    const std::string start = bytes.substr(0, 2);
+    if (start == "\xFE\xFF" || start == "\xFF\xFE")
+    {
+        return "every character: UTF-16 becomes UTF-8";
+    }
+    return start == "\x1F\x8B" ? "the whole file, which is compressed: it is saved as plain text"
+                               : "";
 }
 
 std::vector<Difference> Compare(const Parts& before, const Parts& after)
@@ -153,5 +176,11 @@ std::vector<Difference> WhatSavingChanges(CXMLReader& reader, const std::string&
     {
         return {{1, "the whole file: it could not be saved to try"}};
     }
-    return Compare(Parts(BytesOf(file)), Parts(BytesOf(saved.Path())));
+    const std::string bytes = BytesOf(file);
+    const std::string reason = WhyNotCompared(bytes);
+    if (!reason.empty())
+    {
+        return {{1, reason}};
+    }
+    return Compare(Parts(bytes), Parts(BytesOf(saved.Path())));
 }

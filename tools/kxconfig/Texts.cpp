@@ -1,5 +1,6 @@
 #include "Texts.h"
 
+#include "Locations.h"
 #include "Nodes.h"
 
 namespace
@@ -36,12 +37,13 @@ Texts::Texts(void* document)
 std::vector<ChangedText> Texts::Changes() const
 {
     std::vector<ChangedText> changes;
+    Locations locations;
     for (const Text& text : m_texts)
     {
         const std::string now = ContentOf(text.element);
         if (now != text.content)
         {
-            changes.push_back({LocationOf(text.element), text.content, now});
+            changes.push_back({locations.Of(text.element), text.content, now});
         }
     }
     return changes;

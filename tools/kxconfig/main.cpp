@@ -67,6 +67,14 @@ CLI::App* AddKeyCommand(CLI::App& app, const char* name, const char* description
     return command;
 }
 
+/** @return the word that stands where a command is expected; empty if a command was named. */
+std::string UnknownCommand(const CLI::App& app)
+{
+    const std::vector<std::string> rest = app.remaining();
+    const bool named = !app.get_subcommands().empty() || rest.empty() || rest.front()[0] == '-';
+    return named ? "" : rest.front();
+}
+
 ExitStatus ReportUsage(const CLI::App& app, const CLI::ParseError& error)
 {
     if (error.get_exit_code() == 0)
@@ -77,7 +85,8 @@ ExitStatus ReportUsage(const CLI::App& app, const CLI::ParseError& error)
         Print(lines, {{"text", lines}});
         return ExitStatus::Done;
     }
-    Complain(error.what() + std::string(kSeeHelp));
+    const std::string unknown = UnknownCommand(app);
+    Complain((unknown.empty() ? error.what() : "unknown command " + Quoted(unknown)) + kSeeHelp);
     return ExitStatus::BadUsage;
 }
 

@@ -1,0 +1,151 @@
+#include "ToolTest.h"
+
+#include <nlohmann/json.hpp>
+
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <algorithm>
+
+using namespace kxtest;
+using testing::StartsWith;
+
+namespace
+{
+
+/** Every verb on files that nobody likes. */
+class KxconfigNasty : public ToolTest
+{
+protected:
+    static std::vector<std::vector<std::string>> VerbsOn(const std::string& file)
+    {
+        return {{"get", file, "cfg.a"},
+                {"set", file, "cfg.a", "x"},
+                {"explain", file, "cfg.a"},
+                {"explain", "--set", file, "cfg.a"},
+                {"check", file},
+                {"keys", file},
+                {"find", file, "//a"}};
+    }
+
+    static nlohmann::json InJson(std::vector<std::string> arguments)
+    {
+        arguments.insert(arguments.begin(), "--json");
+        const Outcome outcome = Tool(arguments);
+        EXPECT_EQ("", outcome.err);
+        const nlohmann::json answer = nlohmann::json::parse(outcome.out);
+        EXPECT_EQ(outcome.status, answer.at("status"));
+        return answer;
+    }
+
+    /** Expects status 3 and one line that begins with @p start, from all verbs and in JSON. */
+    static void ExpectBadFile(const std::string& file, const std::string& start)
+    {
+        for (const std::vector<std::string>& arguments : VerbsOn(file))
+        {
+            SCOPED_TRACE(arguments[0] + " " + file);
+            const Outcome outcome = Tool(arguments);
+            EXPECT_EQ(3, outcome.status);
+            EXPECT_EQ("", outcome.out);
+            EXPECT_THAT(outcome.err, StartsWith("kxconfig: " + start));
+            EXPECT_EQ(1, std::count(outcome.err.begin(), outcome.err.end(), '\n'));
+            const nlohmann::json answer = InJson(arguments);
+            EXPECT_EQ(3, answer.at("status"));
+            ASSERT_EQ(1u, answer.at("messages").size());
+            EXPECT_THAT(answer.at("messages")[0].get<std::string>(), StartsWith(start));
+        }
+    }
+};
+
+} // namespace
+
+TEST_F(KxconfigNasty, FilesThatCannotBeRead)
+{
+    ExpectBadFile("", "cannot read \"\": ");
+    ExpectBadFile(m_folder.Path("missing"), "cannot read " + m_folder.Path("missing") + ": ");
+    ExpectBadFile(m_folder.Path(""), "cannot read " + m_folder.Path("") + ": Is a directory");
+}
+
+TEST_F(KxconfigNasty, FilesThatAreNoXmlAreToldWithTheLine)
+{
+    const auto expectOnLine = [this](int line, const std::string& bytes)
+    {
+        const std::string file = m_folder.Write("bad.xml", bytes);
+        ExpectBadFile(file, file + ":" + std::to_string(line) + ": ");
+    };
+    expectOnLine(1, "");
+    expectOnLine(1, "\x7F"
+                    "ELF\x02\x01");
+    expectOnLine(3, "<cfg>\n<a>1</a>\n<b></c>\n</cfg>");
+    expectOnLine(3, "<cfg>\n<a>1</a>\n<b>");
+    expectOnLine(2, "<cfg>\n<a>gr\xFCn</a></cfg>");
+    expectOnLine(2, "<cfg>\n<a>\x1B</a></cfg>");
+    expectOnLine(2, "<cfg>\n<a>&nowhere;</a></cfg>");
+    std::string deep = "<cfg>\n";
+    for (int i = 0; i != 5000; ++i)
+    {
+        deep += "<a>";
+    }
+    expectOnLine(2, deep);
+}
+
+TEST_F(KxconfigNasty, FilesThatOthersMustNotRead)
+{
+    if (geteuid() != 0)
+    {
+        GTEST_SKIP() << "needs to run as the superuser, to become somebody else";
+    }
+    const std::string file = m_folder.Write("cfg.xml", "<cfg><a>1</a></cfg>");
+    ASSERT_EQ(0, chmod(m_folder.Path("").c_str(), 0755));
+    ASSERT_EQ(0, chmod(file.c_str(), 0));
+    for (std::vector<std::string> arguments : VerbsOn(file))
+    {
+        arguments.insert(arguments.begin(), KX_CONFIG_TOOL);
+        const Outcome outcome = RunProgram(arguments, {}, 65534);
+        EXPECT_EQ(3, outcome.status);
+        EXPECT_EQ("kxconfig: cannot read " + file + ": Permission denied\n", outcome.err);
+    }
+}
+
+TEST_F(KxconfigNasty, KeysThatAreMalformedOrNameNothing)
+{
+    const std::string file = m_folder.Write("cfg.xml", "<cfg><b i='1'><c>1</c></b></cfg>");
+    const std::pair<const char*, int> keys[] = {
+        {"", 2},           {"cfg", 2},          {".", 1},           {"..", 1},
+        {".b", 1},         {"cfg.", 1},         {"cfg..c", 1},      {"cfg.b@i.c", 1},
+        {"cfg.b@=1.c", 1}, {"cfg.b\n.c", 1},    {"cfg.b .c", 1},    {"cfg.\x1B[31m", 1},
+        {"cfg.b@.c", 0},   {"cfg.b@i=1|.c", 0}, {"cfg.b@i=1&.c", 0}};
+    for (const auto& [key, status] : keys)
+    {
+        SCOPED_TRACE(key);
+        const Outcome outcome = Tool({"get", file, key});
+        EXPECT_EQ(status, outcome.status);
+        EXPECT_EQ(status == 0 ? "1\n" : "", outcome.out);
+        EXPECT_EQ(status == 0 ? 0 : 1, std::count(outcome.err.begin(), outcome.err.end(), '\n'));
+        EXPECT_EQ(std::string::npos, outcome.err.find('\x1B'));
+        EXPECT_EQ(status, InJson({"get", file, key}).at("status"));
+        EXPECT_EQ(status, InJson({"explain", file, key}).at("status"));
+    }
+}
+
+TEST_F(KxconfigNasty, ValuesThatAreNoXml)
+{
+    const std::string xml = "<cfg><a>1</a></cfg>";
+    const std::string file = m_folder.Write("cfg.xml", xml);
+    const Outcome outcome = Tool({"set", file, "cfg.a", "x\x1B[31m"});
+    EXPECT_EQ(4, outcome.status);
+    EXPECT_THAT(outcome.err, StartsWith("kxconfig: not saved: " + file + " would not load"));
+    EXPECT_EQ(xml, ReadFile(file));
+}
+
+TEST_F(KxconfigNasty, ALongValueAndALongAttribute)
+{
+    const std::string value(2000000, 'x');
+    const std::string attribute(100000, 'y');
+    const std::string file = m_folder.Write("long.xml", "<cfg><a>" + value + "</a><b i='" +
+                                                            attribute + "'>1</b><b>2</b></cfg>");
+    EXPECT_EQ(value + "\n", Tool({"get", file, "cfg.a"}).out);
+    EXPECT_EQ("1\n", Tool({"get", file, "cfg.b@i=" + attribute}).out);
+    EXPECT_EQ("cfg.a\t\"" + value + "\"\ncfg.b@i=" + attribute + "\t\"1\"\ncfg.b\t\"1\\n2\"\n",
+              Tool({"keys", file}).out);
+}

@@ -1,0 +1,161 @@
+#include "Levels.h"
+
+#include "Nodes.h"
+
+#include <algorithm>
+#include <iterator>
+
+namespace
+{
+
+using Names = std::vector<std::string>;
+
+void AddDefaulted(const xmlDtd* dtd, std::map<std::string, Names>& defaulted)
+{
+    const xmlNode* node = dtd == nullptr ? nullptr : dtd->children;
+    for (; node != nullptr; node = node->next)
+    {
+        const auto declaration = reinterpret_cast<const xmlAttribute*>(node);
+        // One with a prefix would be the default of every element, for a condition asks for the
+        // whole name and finds no attribute that an element bears itself: it tells none apart.
+        if (node->type == XML_ATTRIBUTE_DECL && declaration->defaultValue != nullptr &&
+            declaration->prefix == nullptr)
+        {
+            defaulted[Text(declaration->elem)].push_back(Text(declaration->name));
+        }
+    }
+}
+
+void AddOnce(const std::string& name, Names& names)
+{
+    if (std::find(names.begin(), names.end(), name) == names.end())
+    {
+        names.push_back(name);
+    }
+}
+
+/** @return the names by which a condition finds attributes of @p element: without a prefix. */
+Names AttributeNames(const xmlNode* element, const std::map<std::string, Names>& defaulted)
+{
+    Names names;
+    for (const xmlAttr* attribute = element->properties; attribute != nullptr;
+         attribute = attribute->next)
+    {
+        AddOnce(Text(attribute->name), names);
+    }
+    const auto more = defaulted.find(Text(element->name));
+    if (more != defaulted.end())
+    {
+        for (const std::string& name : more->second)
+        {
+            AddOnce(name, names);
+        }
+    }
+    return names;
+}
+
+bool ComesFirst(const Sibling& one, const Sibling& other)
+{
+    return one.place < other.place;
+}
+
+} // namespace
+
+bool IsFreeOf(const char* separators, const std::string& text)
+{
+    return text.find_first_of(separators) == std::string::npos;
+}
+
+Level::Level(const xmlNode* parent, const std::map<std::string, Names>& defaulted)
+    : m_defaulted(defaulted)
+{
+    size_t place = 0;
+    const xmlNode* before = nullptr;
+    for (const xmlNode* node = parent->children; node != nullptr; node = node->next)
+    {
+        if (node->type != XML_ELEMENT_NODE)
+        {
+            continue;
+        }
+        const Sibling sibling = {place++, node};
+        const std::string name = Text(node->name);
+        Namesakes& namesakes = m_byName[name];
+        namesakes.all.push_back(sibling);
+        if (before != nullptr && !xmlStrEqual(before->name, node->name))
+        {
+            namesakes.suspended.push_back(sibling);
+        }
+        for (const std::string& condition : ConditionsOf(node))
+        {
+            m_fulfilling[name + condition].push_back(sibling);
+        }
+        before = node;
+    }
+}
+
+std::string Level::SegmentOf(const xmlNode* element) const
+{
+    const std::string name = Text(element->name);
+    if (m_byName.at(name).all.size() == 1)
+    {
+        return name;
+    }
+    for (const std::string& condition : ConditionsOf(element))
+    {
+        if (m_fulfilling.at(name + condition).size() == 1)
+        {
+            return name + condition;
+        }
+    }
+    return name;
+}
+
+Siblings Level::SelectedBy(const std::string& segment) const
+{
+    const size_t at = segment.find('@');
+    const auto namesakes = m_byName.find(segment.substr(0, at));
+    if (namesakes == m_byName.end())
+    {
+        return {};
+    }
+    if (at == std::string::npos)
+    {
+        return namesakes->second.all;
+    }
+    const auto found = m_fulfilling.find(segment);
+    const Siblings fulfilling = found == m_fulfilling.end() ? Siblings() : found->second;
+    const Siblings& suspended = namesakes->second.suspended;
+    Siblings selected;
+    std::set_union(fulfilling.begin(), fulfilling.end(), suspended.begin(), suspended.end(),
+                   std::back_inserter(selected), ComesFirst);
+    return selected;
+}
+
+/** @return the conditions of one attribute, as "@name=value", that @p element fulfils. */
+std::vector<std::string> Level::ConditionsOf(const xmlNode* element) const
+{
+    std::vector<std::string> conditions;
+    for (const std::string& name : AttributeNames(element, m_defaulted))
+    {
+        const std::string value = AttributeOf(element, name);
+        if (IsFreeOf(".|&=@", name) && IsFreeOf(".|&\t\r\n", value) && HasAttribute(element, name))
+        {
+            conditions.push_back("@" + name + "=" + value);
+        }
+    }
+    return conditions;
+}
+
+Levels::Levels(const xmlDoc* document)
+{
+    AddDefaulted(document->intSubset, m_defaulted);
+    AddDefaulted(document->extSubset, m_defaulted);
+}
+
+const Level& Levels::Below(const xmlNode* parent)
+{
+    const auto level = m_levels.find(parent);
+    return level != m_levels.end()
+               ? level->second
+               : m_levels.emplace(parent, Level(parent, m_defaulted)).first->second;
+}

@@ -1,0 +1,70 @@
+#ifndef KX_TOOLS_LEVELS_H
+#define KX_TOOLS_LEVELS_H
+
+#include <libxml/tree.h>
+
+#include <map>
+#include <string>
+#include <unordered_map>
+#include <vector>
+
+// What the segments of keys select, for many keys of one document: a lookup compares a segment with
+// every sibling, here the siblings are sorted by the segments that select them.
+
+/** An element and its place among the elements of its level. */
+struct Sibling
+{
+    size_t place;
+    const xmlNode* element;
+};
+
+using Siblings = std::vector<Sibling>;
+
+/** The element children of one node. */
+class Level
+{
+public:
+    /** @param defaulted  the attributes that the DTD gives to elements, by the elements' name. */
+    Level(const xmlNode* parent, const std::map<std::string, std::vector<std::string>>& defaulted);
+
+    /**
+     * @return the segment for @p element: its name and, if others bear it too, the first condition
+     * with a single attribute that only this element fulfils; without such a condition its name.
+     */
+    std::string SegmentOf(const xmlNode* element) const;
+
+    /** @return what a lookup takes for @p segment, which SegmentOf() gave for some level. */
+    Siblings SelectedBy(const std::string& segment) const;
+
+private:
+    struct Namesakes
+    {
+        Siblings all;
+        Siblings suspended; ///< right after an element of another name: no condition rejects them
+    };
+
+    std::vector<std::string> ConditionsOf(const xmlNode* element) const;
+
+    const std::map<std::string, std::vector<std::string>>& m_defaulted;
+    std::map<std::string, Namesakes> m_byName;
+    std::map<std::string, Siblings> m_fulfilling; ///< by name and condition
+};
+
+/** The levels of a document, each sorted when it is first asked for. */
+class Levels
+{
+public:
+    explicit Levels(const xmlDoc* document);
+
+    const Level& Below(const xmlNode* parent);
+
+private:
+    std::map<std::string, std::vector<std::string>> m_defaulted;
+    std::unordered_map<const xmlNode*, Level> m_levels;
+};
+
+/** @return whether none of the bytes in @p separators is in @p text, which they would end in a key.
+ */
+bool IsFreeOf(const char* separators, const std::string& text);
+
+#endif
