@@ -40,33 +40,84 @@ enum LogLevel
  */
 const unsigned int kLogMaskOffset = 0x2F14;
 
-/** The library's log mask word, found by its offset however the platform declares the object. */
-inline unsigned int LogMask()
+/**
+ * Where the library's log mask word is, however the platform declares the object.
+ *
+ * For ARM, where an instruction cannot reach so far into the object: with the address, which the
+ * loader computes once, a gate there is a load, a test and a branch as well.
+ */
+extern const unsigned int* const kLogMaskWord __attribute__((visibility("hidden")));
+
+// The gate is inline in the smallest of builds as well, where the compiler would rather call it.
+
+/** The library's log mask word. */
+__attribute__((always_inline)) inline unsigned int LogMask()
 {
+#ifdef __arm__
+    return *kLogMaskWord;
+#else
     return *reinterpret_cast<const unsigned int*>(reinterpret_cast<const char*>(&g_LumLogParams) +
                                                   kLogMaskOffset);
+#endif
 }
 
 /** @return whether records of @p level are wanted; the mask is unsigned, so that 31 is a level. */
-inline bool LogEnabled(LogLevel level)
+__attribute__((always_inline)) inline bool LogEnabled(LogLevel level)
 {
     return __builtin_expect((LogMask() & (1u << level)) != 0, false);
 }
 
 /** @return whether records of either level are wanted; a single test, as that of one level. */
-inline bool LogEnabled(LogLevel one, LogLevel other)
+__attribute__((always_inline)) inline bool LogEnabled(LogLevel one, LogLevel other)
 {
     return __builtin_expect((LogMask() & ((1u << one) | (1u << other))) != 0, false);
 }
 
+/**
+ * The two records of nearly every operation.
+ *
+ * Out of line, as the part of a gate that is rarely run: a gate then passes two arguments instead
+ * of four, of which text and level would be the same everywhere.
+ */
+__attribute__((noinline)) inline void LogEntry(int line, const char* tag)
+{
+    KxLog(line, LogLevelTrace, tag, "+");
+}
+
+__attribute__((noinline)) inline void LogReturn(int line, const char* tag)
+{
+    KxLog(line, LogLevelTrace, tag, "-");
+}
+
+/** Both records of an operation that has nothing to tell in between; the first one is wanted. */
+__attribute__((noinline)) inline void LogEntryAndReturn(int line, const char* tag)
+{
+    KxLog(line, LogLevelTrace, tag, "+");
+    if (LogEnabled(LogLevelTrace))
+    {
+        KxLog(line, LogLevelTrace, tag, "-");
+    }
+}
+
 } // namespace kx
+
+/**
+ * Logs @p text, which is a literal, as is @p level: only one of the calls is compiled. At the
+ * trace's level "+-" stands for two records.
+ */
+#define KX_LOG_TEXT(level, tag, text)                                                              \
+    ((level) != kx::LogLevelTrace        ? static_cast<void>(KxLog(__LINE__, level, tag, text))    \
+     : __builtin_strcmp(text, "+") == 0  ? kx::LogEntry(__LINE__, tag)                             \
+     : __builtin_strcmp(text, "-") == 0  ? kx::LogReturn(__LINE__, tag)                            \
+     : __builtin_strcmp(text, "+-") == 0 ? kx::LogEntryAndReturn(__LINE__, tag)                    \
+                                         : static_cast<void>(KxLog(__LINE__, level, tag, text)))
 
 #define KX_LOG_RECORD(level, tag, text)                                                            \
     do                                                                                             \
     {                                                                                              \
         if (kx::LogEnabled(level))                                                                 \
         {                                                                                          \
-            KxLog(__LINE__, level, tag, text);                                                     \
+            KX_LOG_TEXT(level, tag, text);                                                         \
         }                                                                                          \
     } while (false)
 
@@ -83,6 +134,8 @@ inline bool LogEnabled(LogLevel one, LogLevel other)
 #define KX_LOG_EITHER(one, other) if (kx::LogEnabled(one, other))
 
 #define KX_TRACE(text) KX_LOG_RECORD(kx::LogLevelTrace, __FUNCTION__, text)
+/** "+" and "-" of an operation whose work nobody can see in between: one test for both. */
+#define KX_TRACE_BOTH() KX_LOG_RECORD(kx::LogLevelTrace, __FUNCTION__, "+-")
 #define KX_TRACE_AS(tag, text) KX_LOG_RECORD(kx::LogLevelTrace, tag, text)
 #define KX_TRACE_OF(format, argument)                                                              \
     KX_LOG_RECORD_OF(kx::LogLevelTrace, __FUNCTION__, format, argument)

@@ -4,18 +4,15 @@
 
 CXmlAttr::CXmlAttr()
 {
-    KX_TRACE("+");
-    KX_TRACE("-");
+    KX_TRACE_BOTH();
 }
 
 CXmlAttr::CXmlAttr(std::string name, std::string value) : m_strName(name), m_strValue(value)
 {
-    KX_TRACE("+");
-    KX_TRACE("-");
+    KX_TRACE_BOTH();
 }
 
 CXmlAttr::~CXmlAttr()
 {
-    KX_TRACE("+");
-    KX_TRACE("-");
+    KX_TRACE_BOTH();
 }

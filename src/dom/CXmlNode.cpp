@@ -12,78 +12,57 @@ using namespace kx;
 namespace
 {
 
-/** What Type() answers for the engine's type numbers, from 1 on. */
-const int kNodeTypes[] = {NODE_ELEMENT,
-                          NODE_ATTRIBUTE,
-                          NODE_TEXT,
-                          NODE_CDATA_SECTION,
-                          NODE_ENTITY_REF,
-                          NODE_ENTITY,
-                          NODE_PI,
-                          NODE_COMMENT,
-                          NODE_DOCUMENT,
-                          NODE_DOCUMENT_TYPE,
-                          NODE_DOCUMENT_FRAG,
-                          NODE_NOTATION,
-                          NODE_HTML_DOCUMENT,
-                          NODE_DTD,
-                          NODE_ELEMENT_DECL,
-                          NODE_ATTRIBUTE_DECL,
-                          NODE_ENTITY_DECL,
-                          NODE_NAMESPACE_DECL,
-                          NODE_XINCLUDE_START,
-                          NODE_XINCLUDE_END};
-const int kNodeTypeCount = sizeof kNodeTypes / sizeof kNodeTypes[0];
-
+/** The kinds bear the engine's type numbers, from the first to the last that it knows. */
 int TypeOf(const xmlNode* node)
 {
     const int number = node != 0 ? static_cast<int>(node->type) : 0;
-    return number >= 1 && number <= kNodeTypeCount ? kNodeTypes[number - 1] : NODE_NONE;
+    return number >= NODE_ELEMENT && number <= NODE_XINCLUDE_END ? number : NODE_NONE;
 }
 
 } // namespace
+
+CXmlNode kx::HandleOn(const char* tag, xmlNode* node)
+{
+    KX_TRACE_AS(tag, "+");
+    CXmlNode handle;
+    Designate(handle, node);
+    KX_TRACE_AS(tag, "-");
+    return handle;
+}
 
 // --- The handle
 
 CXmlNode::CXmlNode() : m_pXmlNode(0)
 {
-    KX_TRACE("+");
-    KX_TRACE("-");
+    KX_TRACE_BOTH();
 }
 
 CXmlNode::CXmlNode(xmlNode* node) : m_pXmlNode(node)
 {
-    KX_TRACE("+");
-    KX_TRACE("-");
+    KX_TRACE_BOTH();
 }
 
 CXmlNode::~CXmlNode()
 {
-    KX_TRACE("+");
-    KX_TRACE("-");
+    KX_TRACE_BOTH();
 }
 
 void CXmlNode::SetXmlNodePtr(xmlNode* node)
 {
-    KX_TRACE("+");
+    KX_TRACE_BOTH();
     m_pXmlNode = node;
-    KX_TRACE("-");
 }
 
 bool CXmlNode::IsNull()
 {
-    KX_TRACE("+");
-    const bool isNull = m_pXmlNode == 0;
-    KX_TRACE("-");
-    return isNull;
+    KX_TRACE_BOTH();
+    return m_pXmlNode == 0;
 }
 
 int CXmlNode::Type()
 {
-    KX_TRACE("+");
-    const int type = TypeOf(m_pXmlNode);
-    KX_TRACE("-");
-    return type;
+    KX_TRACE_BOTH();
+    return TypeOf(m_pXmlNode);
 }
 
 std::string CXmlNode::Name()
@@ -98,48 +77,29 @@ std::string CXmlNode::Name()
 
 CXmlNode CXmlNode::Parent()
 {
-    KX_TRACE("+");
-    CXmlNode parent;
-    xmlNode* const found = LinkOf(m_pXmlNode, &xmlNode::parent);
-    Designate(parent, IsElement(found) ? found : 0);
-    KX_TRACE("-");
-    return parent;
+    xmlNode* const parent = LinkOf(m_pXmlNode, &xmlNode::parent);
+    return HandleOn(__FUNCTION__, IsElement(parent) ? parent : 0);
 }
 
 CXmlNode CXmlNode::FirstChild()
 {
-    KX_TRACE("+");
-    CXmlNode child;
-    Designate(child, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::children), &xmlNode::next));
-    KX_TRACE("-");
-    return child;
+    return HandleOn(__FUNCTION__,
+                    ElementFrom(LinkOf(m_pXmlNode, &xmlNode::children), &xmlNode::next));
 }
 
 CXmlNode CXmlNode::LastChild()
 {
-    KX_TRACE("+");
-    CXmlNode child;
-    Designate(child, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::last), &xmlNode::prev));
-    KX_TRACE("-");
-    return child;
+    return HandleOn(__FUNCTION__, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::last), &xmlNode::prev));
 }
 
 CXmlNode CXmlNode::NextSibling()
 {
-    KX_TRACE("+");
-    CXmlNode sibling;
-    Designate(sibling, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::next), &xmlNode::next));
-    KX_TRACE("-");
-    return sibling;
+    return HandleOn(__FUNCTION__, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::next), &xmlNode::next));
 }
 
 CXmlNode CXmlNode::PrevSibling()
 {
-    KX_TRACE("+");
-    CXmlNode sibling;
-    Designate(sibling, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::prev), &xmlNode::prev));
-    KX_TRACE("-");
-    return sibling;
+    return HandleOn(__FUNCTION__, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::prev), &xmlNode::prev));
 }
 
 // --- Emptying

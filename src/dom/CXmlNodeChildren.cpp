@@ -155,11 +155,8 @@ std::list<CXmlNode> CXmlNode::Children()
 
 CXmlNode CXmlNode::FindChildNode(std::string name)
 {
-    KX_TRACE("+");
-    CXmlNode child;
-    Designate(child, NamedFrom(m_pXmlNode, LinkOf(m_pXmlNode, &xmlNode::children), name));
-    KX_TRACE("-");
-    return child;
+    return HandleOn(__FUNCTION__,
+                    NamedFrom(m_pXmlNode, LinkOf(m_pXmlNode, &xmlNode::children), name));
 }
 
 std::list<CXmlNode> CXmlNode::FindAllChildNodes(std::string name)

@@ -15,6 +15,9 @@ inline void Designate(CXmlNode& handle, _xmlNode* node)
     }
 }
 
+/** All that an operation @p tag does that only finds a node: @return a handle on @p node. */
+CXmlNode HandleOn(const char* tag, _xmlNode* node);
+
 } // namespace kx
 
 #endif

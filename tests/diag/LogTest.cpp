@@ -133,6 +133,17 @@ TEST(Gate, TagIsTheBareNameOfTheOperation)
         log.Take());
 }
 
+TEST(Gate, OfBothRecordsPassesTheSecondIfTheFirstLeavesTheMask)
+{
+    LogRecorder log(kMaskNone);
+    const auto operation = [] { KX_LOG_RECORD(kx::LogLevelTrace, "Tag", "+-"); };
+    operation();
+    EXPECT_EQ(Records(), log.Take());
+    LogRecorder::SetMask(kMaskTrace);
+    operation();
+    EXPECT_EQ(Records({Trace("Tag", "+"), Trace("Tag", "-")}), log.Take());
+}
+
 TEST(Gate, HandsOverTheLineOfItsSite)
 {
     LogRecorder log;
