@@ -23,7 +23,6 @@ int TypeOf(const xmlNode* node)
 
 CXmlNode kx::HandleOn(const char* tag, xmlNode* node)
 {
-    KX_TRACE_AS(tag, "+");
     CXmlNode handle;
     Designate(handle, node);
     KX_TRACE_AS(tag, "-");
@@ -77,28 +76,33 @@ std::string CXmlNode::Name()
 
 CXmlNode CXmlNode::Parent()
 {
+    KX_TRACE("+");
     xmlNode* const parent = LinkOf(m_pXmlNode, &xmlNode::parent);
     return HandleOn(__FUNCTION__, IsElement(parent) ? parent : 0);
 }
 
 CXmlNode CXmlNode::FirstChild()
 {
+    KX_TRACE("+");
     return HandleOn(__FUNCTION__,
                     ElementFrom(LinkOf(m_pXmlNode, &xmlNode::children), &xmlNode::next));
 }
 
 CXmlNode CXmlNode::LastChild()
 {
+    KX_TRACE("+");
     return HandleOn(__FUNCTION__, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::last), &xmlNode::prev));
 }
 
 CXmlNode CXmlNode::NextSibling()
 {
+    KX_TRACE("+");
     return HandleOn(__FUNCTION__, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::next), &xmlNode::next));
 }
 
 CXmlNode CXmlNode::PrevSibling()
 {
+    KX_TRACE("+");
     return HandleOn(__FUNCTION__, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::prev), &xmlNode::prev));
 }
 

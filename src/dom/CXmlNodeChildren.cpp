@@ -155,6 +155,7 @@ std::list<CXmlNode> CXmlNode::Children()
 
 CXmlNode CXmlNode::FindChildNode(std::string name)
 {
+    KX_TRACE("+");
     return HandleOn(__FUNCTION__,
                     NamedFrom(m_pXmlNode, LinkOf(m_pXmlNode, &xmlNode::children), name));
 }

@@ -15,7 +15,11 @@ inline void Designate(CXmlNode& handle, _xmlNode* node)
     }
 }
 
-/** All that an operation @p tag does that only finds a node: @return a handle on @p node. */
+/**
+ * How an operation that only finds a node ends: the handle is made, and "-" logged under @p tag.
+ *
+ * @return a handle on @p node; a null handle without one.
+ */
 CXmlNode HandleOn(const char* tag, _xmlNode* node);
 
 } // namespace kx
