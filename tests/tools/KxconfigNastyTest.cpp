@@ -132,10 +132,17 @@ TEST_F(KxconfigNasty, ValuesThatAreNoXml)
 {
     const std::string xml = "<cfg><a>1</a></cfg>";
     const std::string file = m_folder.Write("cfg.xml", xml);
-    const Outcome outcome = Tool({"set", file, "cfg.a", "x\x1B[31m"});
-    EXPECT_EQ(4, outcome.status);
-    EXPECT_THAT(outcome.err, StartsWith("kxconfig: not saved: " + file + " would not load"));
-    EXPECT_EQ(xml, ReadFile(file));
+    for (const char* value : {"x\x1B[31m", "\x01", "\x1F", "caf\xE9", "\xC3", "\x80"})
+    {
+        const Outcome outcome = Tool({"set", file, "cfg.a", value});
+        EXPECT_EQ(2, outcome.status);
+        EXPECT_EQ(
+            "kxconfig: VALUE is not XML text: it has control characters, or bytes that are no "
+            "UTF-8\n",
+            outcome.err);
+        EXPECT_EQ(xml, ReadFile(file));
+    }
+    EXPECT_EQ(0, Tool({"set", file, "cfg.a", "caf\xC3\xA9\t\n\r"}).status);
 }
 
 TEST_F(KxconfigNasty, ALongValueAndALongAttribute)

@@ -4,6 +4,10 @@
 #include "Save.h"
 #include "Texts.h"
 
+#include <libxml/xmlstring.h>
+
+#include <algorithm>
+
 namespace
 {
 
@@ -21,8 +25,17 @@ bool IsReference(const std::string& text)
     return !text.empty() && text.find_first_of("&< \t\r\n") == text.npos;
 }
 
+/** Whether @p value is UTF-8 without the control characters that XML does not have. */
+bool HasOnlyXmlCharacters(const std::string& value)
+{
+    const auto isForbidden = [](unsigned char byte)
+    { return byte < ' ' && byte != '\t' && byte != '\n' && byte != '\r'; };
+    return xmlCheckUTF8(reinterpret_cast<const xmlChar*>(value.c_str())) != 0 &&
+           std::none_of(value.begin(), value.end(), isForbidden);
+}
+
 /** Whether each "&" of @p value begins a reference. */
-bool IsXmlText(const std::string& value)
+bool HasOnlyWholeReferences(const std::string& value)
 {
     std::string::size_type at = value.find('&');
     while (at != value.npos)
@@ -37,23 +50,30 @@ bool IsXmlText(const std::string& value)
     return true;
 }
 
-ExitStatus RefuseValue()
+ExitStatus RefuseValue(const std::string& why)
 {
-    Complain("VALUE is not XML text: write & as &amp;");
+    Complain("VALUE is not XML text: " + why);
     return ExitStatus::BadUsage;
 }
 
+const char* const kBareAmpersand = "write & as &amp;";
+
 ExitStatus Update(CXMLWriter& writer, const SetArguments& arguments)
 {
-    // Of a bare "&" only older engines complain; newer ones take the text around it.
-    if (!IsXmlText(arguments.value))
+    // Of a bare "&" only older engines complain; newer ones take the text around it, and save other
+    // characters than those that they cannot.
+    if (!HasOnlyXmlCharacters(arguments.value))
     {
-        return RefuseValue();
+        return RefuseValue("it has control characters, or bytes that are no UTF-8");
+    }
+    if (!HasOnlyWholeReferences(arguments.value))
+    {
+        return RefuseValue(kBareAmpersand);
     }
     const int status = writer.SetValue(arguments.key, arguments.value);
     if (!FirstComplaint("").empty())
     {
-        return RefuseValue();
+        return RefuseValue(kBareAmpersand);
     }
     if (status == 0)
     {
