@@ -101,16 +101,12 @@ __attribute__((noinline)) inline void LogEntryAndReturn(int line, const char* ta
 
 } // namespace kx
 
-/**
- * Logs @p text, which is a literal, as is @p level: only one of the calls is compiled. At the
- * trace's level "+-" stands for two records.
- */
+/** Logs @p text, which is a literal, as is @p level: only one of the calls is compiled. */
 #define KX_LOG_TEXT(level, tag, text)                                                              \
-    ((level) != kx::LogLevelTrace        ? static_cast<void>(KxLog(__LINE__, level, tag, text))    \
-     : __builtin_strcmp(text, "+") == 0  ? kx::LogEntry(__LINE__, tag)                             \
-     : __builtin_strcmp(text, "-") == 0  ? kx::LogReturn(__LINE__, tag)                            \
-     : __builtin_strcmp(text, "+-") == 0 ? kx::LogEntryAndReturn(__LINE__, tag)                    \
-                                         : static_cast<void>(KxLog(__LINE__, level, tag, text)))
+    ((level) != kx::LogLevelTrace       ? static_cast<void>(KxLog(__LINE__, level, tag, text))     \
+     : __builtin_strcmp(text, "+") == 0 ? kx::LogEntry(__LINE__, tag)                              \
+     : __builtin_strcmp(text, "-") == 0 ? kx::LogReturn(__LINE__, tag)                             \
+                                        : static_cast<void>(KxLog(__LINE__, level, tag, text)))
 
 #define KX_LOG_RECORD(level, tag, text)                                                            \
     do                                                                                             \
@@ -133,9 +129,17 @@ __attribute__((noinline)) inline void LogEntryAndReturn(int line, const char* ta
 /** Stands before a block of gates of two levels: with both bits clear they cost one test in all. */
 #define KX_LOG_EITHER(one, other) if (kx::LogEnabled(one, other))
 
-#define KX_TRACE(text) KX_LOG_RECORD(kx::LogLevelTrace, __FUNCTION__, text)
 /** "+" and "-" of an operation whose work nobody can see in between: one test for both. */
-#define KX_TRACE_BOTH() KX_LOG_RECORD(kx::LogLevelTrace, __FUNCTION__, "+-")
+#define KX_TRACE_BOTH()                                                                            \
+    do                                                                                             \
+    {                                                                                              \
+        if (kx::LogEnabled(kx::LogLevelTrace))                                                     \
+        {                                                                                          \
+            kx::LogEntryAndReturn(__LINE__, __FUNCTION__);                                         \
+        }                                                                                          \
+    } while (false)
+
+#define KX_TRACE(text) KX_LOG_RECORD(kx::LogLevelTrace, __FUNCTION__, text)
 #define KX_TRACE_AS(tag, text) KX_LOG_RECORD(kx::LogLevelTrace, tag, text)
 #define KX_TRACE_OF(format, argument)                                                              \
     KX_LOG_RECORD_OF(kx::LogLevelTrace, __FUNCTION__, format, argument)

@@ -133,15 +133,19 @@ TEST(Gate, TagIsTheBareNameOfTheOperation)
         log.Take());
 }
 
-TEST(Gate, OfBothRecordsPassesTheSecondIfTheFirstLeavesTheMask)
+void BothRecords()
 {
-    LogRecorder log(kMaskNone);
-    const auto operation = [] { KX_LOG_RECORD(kx::LogLevelTrace, "Tag", "+-"); };
-    operation();
+    KX_TRACE_BOTH();
+}
+
+TEST(Gate, OfBothRecordsLogsThemUnderTheOperation)
+{
+    LogRecorder log(~kMaskTrace);
+    BothRecords();
     EXPECT_EQ(Records(), log.Take());
     LogRecorder::SetMask(kMaskTrace);
-    operation();
-    EXPECT_EQ(Records({Trace("Tag", "+"), Trace("Tag", "-")}), log.Take());
+    BothRecords();
+    EXPECT_EQ(Records({Trace("BothRecords", "+"), Trace("BothRecords", "-")}), log.Take());
 }
 
 TEST(Gate, HandsOverTheLineOfItsSite)

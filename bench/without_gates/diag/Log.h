@@ -26,6 +26,9 @@
         }                                                                                          \
     } while (false)
 
+#undef KX_TRACE_BOTH
+#define KX_TRACE_BOTH() static_cast<void>(0)
+
 #undef KX_LOG_EITHER
 #define KX_LOG_EITHER(one, other) if (false)
 
