@@ -480,6 +480,7 @@ registers. Not all sizes are listed.
 `scripts/check_speed.sh` counts the instructions of six operations and fails if one takes 3 % more than \
 `bench/instructions.txt` says, or if the observer costs something. To see where they went:
 
+<!-- untested: needs what scripts/bench.sh builds -->
 ```sh
 valgrind --tool=callgrind --instr-atstart=no --callgrind-out-file=build/out build/bench/bench/kx_bench_guard '{example}'
 callgrind_annotate build/out.1
