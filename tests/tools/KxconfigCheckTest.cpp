@@ -1,4 +1,10 @@
+#include "RandomDocument.h"
 #include "ToolTest.h"
+
+#include <nlohmann/json.hpp>
+
+#include <chrono>
+#include <map>
 
 using namespace kxtest;
 using testing::HasSubstr;
@@ -87,6 +93,48 @@ TEST_F(KxconfigCheck, ChecksTheKeysThatItIsGiven)
                    {"cfg.a@i=2"});
     EXPECT_EQ(2, Tool({"check", m_file, "cfg"}).status);
     EXPECT_EQ(1, Tool({"check", m_file, "other.a"}).status);
+}
+
+TEST_F(KxconfigCheck, TellsOfListedKeysWhatTheWalkTells)
+{
+    // Keys that it is given it walks, the listed ones it looks up by their segments.
+    std::map<std::string, int> kinds;
+    for (unsigned seed = 1; seed != 61; ++seed)
+    {
+        Write(RandomDocument(seed).Make());
+        std::vector<std::string> walk = {"check", m_file};
+        const nlohmann::json keys = nlohmann::json::parse(Tool({"--json", "keys", m_file}).out);
+        for (const nlohmann::json& result : keys.at("results"))
+        {
+            walk.push_back(result.at("key"));
+        }
+        EXPECT_EQ(Tool(walk).out, Tool({"check", m_file}).out) << ReadFile(m_file);
+        const nlohmann::json answer = nlohmann::json::parse(Tool({"--json", "check", m_file}).out);
+        for (const nlohmann::json& result : answer.at("results"))
+        {
+            ++kinds[result.at("kind")];
+        }
+    }
+    EXPECT_GT(kinds["ambiguous key"], 100);
+    EXPECT_GT(kinds["suspended condition"], 100);
+    EXPECT_GT(kinds["condition depends on order"], 50);
+}
+
+TEST_F(KxconfigCheck, NeedsNoTimeWorthMentioningForManyElements)
+{
+    // A walk for each key would take minutes.
+    std::string xml = "<cfg>\n<name>box</name>\n";
+    for (int i = 0; i != 10000; ++i)
+    {
+        xml += "<net id=\"" + std::to_string(i) + "\"><ip>x</ip></net>\n";
+    }
+    Write(xml + "</cfg>");
+    const auto start = std::chrono::steady_clock::now();
+    const Outcome outcome = Tool({"check", m_file});
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(30));
+    EXPECT_EQ(1, outcome.status);
+    EXPECT_THAT(outcome.out, HasSubstr(":10003: \"cfg.net@id=9999.ip\" matches 2 elements, the "
+                                       "first of them /cfg/net[1]/ip (line 4)\n"));
 }
 
 TEST_F(KxconfigCheck, WarnsOfValuesThatALookupCannotSee)
