@@ -164,6 +164,18 @@ TEST_F(KxconfigKeys, TellsApartByTheDefaultOfAnAttribute)
                                          "<cfg><a>x</a><a>y</a></cfg>"));
 }
 
+TEST_F(KxconfigKeys, DoesNotTellApartByTheDefaultOfAnAttributeWithAPrefix)
+{
+    const std::string xml = "<!DOCTYPE cfg [<!ATTLIST a p:i CDATA '1'>]>"
+                            "<cfg xmlns:p='urn:p'><a>x</a><a p:i='2'>y</a></cfg>";
+    EXPECT_EQ("cfg.a\t\"x\\ny\"\ncfg.a@i=2\t\"y\"\n", Keys(xml));
+    // The default is found by the whole name only, and then also where another text stands.
+    const std::string file = m_folder.Write("cfg.xml", xml);
+    EXPECT_EQ("x\ny\n", Tool({"get", file, "cfg.a@p:i=1"}).out);
+    EXPECT_EQ(1, Tool({"get", file, "cfg.a@p:i=2"}).status);
+    EXPECT_EQ(1, Tool({"get", file, "cfg.a@i=1"}).status);
+}
+
 TEST_F(KxconfigKeys, NeedsNoTimeWorthMentioningForManyElements)
 {
     // The element in front suspends the condition for the first net: no key is free of it. Looking
