@@ -86,13 +86,35 @@ TEST_F(KxconfigCheck, WarnsOncePerLevelOfConditionsThatDependOnTheOrder)
 TEST_F(KxconfigCheck, ChecksTheKeysThatItIsGiven)
 {
     Write("<cfg>\n<a i=\"1\">1</a>\n<a i=\"2\">2</a>\n<z/></cfg>");
-    ExpectWarnings({"4: \"cfg.a\" matches 2 elements, the first of them /cfg/a[1] (line 3)"},
+    ExpectWarnings({"4: \"cfg.a\" matches 2 elements, the first of them /cfg/a[1] (line 3)",
+                    "5: \"cfg.z\" has no value: it leads as far as /cfg/z; kxconfig explain tells "
+                    "why"},
                    {"cfg.a", "cfg.z"});
     ExpectWarnings({"3: /cfg/a[1] would be taken for \"a@i=2\" if /cfg/z (line 5), of another "
                     "name, came right before it"},
                    {"cfg.a@i=2"});
     EXPECT_EQ(2, Tool({"check", m_file, "cfg"}).status);
     EXPECT_EQ(1, Tool({"check", m_file, "other.a"}).status);
+}
+
+TEST_F(KxconfigCheck, WarnsOfAGivenKeyThatHasNoValue)
+{
+    Write("<cfg>\n<a><b/></a>\n<a>\n<b><c/></b></a>\n<d>1</d></cfg>");
+    const auto warning =
+        [](const std::string& key, const std::string& line, const std::string& location)
+    {
+        return line + ": \"" + key + "\" has no value: it leads as far as " + location +
+               "; kxconfig explain tells why";
+    };
+    // An element that is there and empty, the first of those that are equally deep.
+    ExpectWarnings({warning("cfg.a.b", "3", "/cfg/a[1]/b")}, {"cfg.a.b"});
+    // The deepest, although the first a leads astray.
+    ExpectWarnings({warning("cfg.a.b.c.x", "5", "/cfg/a[2]/b/c")}, {"cfg.a.b.c.x"});
+    ExpectWarnings({warning("cfg.e", "2", "/cfg")}, {"cfg.e"});
+    ExpectWarnings({warning("cfg.", "2", "/cfg")}, {"cfg."});
+    ExpectWarnings({warning("cfg.e", "2", "/cfg"), warning("cfg.a.b", "3", "/cfg/a[1]/b")},
+                   {"cfg.d", "cfg.a.b", "cfg.e", "cfg.e"});
+    ExpectWarnings({}, {"cfg.d"});
 }
 
 TEST_F(KxconfigCheck, TellsOfListedKeysWhatTheWalkTells)

@@ -141,6 +141,40 @@ void CheckOrders(const TrailLevel& level, Warnings& warnings)
     }
 }
 
+/** An element that a lookup accepts, and the number of levels that it stands below the root. */
+struct Accepted
+{
+    const xmlNode* element;
+    int depth;
+};
+
+/** @return the deepest element accepted on @p level and below, the first of them; else @p above. */
+Accepted DeepestAccepted(const TrailLevel& level, const Accepted& above)
+{
+    Accepted deepest = above;
+    for (const TrailStep& step : level.steps)
+    {
+        if (step.verdict == Verdict::Accepted)
+        {
+            const Accepted here = {step.element, above.depth + 1};
+            const Accepted below =
+                step.below != nullptr ? DeepestAccepted(*step.below, here) : here;
+            deepest = below.depth > deepest.depth ? below : deepest;
+        }
+    }
+    return deepest;
+}
+
+void WarnOfNoValue(const Trail& trail, xmlDoc* document, const std::string& key, Warnings& warnings)
+{
+    const Accepted root = {xmlDocGetRootElement(document), 0};
+    const xmlNode* const end =
+        trail.top == nullptr ? root.element : DeepestAccepted(*trail.top, root).element;
+    warnings.Warn(end, "key without a value",
+                  Quoted(key) + " has no value: it leads as far as " + warnings.LocationOf(end) +
+                      "; kxconfig explain tells why");
+}
+
 void CheckLookup(xmlDoc* document, const std::string& key, Warnings& warnings)
 {
     const Trail trail = RecordLookup(document, key);
@@ -148,6 +182,10 @@ void CheckLookup(xmlDoc* document, const std::string& key, Warnings& warnings)
     for (const TrailStep* const step : trail.StepsWithText())
     {
         found.push_back(step->element);
+    }
+    if (found.empty())
+    {
+        WarnOfNoValue(trail, document, key, warnings);
     }
     CheckMatches(found, key, warnings);
     if (trail.top != nullptr)
