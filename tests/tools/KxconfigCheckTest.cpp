@@ -1,4 +1,10 @@
+#include "RandomDocument.h"
 #include "ToolTest.h"
+
+#include <nlohmann/json.hpp>
+
+#include <chrono>
+#include <map>
 
 using namespace kxtest;
 using testing::HasSubstr;
@@ -80,13 +86,77 @@ TEST_F(KxconfigCheck, WarnsOncePerLevelOfConditionsThatDependOnTheOrder)
 TEST_F(KxconfigCheck, ChecksTheKeysThatItIsGiven)
 {
     Write("<cfg>\n<a i=\"1\">1</a>\n<a i=\"2\">2</a>\n<z/></cfg>");
-    ExpectWarnings({"4: \"cfg.a\" matches 2 elements, the first of them /cfg/a[1] (line 3)"},
+    ExpectWarnings({"4: \"cfg.a\" matches 2 elements, the first of them /cfg/a[1] (line 3)",
+                    "5: \"cfg.z\" has no value: it leads as far as /cfg/z; kxconfig explain tells "
+                    "why"},
                    {"cfg.a", "cfg.z"});
     ExpectWarnings({"3: /cfg/a[1] would be taken for \"a@i=2\" if /cfg/z (line 5), of another "
                     "name, came right before it"},
                    {"cfg.a@i=2"});
     EXPECT_EQ(2, Tool({"check", m_file, "cfg"}).status);
     EXPECT_EQ(1, Tool({"check", m_file, "other.a"}).status);
+}
+
+TEST_F(KxconfigCheck, WarnsOfAGivenKeyThatHasNoValue)
+{
+    Write("<cfg>\n<a><b/></a>\n<a>\n<b><c/></b></a>\n<d>1</d></cfg>");
+    const auto warning =
+        [](const std::string& key, const std::string& line, const std::string& location)
+    {
+        return line + ": \"" + key + "\" has no value: it leads as far as " + location +
+               "; kxconfig explain tells why";
+    };
+    // An element that is there and empty, the first of those that are equally deep.
+    ExpectWarnings({warning("cfg.a.b", "3", "/cfg/a[1]/b")}, {"cfg.a.b"});
+    // The deepest, although the first a leads astray.
+    ExpectWarnings({warning("cfg.a.b.c.x", "5", "/cfg/a[2]/b/c")}, {"cfg.a.b.c.x"});
+    ExpectWarnings({warning("cfg.e", "2", "/cfg")}, {"cfg.e"});
+    ExpectWarnings({warning("cfg.", "2", "/cfg")}, {"cfg."});
+    ExpectWarnings({warning("cfg.e", "2", "/cfg"), warning("cfg.a.b", "3", "/cfg/a[1]/b")},
+                   {"cfg.d", "cfg.a.b", "cfg.e", "cfg.e"});
+    ExpectWarnings({}, {"cfg.d"});
+}
+
+TEST_F(KxconfigCheck, TellsOfListedKeysWhatTheWalkTells)
+{
+    // Keys that it is given it walks, the listed ones it looks up by their segments.
+    std::map<std::string, int> kinds;
+    for (unsigned seed = 1; seed != 61; ++seed)
+    {
+        Write(RandomDocument(seed).Make());
+        std::vector<std::string> walk = {"check", m_file};
+        const nlohmann::json keys = nlohmann::json::parse(Tool({"--json", "keys", m_file}).out);
+        for (const nlohmann::json& result : keys.at("results"))
+        {
+            walk.push_back(result.at("key"));
+        }
+        EXPECT_EQ(Tool(walk).out, Tool({"check", m_file}).out) << ReadFile(m_file);
+        const nlohmann::json answer = nlohmann::json::parse(Tool({"--json", "check", m_file}).out);
+        for (const nlohmann::json& result : answer.at("results"))
+        {
+            ++kinds[result.at("kind")];
+        }
+    }
+    EXPECT_GT(kinds["ambiguous key"], 100);
+    EXPECT_GT(kinds["suspended condition"], 100);
+    EXPECT_GT(kinds["condition depends on order"], 50);
+}
+
+TEST_F(KxconfigCheck, NeedsNoTimeWorthMentioningForManyElements)
+{
+    // A walk for each key would take minutes.
+    std::string xml = "<cfg>\n<name>box</name>\n";
+    for (int i = 0; i != 10000; ++i)
+    {
+        xml += "<net id=\"" + std::to_string(i) + "\"><ip>x</ip></net>\n";
+    }
+    Write(xml + "</cfg>");
+    const auto start = std::chrono::steady_clock::now();
+    const Outcome outcome = Tool({"check", m_file});
+    EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(30));
+    EXPECT_EQ(1, outcome.status);
+    EXPECT_THAT(outcome.out, HasSubstr(":10003: \"cfg.net@id=9999.ip\" matches 2 elements, the "
+                                       "first of them /cfg/net[1]/ip (line 4)\n"));
 }
 
 TEST_F(KxconfigCheck, WarnsOfValuesThatALookupCannotSee)

@@ -77,6 +77,15 @@ TEST_F(KxconfigJson, CheckGivesEachWarning)
         {"kind", "ambiguous key"},
         {"text", "\"cfg.net.ip\" matches 2 elements, the first of them /cfg/net[1]/ip (line 2)"}};
     EXPECT_THAT(answer.at("results"), testing::Contains(expected));
+
+    const json unfound = Answer({"check", m_file, "cfg.net@id=2.name"});
+    EXPECT_EQ(1, unfound.at("status"));
+    const json noValue = {{"line", 3},
+                          {"kind", "key without a value"},
+                          {"text", "\"cfg.net@id=2.name\" has no value: it leads as far as "
+                                   "/cfg/net[2]; kxconfig explain tells why"}};
+    EXPECT_THAT(unfound.at("results"), testing::Contains(noValue));
+    EXPECT_EQ(json::array(), unfound.at("messages"));
 }
 
 TEST_F(KxconfigJson, ExplainGivesEachStep)

@@ -1,3 +1,4 @@
+#include "RandomDocument.h"
 #include "ToolTest.h"
 
 #include "CXMLReader.h"
@@ -5,7 +6,6 @@
 #include <nlohmann/json.hpp>
 
 #include <chrono>
-#include <random>
 #include <set>
 #include <sstream>
 
@@ -42,51 +42,6 @@ protected:
         }
         return static_cast<int>(keys.size());
     }
-};
-
-/** Makes small documents in which names repeat, attributes do and do not tell, and orders vary. */
-class RandomDocument
-{
-public:
-    explicit RandomDocument(unsigned seed) : m_random(seed) {}
-
-    std::string Make()
-    {
-        return "<!DOCTYPE cfg [<!ATTLIST a i CDATA '3'><!ATTLIST b p:i CDATA '1' j CDATA '2'>]>"
-               "<cfg xmlns:p='urn:p'>" +
-               Elements(3) + "</cfg>";
-    }
-
-private:
-    std::string OneOf(const std::vector<std::string>& choices)
-    {
-        return choices[m_random() % choices.size()];
-    }
-
-    std::string Elements(int depth)
-    {
-        std::string elements;
-        for (auto count = 1 + m_random() % 6; count != 0; --count)
-        {
-            elements += Element(depth) + OneOf({"", "", "", "<!--c-->", "t", "<?p i?>"});
-        }
-        return elements;
-    }
-
-    std::string Element(int depth)
-    {
-        const std::string name = OneOf({"a", "a", "b", "p:a", "u:a", "c.d"});
-        const std::string attributes = OneOf({"", " i='1'", " i='2'", " i=''", " i='x.y'"}) +
-                                       OneOf({"", " p:i='1'", " p:i='4'"}) +
-                                       OneOf({"", " j='1'", " j='2'", " j='a=b@c'", " j='1|2'"});
-        const std::string content =
-            depth == 0 || m_random() % 3 == 0
-                ? OneOf({"v", "w", "x\ny", " ", "", "<![CDATA[z]]>", "v<!--c-->w"})
-                : Elements(depth - 1);
-        return "<" + name + attributes + ">" + content + "</" + name + ">";
-    }
-
-    std::mt19937 m_random;
 };
 
 } // namespace
@@ -207,6 +162,18 @@ TEST_F(KxconfigKeys, TellsApartByTheDefaultOfAnAttribute)
                    "<cfg><a>x</a><a i='1'>y</a><a i='2'>z</a></cfg>"));
     EXPECT_EQ("cfg.a\t\"x\\ny\"\n", Keys("<!DOCTYPE cfg [<!ATTLIST a i CDATA #IMPLIED>]>"
                                          "<cfg><a>x</a><a>y</a></cfg>"));
+}
+
+TEST_F(KxconfigKeys, DoesNotTellApartByTheDefaultOfAnAttributeWithAPrefix)
+{
+    const std::string xml = "<!DOCTYPE cfg [<!ATTLIST a p:i CDATA '1'>]>"
+                            "<cfg xmlns:p='urn:p'><a>x</a><a p:i='2'>y</a></cfg>";
+    EXPECT_EQ("cfg.a\t\"x\\ny\"\ncfg.a@i=2\t\"y\"\n", Keys(xml));
+    // The default is found by the whole name only, and then also where another text stands.
+    const std::string file = m_folder.Write("cfg.xml", xml);
+    EXPECT_EQ("x\ny\n", Tool({"get", file, "cfg.a@p:i=1"}).out);
+    EXPECT_EQ(1, Tool({"get", file, "cfg.a@p:i=2"}).status);
+    EXPECT_EQ(1, Tool({"get", file, "cfg.a@i=1"}).status);
 }
 
 TEST_F(KxconfigKeys, NeedsNoTimeWorthMentioningForManyElements)

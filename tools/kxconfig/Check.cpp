@@ -1,6 +1,7 @@
 #include "Commands.h"
 #include "Document.h"
 #include "KeyList.h"
+#include "KeyValues.h"
 #include "Locations.h"
 #include "Nodes.h"
 #include "Output.h"
@@ -70,77 +71,66 @@ private:
 
 // Keys: what a lookup finds, and what it would find if the elements stood in another order.
 
-void CheckMatches(const Trail& trail, const std::string& key, Warnings& warnings)
+void CheckMatches(const Elements& found, const std::string& key, Warnings& warnings)
 {
-    const std::vector<const TrailStep*> found = trail.StepsWithText();
     if (found.size() > 1)
     {
-        warnings.Warn(found[1]->element, "ambiguous key",
+        warnings.Warn(found[1], "ambiguous key",
                       Quoted(key) + " matches " + std::to_string(found.size()) +
-                          " elements, the first of them " + warnings.Place(found[0]->element));
+                          " elements, the first of them " + warnings.Place(found[0]));
     }
 }
 
-/** The elements on a level whose order matters to a condition. */
-struct Order
+/** @param segment  has a condition, and is what the children of @p parent are compared with. */
+void CheckOrder(const Order& order, const xmlNode* parent, const std::string& segment,
+                Warnings& warnings)
 {
-    const TrailStep* other = nullptr;     ///< would suspend the condition if it came first
-    const TrailStep* rejected = nullptr;  ///< would then be taken
-    const TrailStep* taken = nullptr;     ///< is taken like that as the file stands
-    const TrailStep* suspender = nullptr; ///< suspended the condition for it
-};
-
-Order OrderOf(const TrailLevel& level)
-{
-    Order order;
-    const TrailStep* suspender = nullptr; // of the step that is looked at
-    for (const TrailStep& step : level.steps)
-    {
-        const bool isOther = step.verdict == Verdict::OtherName;
-        const bool isRejected = step.verdict == Verdict::Rejected;
-        order.other = isOther && order.other == nullptr ? &step : order.other;
-        order.rejected = isRejected && order.rejected == nullptr ? &step : order.rejected;
-        if (step.suspended && order.taken == nullptr && !Fulfils(step.element, step.condition))
-        {
-            order.taken = &step;
-            order.suspender = suspender;
-        }
-        suspender = !isOther ? nullptr : suspender != nullptr ? suspender : &step;
-    }
-    return order;
-}
-
-void CheckOrder(const TrailLevel& level, Warnings& warnings)
-{
-    const Order order = OrderOf(level);
-    if (order.other == nullptr || level.steps.front().condition.empty())
-    {
-        return;
-    }
-    const std::string segment =
-        Quoted(Text(level.steps.front().name) + "@" + Text(level.steps.front().condition));
     if (order.taken != nullptr)
     {
-        warnings.Warn(
-            order.taken->element, "suspended condition",
-            warnings.LocationOf(order.taken->element) + " is taken for " + segment +
-                " though it does not fulfil it: " + warnings.Place(order.suspender->element) +
-                ", of another name and in front of it, suspends the condition");
+        warnings.Warn(order.taken, "suspended condition",
+                      warnings.LocationOf(order.taken) + " is taken for " + Quoted(segment) +
+                          " though it does not fulfil it: " + warnings.Place(order.suspender) +
+                          ", of another name and in front of it, suspends the condition");
     }
-    else if (order.rejected != nullptr && warnings.IsNew(level.parent, level.steps.front().name))
+    else if (order.other != nullptr && order.rejected != nullptr &&
+             warnings.IsNew(parent, segment.substr(0, segment.find('@'))))
     {
-        warnings.Warn(order.rejected->element, "condition depends on order",
-                      warnings.LocationOf(order.rejected->element) + " would be taken for " +
-                          segment + " if " + warnings.Place(order.other->element) +
+        warnings.Warn(order.rejected, "condition depends on order",
+                      warnings.LocationOf(order.rejected) + " would be taken for " +
+                          Quoted(segment) + " if " + warnings.Place(order.other) +
                           ", of another name, came right before it");
     }
 }
 
+// A key that somebody gives can hold anything: what is told of it comes from the library's walk.
+
+Order OrderOf(const TrailLevel& level)
+{
+    Order order;
+    const xmlNode* suspender = nullptr; // of the step that is looked at
+    for (const TrailStep& step : level.steps)
+    {
+        const bool isOther = step.verdict == Verdict::OtherName;
+        const bool isRejected = step.verdict == Verdict::Rejected;
+        order.other = isOther && order.other == nullptr ? step.element : order.other;
+        order.rejected = isRejected && order.rejected == nullptr ? step.element : order.rejected;
+        if (step.suspended && order.taken == nullptr && !Fulfils(step.element, step.condition))
+        {
+            order.taken = step.element;
+            order.suspender = suspender;
+        }
+        suspender = !isOther ? nullptr : suspender != nullptr ? suspender : step.element;
+    }
+    return order;
+}
+
 void CheckOrders(const TrailLevel& level, Warnings& warnings)
 {
-    if (!level.steps.empty())
+    if (!level.steps.empty() && !level.steps.front().condition.empty())
     {
-        CheckOrder(level, warnings);
+        const TrailStep& first = level.steps.front();
+        const std::string segment = Text(first.name) + "@" + Text(first.condition);
+        CheckOrder(OrderOf(level), level.parent, segment, warnings);
     }
     for (const TrailStep& step : level.steps)
     {
@@ -151,13 +141,74 @@ void CheckOrders(const TrailLevel& level, Warnings& warnings)
     }
 }
 
+/** An element that a lookup accepts, and the number of levels that it stands below the root. */
+struct Accepted
+{
+    const xmlNode* element;
+    int depth;
+};
+
+/** @return the deepest element accepted on @p level and below, the first of them; else @p above. */
+Accepted DeepestAccepted(const TrailLevel& level, const Accepted& above)
+{
+    Accepted deepest = above;
+    for (const TrailStep& step : level.steps)
+    {
+        if (step.verdict == Verdict::Accepted)
+        {
+            const Accepted here = {step.element, above.depth + 1};
+            const Accepted below =
+                step.below != nullptr ? DeepestAccepted(*step.below, here) : here;
+            deepest = below.depth > deepest.depth ? below : deepest;
+        }
+    }
+    return deepest;
+}
+
+void WarnOfNoValue(const Trail& trail, xmlDoc* document, const std::string& key, Warnings& warnings)
+{
+    const Accepted root = {xmlDocGetRootElement(document), 0};
+    const xmlNode* const end =
+        trail.top == nullptr ? root.element : DeepestAccepted(*trail.top, root).element;
+    warnings.Warn(end, "key without a value",
+                  Quoted(key) + " has no value: it leads as far as " + warnings.LocationOf(end) +
+                      "; kxconfig explain tells why");
+}
+
 void CheckLookup(xmlDoc* document, const std::string& key, Warnings& warnings)
 {
     const Trail trail = RecordLookup(document, key);
-    CheckMatches(trail, key, warnings);
+    Elements found;
+    for (const TrailStep* const step : trail.StepsWithText())
+    {
+        found.push_back(step->element);
+    }
+    if (found.empty())
+    {
+        WarnOfNoValue(trail, document, key, warnings);
+    }
+    CheckMatches(found, key, warnings);
     if (trail.top != nullptr)
     {
         CheckOrders(*trail.top, warnings);
+    }
+}
+
+/** The same for all keys that can be listed, which are too many to walk for each. */
+void CheckListedKeys(const xmlNode* root, Warnings& warnings)
+{
+    Levels levels(root->doc);
+    KeyValues values(root, levels);
+    for (const std::string& key : ListKeys(root, levels))
+    {
+        CheckMatches(values.BearersUnder(key), key, warnings);
+        for (const auto& [parent, segment] : values.NewComparisons())
+        {
+            if (!IsFreeOf("@", segment))
+            {
+                CheckOrder(levels.Below(parent).OrderFor(segment), parent, segment, warnings);
+            }
+        }
     }
 }
 
@@ -302,12 +353,14 @@ ExitStatus Check(const std::string& file, const std::vector<std::string>& keys)
             return status;
         }
     }
-    const auto document = static_cast<xmlDoc*>(reader->GetDataPtr());
     Warnings warnings;
-    Levels levels(document);
-    for (const std::string& key : keys.empty() ? ListKeys(RootOf(*reader), levels) : keys)
+    for (const std::string& key : keys)
     {
-        CheckLookup(document, key, warnings);
+        CheckLookup(static_cast<xmlDoc*>(reader->GetDataPtr()), key, warnings);
+    }
+    if (keys.empty())
+    {
+        CheckListedKeys(RootOf(*reader), warnings);
     }
     CheckElements(RootOf(*reader), warnings);
     CheckSaving(*reader, file, warnings);

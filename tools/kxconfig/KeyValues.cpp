@@ -2,6 +2,9 @@
 
 #include "Nodes.h"
 
+#include <algorithm>
+#include <iterator>
+
 namespace
 {
 
@@ -17,21 +20,6 @@ std::vector<std::string> Segments(const std::string& key)
     return segments;
 }
 
-/** @return the texts of @p elements as the lookup joins them. */
-std::string Joined(const std::vector<const xmlNode*>& elements)
-{
-    std::string joined;
-    for (const xmlNode* const element : elements)
-    {
-        const xmlNode* const text = OnlyTextOf(element);
-        if (text != nullptr)
-        {
-            joined += (joined.empty() ? "" : "\n") + Text(text->content);
-        }
-    }
-    return joined;
-}
-
 } // namespace
 
 KeyValues::KeyValues(const xmlNode* root, Levels& levels) : m_levels(levels)
@@ -40,6 +28,16 @@ KeyValues::KeyValues(const xmlNode* root, Levels& levels) : m_levels(levels)
 }
 
 std::string KeyValues::Under(const std::string& key)
+{
+    std::string joined; // as the lookup joins them
+    for (const xmlNode* const element : BearersUnder(key))
+    {
+        joined += (joined.empty() ? "" : "\n") + Text(OnlyTextOf(element)->content);
+    }
+    return joined;
+}
+
+Elements KeyValues::BearersUnder(const std::string& key)
 {
     const std::vector<std::string> segments = Segments(key);
     size_t shared = 1; // the root
@@ -51,28 +49,39 @@ std::string KeyValues::Under(const std::string& key)
     m_path.resize(shared);
     for (size_t i = shared; i != segments.size(); ++i)
     {
-        m_path.push_back({segments[i], ReachedFrom(m_path.back().reached, segments[i])});
+        m_path.push_back({segments[i], {}});
     }
-    return Joined(m_path.back().reached);
+    m_comparisons.clear();
+    for (const xmlNode* const element : m_path[shared - 1].reached)
+    {
+        ReachFrom(element, shared);
+    }
+    Elements bearers;
+    const Elements& reached = m_path.back().reached;
+    std::copy_if(reached.begin(), reached.end(), std::back_inserter(bearers),
+                 [](const xmlNode* element) { return OnlyTextOf(element) != nullptr; });
+    return bearers;
 }
 
-/** @return what is reached one level further down. */
-std::vector<const xmlNode*> KeyValues::ReachedFrom(const std::vector<const xmlNode*>& above,
-                                                   const std::string& segment)
+/** Reaches what the steps from @p depth on select below @p element. */
+void KeyValues::ReachFrom(const xmlNode* element, size_t depth)
 {
-    std::vector<const xmlNode*> reached;
-    for (const xmlNode* const parent : above)
+    if (depth == m_path.size())
     {
-        // A lookup takes the text of every element on its way, and there is no way on below one.
-        if (OnlyTextOf(parent) != nullptr)
-        {
-            reached.push_back(parent);
-            continue;
-        }
-        for (const Sibling& sibling : m_levels.Below(parent).SelectedBy(segment))
-        {
-            reached.push_back(sibling.element);
-        }
+        return;
     }
-    return reached;
+    // A lookup takes the text of every element on its way, and there is no way on below one.
+    if (OnlyTextOf(element) != nullptr)
+    {
+        m_path[depth].reached.push_back(element);
+        ReachFrom(element, depth + 1);
+        return;
+    }
+    const std::string& segment = m_path[depth].segment;
+    m_comparisons.push_back({element, segment});
+    for (const Sibling& sibling : m_levels.Below(element).SelectedBy(segment))
+    {
+        m_path[depth].reached.push_back(sibling.element);
+        ReachFrom(sibling.element, depth + 1);
+    }
 }

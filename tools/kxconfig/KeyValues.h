@@ -6,8 +6,18 @@
 #include <string>
 #include <vector>
 
+using Elements = std::vector<const xmlNode*>;
+
+/** A level that a key leads to, and the segment that a lookup compares the level's elements with.
+ */
+struct Comparison
+{
+    const xmlNode* parent;
+    std::string segment;
+};
+
 /**
- * The values under many keys of one document, each as GetValue() gives it.
+ * What is under many keys of one document: the values as GetValue() gives them.
  *
  * A lookup compares with every sibling on its way. This reaches the same elements by segments
  * (Levels), and what a key shares with the one before it is not walked again.
@@ -21,19 +31,26 @@ public:
     /** @param key  one that ListKeys() listed. */
     std::string Under(const std::string& key);
 
+    /** @return the elements that give the values under @p key, in document order. */
+    Elements BearersUnder(const std::string& key);
+
+    /** @return the levels that the last key led to and the one before it did not, in the order in
+     * which a lookup comes to them. */
+    const std::vector<Comparison>& NewComparisons() const { return m_comparisons; }
+
 private:
     /** A segment of the last key, and what the key selects up to it. */
     struct Step
     {
         std::string segment;
-        std::vector<const xmlNode*> reached;
+        Elements reached;
     };
 
-    std::vector<const xmlNode*> ReachedFrom(const std::vector<const xmlNode*>& above,
-                                            const std::string& segment);
+    void ReachFrom(const xmlNode* element, size_t depth);
 
     Levels& m_levels;
     std::vector<Step> m_path; ///< starts with the root
+    std::vector<Comparison> m_comparisons;
 };
 
 #endif

@@ -59,6 +59,21 @@ bool ComesFirst(const Sibling& one, const Sibling& other)
     return one.place < other.place;
 }
 
+/** @return the first of @p siblings that is none of @p excepted, or null; both are in order. */
+const Sibling* FirstExcept(const Siblings& excepted, const Siblings& siblings)
+{
+    auto exception = excepted.begin();
+    for (const Sibling& sibling : siblings)
+    {
+        exception = std::lower_bound(exception, excepted.end(), sibling, ComesFirst);
+        if (exception == excepted.end() || exception->element != sibling.element)
+        {
+            return &sibling;
+        }
+    }
+    return nullptr;
+}
+
 } // namespace
 
 bool IsFreeOf(const char* separators, const std::string& text)
@@ -69,7 +84,6 @@ bool IsFreeOf(const char* separators, const std::string& text)
 Level::Level(const xmlNode* parent, const std::map<std::string, Names>& defaulted)
     : m_defaulted(defaulted)
 {
-    size_t place = 0;
     const xmlNode* before = nullptr;
     for (const xmlNode* node = parent->children; node != nullptr; node = node->next)
     {
@@ -77,13 +91,16 @@ Level::Level(const xmlNode* parent, const std::map<std::string, Names>& defaulte
         {
             continue;
         }
-        const Sibling sibling = {place++, node};
+        const Sibling sibling = {m_elements.size(), node};
+        m_elements.push_back(node);
         const std::string name = Text(node->name);
         Namesakes& namesakes = m_byName[name];
         namesakes.all.push_back(sibling);
-        if (before != nullptr && !xmlStrEqual(before->name, node->name))
+        const bool suspended = before != nullptr && !xmlStrEqual(before->name, node->name);
+        if (suspended)
         {
             namesakes.suspended.push_back(sibling);
+            m_otherThanFirst = m_otherThanFirst == nullptr ? node : m_otherThanFirst;
         }
         for (const std::string& condition : ConditionsOf(node))
         {
@@ -122,13 +139,62 @@ Siblings Level::SelectedBy(const std::string& segment) const
     {
         return namesakes->second.all;
     }
-    const auto found = m_fulfilling.find(segment);
-    const Siblings fulfilling = found == m_fulfilling.end() ? Siblings() : found->second;
+    const Siblings& fulfilling = Fulfilling(segment);
     const Siblings& suspended = namesakes->second.suspended;
     Siblings selected;
     std::set_union(fulfilling.begin(), fulfilling.end(), suspended.begin(), suspended.end(),
                    std::back_inserter(selected), ComesFirst);
     return selected;
+}
+
+const Siblings& Level::Fulfilling(const std::string& segment) const
+{
+    static const Siblings kNone;
+    const auto found = m_fulfilling.find(segment);
+    return found == m_fulfilling.end() ? kNone : found->second;
+}
+
+Order Level::OrderFor(const std::string& segment) const
+{
+    const std::string name = segment.substr(0, segment.find('@'));
+    Order order;
+    order.other = FirstNotNamed(name);
+    const auto found = m_byName.find(name);
+    if (found == m_byName.end())
+    {
+        return order;
+    }
+    const Namesakes& namesakes = found->second;
+    const Siblings& fulfilling = Fulfilling(segment);
+    if (const Sibling* const taken = FirstExcept(fulfilling, namesakes.suspended))
+    {
+        order.taken = taken->element;
+        order.suspender = SuspenderOf(*taken, namesakes);
+    }
+    // If none is taken like that, the condition rejects all the others that do not fulfil it.
+    else if (const Sibling* const rejected = FirstExcept(fulfilling, namesakes.all))
+    {
+        order.rejected = rejected->element;
+    }
+    return order;
+}
+
+const xmlNode* Level::FirstNotNamed(const std::string& name) const
+{
+    if (m_elements.empty())
+    {
+        return nullptr;
+    }
+    const xmlNode* const first = m_elements.front();
+    return Text(first->name) == name ? m_otherThanFirst : first;
+}
+
+/** @return the first element after the namesake in front of @p suspended. */
+const xmlNode* Level::SuspenderOf(const Sibling& suspended, const Namesakes& namesakes) const
+{
+    const Siblings& all = namesakes.all;
+    const auto at = std::lower_bound(all.begin(), all.end(), suspended, ComesFirst);
+    return m_elements[at == all.begin() ? 0 : std::prev(at)->place + 1];
 }
 
 /** @return the conditions of one attribute, as "@name=value", that @p element fulfils. */

@@ -20,6 +20,15 @@ struct Sibling
 
 using Siblings = std::vector<Sibling>;
 
+/** The elements on a level whose order matters to a condition; null where there is none. */
+struct Order
+{
+    const xmlNode* other = nullptr;     ///< would suspend the condition if it came first
+    const xmlNode* rejected = nullptr;  ///< would then be taken; matters only if none is
+    const xmlNode* taken = nullptr;     ///< is taken like that as the file stands
+    const xmlNode* suspender = nullptr; ///< suspended the condition for it
+};
+
 /** The element children of one node. */
 class Level
 {
@@ -36,6 +45,10 @@ public:
     /** @return what a lookup takes for @p segment, which SegmentOf() gave for some level. */
     Siblings SelectedBy(const std::string& segment) const;
 
+    /** @return the elements whose order matters to @p segment, which has a condition and which
+     * SegmentOf() gave for some level. */
+    Order OrderFor(const std::string& segment) const;
+
 private:
     struct Namesakes
     {
@@ -44,8 +57,13 @@ private:
     };
 
     std::vector<std::string> ConditionsOf(const xmlNode* element) const;
+    const Siblings& Fulfilling(const std::string& segment) const;
+    const xmlNode* FirstNotNamed(const std::string& name) const;
+    const xmlNode* SuspenderOf(const Sibling& suspended, const Namesakes& namesakes) const;
 
     const std::map<std::string, std::vector<std::string>>& m_defaulted;
+    std::vector<const xmlNode*> m_elements;
+    const xmlNode* m_otherThanFirst = nullptr; ///< the first with another name than the first has
     std::map<std::string, Namesakes> m_byName;
     std::map<std::string, Siblings> m_fulfilling; ///< by name and condition
 };
