@@ -37,9 +37,11 @@ END
     type_in 'cd kx'
     type_in './scripts/quickstart.sh'
 
-    say 'kxconfig for this shell; then a folder of my own, with a small file.'
-    type_in 'export PATH=$PWD/build/release/tools:$PATH'
+    say 'Install it, into a folder of my own; then a folder with a small file.'
+    type_in 'cmake --install build/release --prefix ../usr >../install.log'
+    type_in 'export PATH=$(realpath ../usr/bin):$PATH'
     type_in 'mkdir ../try && cd ../try'
+    type_in 'which kxconfig'
     type_in 'cat >device.xml <<END
 <cfg>
     <net id="1"><ip>10.0.0.1</ip></net>

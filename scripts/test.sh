@@ -9,7 +9,7 @@
 #   arm      everything for ARMv7-A, in both calling conventions, under qemu-arm; the library's size
 #   proof    every line and branch of the library covered; Valgrind; threads; a short run of each fuzz target
 #   speed    the instructions of key operations, against those that were accepted
-#   docs     the reference, built by Doxygen without a warning
+#   docs     the reference, built by Doxygen without a warning; the recording of a new user's first steps
 #   host     fast and package; what runs if no stage is named
 #   all      all of them; what CI runs
 set -euo pipefail
@@ -75,6 +75,7 @@ stage_speed() {
 
 stage_docs() {
     scripts/reference.sh
+    scripts/record_first_steps.sh --check
 }
 
 stage_host() {

@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Runs the suites and the fuzz corpora under Valgrind. Any error fails, and any leak that is not in
+# Runs the suites, the fuzz corpora and kxconfig under Valgrind. Any error fails, and any leak that is not in
 # tests/valgrind.supp.
 set -euo pipefail
 cd "$(dirname "$0")/.."
@@ -26,10 +26,16 @@ check() {
 }
 
 for room in config diag dom faults model platform threads trust; do
-    if [ -x $build/tests/$room/${room}_tests ]; then
-        KX_EVALUATIONS=4000 check $build/tests/$room/${room}_tests
-    fi
+    KX_EVALUATIONS=4000 check $build/tests/$room/${room}_tests
 done
 for target in keypath document loader; do
     check $build/fuzz/replay_$target fuzz/corpus/$target
+done
+
+# The client as a person runs it. What it answers is tested elsewhere.
+sample=examples/data/gateway.xml
+for arguments in "get $sample gateway.name" "keys $sample" "find $sample //@*" "explain $sample gateway.log.level" \
+    "explain --set $sample gateway.name" "set --dry-run $sample gateway.name crate" "--json keys $sample"; do
+    # shellcheck disable=SC2086  # words without blanks in them
+    check $build/tools/kxconfig $arguments
 done

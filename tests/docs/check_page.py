@@ -124,7 +124,8 @@ class Checker:
         (clone / "build/release").symlink_to(self.options.build)
         (tools / "kxconfig").symlink_to(self.options.build / "tools/kxconfig")
         compiler = tools / "g++"
-        compiler.write_text(f'#!/bin/sh\nexec {self.options.cxx} {self.options.cxx_flags} "$@"\n')
+        # By its path: the wrapper is found first under its own name.
+        compiler.write_text(f'#!/bin/sh\nexec {shutil.which(self.options.cxx)} {self.options.cxx_flags} "$@"\n')
         compiler.chmod(0o755)
         self.environment = dict(os.environ, KX=str(clone), LC_ALL="C.UTF-8",
                                 PATH=f"{tools}:{os.environ['PATH']}")

@@ -175,6 +175,10 @@ TEST_F(KxconfigExplain, TellsOfKeysThatNameNothing)
                     "line 1: /cfg: the key \"cfg\" has no \".\", so nothing is sought\n"
                     "GetValue(key): \"\"\n"
                     "GetValue(key, value): status 7 (malformed key), value \"\"\n");
+    ExpectExplained("", 2,
+                    "line 1: /cfg: the key is empty, so nothing is sought\n"
+                    "GetValue(key): \"\"\n"
+                    "GetValue(key, value): status 22 (missing object or empty key), value \"\"\n");
     ExpectExplained("cfg.", 1,
                     kRoot + "below /cfg: the key ends in \".\", so nothing is sought\n"
                             "GetValue(key): \"\"\n"

@@ -360,7 +360,11 @@ void TellRoot(const xmlNode* root, const std::string& key)
     const std::string::size_type dot = key.find('.');
     const std::string name = Text(root->name);
     std::string told = "the key starts with the root's name";
-    if (dot == std::string::npos)
+    if (key.empty())
+    {
+        told = "the key is empty, so nothing is sought";
+    }
+    else if (dot == std::string::npos)
     {
         told = "the key " + Quoted(key) + " has no \".\", so nothing is sought";
     }
