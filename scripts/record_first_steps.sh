@@ -81,7 +81,7 @@ END'
 # What changes from run to run, or with every edit of a source: the times and source lines of log records.
 steady() {
     sed -E -e 's/^[0-9]{4}-[0-9-]{5}T[0-9:.]{12} /2026-01-01T12:00:00.000 /' -e 's/^(2026-01-01T12:00:00.000 [a-z]+ [~A-Za-z]+):[0-9]+ /\1:1 /' \
-        -e 's/ +$//' -e 's/\$last_status/$?/' -e "s#$empty#/home/me#g"
+        -e '/^warning: source repository is shallow/d' -e 's/ +$//' -e 's/\$last_status/$?/' -e "s#$empty#/home/me#g"
 }
 
 (cd "$empty" && unset KX_LOG_MASK && session) 2>&1 | steady >"$new"
