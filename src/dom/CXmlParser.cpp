@@ -26,7 +26,7 @@ const int kOpenForReading = O_RDONLY | O_LARGEFILE;
 const int kOpenForReading = O_RDONLY;
 #endif
 
-/** By the system's own call: a file stream would do no more, and costs the library 2 KiB. */
+/** By the system's own call: a file stream would do no more, and takes more code. */
 bool CanBeOpened(const char* path)
 {
     const int file = open(path, kOpenForReading);
