@@ -148,6 +148,14 @@ TEST(Gate, OfBothRecordsLogsThemUnderTheOperation)
     EXPECT_EQ(Records({Trace("BothRecords", "+"), Trace("BothRecords", "-")}), log.Take());
 }
 
+TEST(Gate, OfBothRecordsReadsTheMaskAnewForTheSecond)
+{
+    LogRecorder log(kMaskTrace);
+    LogRecorder::OnNextCall([] { LogRecorder::SetMask(kMaskNone); });
+    BothRecords();
+    EXPECT_EQ(Records({Trace("BothRecords", "+")}), log.Take());
+}
+
 TEST(Gate, HandsOverTheLineOfItsSite)
 {
     LogRecorder log;

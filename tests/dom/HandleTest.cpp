@@ -279,6 +279,26 @@ TEST_F(HandleTest, NavigationThatFindsNothingSetsNoPointer)
     }
 }
 
+// Who reads the log of a crash sees which operation was looking.
+TEST_F(HandleTest, NavigationLogsItsEntryBeforeItLooks)
+{
+    xmlNodePtr const lonely = NodeOf(Parse("<lonely/>"), "/lonely");
+    xmlNodePtr const middle = NodeOf(Parse("<a><x/><m><c/></m><y/></a>"), "//m");
+    const auto found = [&](const std::function<CXmlNode(CXmlNode&)>& operation)
+    {
+        CXmlNode node(lonely);
+        LogRecorder log(kMaskTrace);
+        LogRecorder::OnNextCall([&] { node.SetXmlNodePtr(middle); });
+        return operation(node).Name();
+    };
+    EXPECT_EQ("a", found([](CXmlNode& node) { return node.Parent(); }));
+    EXPECT_EQ("c", found([](CXmlNode& node) { return node.FirstChild(); }));
+    EXPECT_EQ("c", found([](CXmlNode& node) { return node.LastChild(); }));
+    EXPECT_EQ("y", found([](CXmlNode& node) { return node.NextSibling(); }));
+    EXPECT_EQ("x", found([](CXmlNode& node) { return node.PrevSibling(); }));
+    EXPECT_EQ("c", found([](CXmlNode& node) { return node.FindChildNode("c"); }));
+}
+
 TEST_F(HandleTest, ReturnedHandleIsTheObjectThatTheCallerReceives)
 {
     CXmlNode net(Node("//net"));

@@ -5,6 +5,7 @@
 #include <cstdarg>
 #include <cstdio>
 #include <ostream>
+#include <utility>
 
 LumLogParams g_LumLogParams = {};
 
@@ -17,6 +18,7 @@ unsigned long g_calls = 0;
 unsigned long g_throwAt = 0;
 int g_lastLine = 0;
 std::string g_lastFormat;
+std::function<void()> g_onNextCall;
 
 } // namespace
 
@@ -47,6 +49,10 @@ extern "C" int KxLog(int line, int level, const char* tag, const char* format, .
         g_records.push_back({level, tag, text});
         g_lastLine = line;
         g_lastFormat = format;
+    }
+    if (g_onNextCall)
+    {
+        std::exchange(g_onNextCall, nullptr)();
     }
     return -1; // whatever: callers ignore it
 }
@@ -100,6 +106,7 @@ LogRecorder::~LogRecorder()
     SetMask(kMaskNone);
     g_recording = false;
     g_throwAt = 0;
+    g_onNextCall = nullptr;
 }
 
 Records LogRecorder::Take()
@@ -131,6 +138,10 @@ void LogRecorder::Note(const Record& record)
 unsigned long LogRecorder::Calls()
 {
     return g_calls;
+}
+void LogRecorder::OnNextCall(std::function<void()> act)
+{
+    g_onNextCall = std::move(act);
 }
 void LogRecorder::ThrowAt(unsigned long n)
 {

@@ -4,6 +4,7 @@
 // The test program's own KxLog and g_LumLogParams: they take precedence over the platform's and
 // keep every record for comparison.
 
+#include <functional>
 #include <iosfwd>
 #include <string>
 #include <vector>
@@ -91,6 +92,9 @@ public:
 
     /** Number of KxLog calls in the life of the process, recorded or not. */
     static unsigned long Calls();
+
+    /** Makes the next KxLog call run @p act, once. */
+    static void OnNextCall(std::function<void()> act);
 
     /** Makes the n-th KxLog call from now on throw @p n > 0, or none with 0. */
     static void ThrowAt(unsigned long n);
