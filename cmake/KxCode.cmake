@@ -1,5 +1,7 @@
 # How the project's own code is compiled.
 
+include(CheckCXXCompilerFlag)
+
 # In the spelling of GCC 4.4, the target's compiler.
 function(kx_warnings target)
     target_compile_options(${target} PRIVATE -Wall -Wextra -pedantic -Wshadow -Wconversion)
@@ -45,4 +47,26 @@ function(kx_exports target script)
         target_link_options(${target} PRIVATE LINKER:--no-undefined)
     endif()
     set_property(TARGET ${target} APPEND PROPERTY LINK_DEPENDS ${script})
+endfunction()
+
+# Calls of a shared library's own functions: no table, and no call where the compiler would rather have the
+# function's code in place. What the library does not define itself stays replaceable.
+check_cxx_compiler_flag(-fno-semantic-interposition KX_HAS_NO_SEMANTIC_INTERPOSITION)
+function(kx_binds_own_calls target)
+    if(KX_HAS_NO_SEMANTIC_INTERPOSITION)
+        target_compile_options(${target} PRIVATE -fno-semantic-interposition)
+    endif()
+    target_link_options(${target} PRIVATE LINKER:-Bsymbolic-functions)
+endfunction()
+
+# Compiles the target's sources that match as one, where it is built to be fast or small. Otherwise each is for
+# itself, and compile_commands.json names it.
+function(kx_compiles_together target group regex)
+    if(NOT CMAKE_BUILD_TYPE MATCHES "Rel")
+        return()
+    endif()
+    get_target_property(sources ${target} SOURCES)
+    list(FILTER sources INCLUDE REGEX "${regex}")
+    set_source_files_properties(${sources} PROPERTIES UNITY_GROUP ${group})
+    set_target_properties(${target} PROPERTIES UNITY_BUILD ON UNITY_BUILD_MODE GROUP)
 endfunction()
