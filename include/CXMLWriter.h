@@ -18,7 +18,8 @@
  *
  * @par Logging
  * Records pass through the platform's KxLog() under the operation's bare name and only if bit
- * (1 << level) of the library's mask word in g_LumLogParams is set: 9 errors, 11 trace, 29 keys.
+ * (1 << level) of the library's mask word in g_LumLogParams is set: 9 errors, 11 trace
+ * ("+" on entry and "-" on return unless told otherwise), 29 keys.
  */
 
 #include <string>
@@ -124,6 +125,7 @@ public:
      * | a&lt;b                 | the text; the bracket is escaped when saved           |
      * | a&amp;amp;b            | the text a&amp;b; saved as a&amp;amp;b                |
      * | a&amp;b                | nothing, or what the engine's version makes of it     |
+     * | a &amp; b;             | the same, or a file that saves, but does not load     |
      * | &amp;name; (undefined) | a reference; the file saves, but does not load again  |
      * | empty                  | nothing: a later SetValue() does not reach it         |
      *
@@ -139,8 +141,8 @@ public:
      * - 0 also, with nothing changed, if the text before the first "." is not the root's name,
      * - 7 without a document or with an empty key ("Document structure pointer m_pXmlDoc is NULL",
      *   level 9), or if the key has no ".",
-     * - 22 if the document has no root element; also if the key ends in "." and the last level that
-     *   was entered is the one after it, though elements may have been updated,
+     * - 22 if the document has no root element; also, though elements were updated, if the key ends
+     *   in "." and the last level that was entered is the one after it,
      * - -2 if nothing was updated.
      *
      * Logs "Key %s" with the key (level 11) in place of "+" and no "-".
@@ -200,7 +202,7 @@ public:
      *         returned, or 0 if there was none.
      *
      * Logs "Key :: %s" with the key (level 29) for this level and for each that it descends into,
-     * unless that returns 22.
+     * unless that returns 22 at once.
      */
     int XMLSetValue(_xmlNode* node, const std::string& key, std::string& value,
                     unsigned int& updated);

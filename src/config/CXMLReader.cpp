@@ -108,18 +108,14 @@ int CXMLReader::GetValue(const std::string& key, std::string& value)
         // The lookup works on the key's own bytes, which must not be those that it appends to.
         return CXMLReader::GetValue(std::string(key), value);
     }
+    KX_TRACE("+");
     if (m_pXmlDoc == 0 || key.empty())
     {
-        KX_TRACE("+");
         KX_ERROR("Document structure pointer m_pXmlDoc is NULL");
         KX_TRACE("-");
         return StatusMissing;
     }
-    KX_LOG_EITHER(LogLevelTrace, LogLevelValue)
-    {
-        KX_TRACE("+");
-        KX_VALUE_OF("Key is %s", key.c_str());
-    }
+    KX_VALUE_OF("Key is %s", key.c_str());
     const int status = FindValues(m_pXmlDoc, TextView(key), value);
     KX_LOG_EITHER(LogLevelValue, LogLevelTrace)
     {

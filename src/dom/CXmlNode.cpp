@@ -112,8 +112,9 @@ int CXmlNode::ClearNode()
 {
     KX_TRACE("+");
     int status = StatusMissing;
-    if (OwnsItsContent(m_pXmlNode) && RemoveChildren(m_pXmlNode))
+    if (OwnsItsContent(m_pXmlNode))
     {
+        RemoveChildren(m_pXmlNode);
         RemoveAttributes(m_pXmlNode);
         status = StatusOk;
     }

@@ -115,8 +115,9 @@ int CXmlNode::SetContent(std::string text)
 {
     KX_TRACE("+");
     int status = StatusMissing;
-    if (OwnsItsContent(m_pXmlNode) && ReplaceContent(m_pXmlNode, text))
+    if (OwnsItsContent(m_pXmlNode))
     {
+        ReplaceContent(m_pXmlNode, text);
         status = StatusOk;
     }
     KX_TRACE("-");

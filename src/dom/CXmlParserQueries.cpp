@@ -144,8 +144,9 @@ int CXmlParser::RemoveNode(CXmlNode node)
 {
     KX_TRACE("+");
     int status = StatusMissing;
-    if (!node.IsNull() && CanBeRemoved(node.m_pXmlNode) && RemoveFromTree(node.m_pXmlNode))
+    if (!node.IsNull() && CanBeRemoved(node.m_pXmlNode))
     {
+        FreeFromTree(node.m_pXmlNode);
         status = StatusOk;
     }
     KX_TRACE("-");

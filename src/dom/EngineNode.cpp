@@ -1,5 +1,6 @@
 #include "EngineNode.h"
 
+#include <libxml/hash.h>
 #include <libxml/valid.h>
 
 namespace kx
@@ -37,27 +38,110 @@ bool IsAttribute(const xmlNode* node)
     return node != 0 && node->type == XML_ATTRIBUTE_NODE;
 }
 
-/**
- * Makes the attribute that @p node is, or is a piece of, an ordinary one if it is an ID.
- *
- * The engine's table of IDs finds an entry by the attribute's value: an attribute whose value was
- * changed would stay in the table after it is freed.
- *
- * @return false if the engine could not, for want of memory: then the value must stay as it is.
- */
-bool ForgetId(xmlNode* node)
+#if LIBXML_VERSION < 21400
+
+/** An attribute, and the value under which the engine's table of IDs has it. */
+struct TableEntry
 {
-    xmlNode* const owner = IsAttribute(node) ? node : LinkOf(node, &xmlNode::parent);
-    if (!IsAttribute(owner))
+    const xmlAttr* attribute;
+    const xmlChar* value;
+};
+
+// Called by the engine, whose older headers have the values writable.
+
+template <class Char>
+void FindEntry(void* id, void* wanted, Char* value)
+{
+    TableEntry* const entry = static_cast<TableEntry*>(wanted);
+    if (static_cast<const xmlID*>(id)->attr == entry->attribute)
     {
-        return true;
+        entry->value = value;
     }
-    xmlAttr* const attribute = reinterpret_cast<xmlAttr*>(owner);
+}
+
+template <class Char>
+void FreeId(void* id, Char* /*value*/)
+{
+    xmlFree(const_cast<xmlChar*>(static_cast<xmlID*>(id)->value));
+    xmlFree(id);
+}
+
+/** Takes the ID @p attribute out of the table, wherever it is. */
+void RemoveFromTable(xmlAttr* attribute)
+{
+    xmlHashTable* const ids = static_cast<xmlHashTable*>(attribute->doc->ids);
+    TableEntry entry = {attribute, 0};
+    xmlHashScan(ids, FindEntry, &entry);
+    if (entry.value != 0)
+    {
+        xmlHashRemoveEntry(ids, entry.value, FreeId);
+    }
+    attribute->atype = XML_ATTRIBUTE_CDATA;
+}
+
+#endif
+
+/**
+ * Makes @p attribute an ordinary one if it is an ID.
+ *
+ * The engine would leave an attribute in its table of IDs, to look at it again after it is freed,
+ * if it does not find it there. Up to 2.13 it looks for a copy of the value that it makes out of
+ * the attribute: it finds none that has changed, nor one with blanks to strip or with a reference
+ * to an entity, nor any when memory is short.
+ */
+void ForgetId(xmlAttr* attribute)
+{
+    if (attribute->atype != XML_ATTRIBUTE_ID)
+    {
+        return;
+    }
+    xmlRemoveID(attribute->doc, attribute);
+#if LIBXML_VERSION < 21400
     if (attribute->atype == XML_ATTRIBUTE_ID)
     {
-        xmlRemoveID(attribute->doc, attribute);
+        RemoveFromTable(attribute);
     }
-    return attribute->atype != XML_ATTRIBUTE_ID;
+#endif
+}
+
+/** The same of the attribute that @p node is, or is a piece of; there may be none. */
+void ForgetIdOf(xmlNode* node)
+{
+    xmlNode* const owner = IsAttribute(node) ? node : LinkOf(node, &xmlNode::parent);
+    if (IsAttribute(owner))
+    {
+        ForgetId(reinterpret_cast<xmlAttr*>(owner));
+    }
+}
+
+/** @return what follows @p node in document order among what @p top holds, or null. */
+xmlNode* NextWithin(const xmlNode* top, xmlNode* node)
+{
+    // A reference's children are those of the entity's declaration.
+    if (node->children != 0 && node->type != XML_ENTITY_REF_NODE)
+    {
+        return node->children;
+    }
+    while (node != top && node->next == 0)
+    {
+        node = node->parent;
+    }
+    return node != top ? node->next : 0;
+}
+
+/** The same of every attribute that is freed with @p top. */
+void ForgetIdsWithin(xmlNode* top)
+{
+    ForgetIdOf(top);
+    xmlNode* node = top->doc != 0 && top->doc->ids != 0 ? top : 0;
+    while (node != 0)
+    {
+        for (xmlAttr* attribute = AttributesOf(node); attribute != 0; attribute = attribute->next)
+        {
+            ForgetId(attribute);
+        }
+        node = NextWithin(top, node);
+    }
 }
 
 /** Whether @p attribute has a name and, unless @p value is empty, a text. */
@@ -121,33 +205,29 @@ bool AddAttribute(xmlNode* node, const std::string& name, const std::string& val
     xmlAttr* const attribute = xmlNewNsProp(node, 0, ToEngine(name), ToEngine(value));
     if (attribute != 0 && !IsWhole(attribute, value))
     {
+        ForgetId(attribute);
         xmlRemoveProp(attribute);
         return false;
     }
     return attribute != 0;
 }
 
-bool ReplaceContent(xmlNode* node, const std::string& text)
+void ReplaceContent(xmlNode* node, const std::string& text)
 {
-    if (!ForgetId(node))
+    ForgetIdOf(node);
+    for (xmlNode* child = node->children; child != 0; child = child->next)
     {
-        return false;
+        ForgetIdsWithin(child);
     }
     xmlNodeSetContent(node, ToEngine(text));
-    return true;
 }
 
-bool RemoveChildren(xmlNode* node)
+void RemoveChildren(xmlNode* node)
 {
-    if (IsAttribute(node) && !ForgetId(node))
-    {
-        return false;
-    }
     while (node->children != 0)
     {
         FreeFromTree(node->children);
     }
-    return true;
 }
 
 void RemoveAttributes(xmlNode* node)
@@ -156,23 +236,14 @@ void RemoveAttributes(xmlNode* node)
     bool removed = true;
     while (removed && AttributesOf(node) != 0)
     {
+        ForgetId(AttributesOf(node));
         removed = xmlRemoveProp(AttributesOf(node)) == 0;
     }
 }
 
-bool RemoveFromTree(xmlNode* node)
-{
-    // An attribute that goes as a whole is taken out of the table by the engine.
-    if (!IsAttribute(node) && !ForgetId(node))
-    {
-        return false;
-    }
-    FreeFromTree(node);
-    return true;
-}
-
 void FreeFromTree(xmlNode* node)
 {
+    ForgetIdsWithin(node);
     xmlUnlinkNode(node);
     xmlFreeNode(node);
 }

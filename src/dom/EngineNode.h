@@ -104,22 +104,16 @@ xmlNode* WholeElement(xmlNode* element);
 /** Adds an attribute to @p node. @return whether the engine made it, name and value and all. */
 bool AddAttribute(xmlNode* node, const std::string& name, const std::string& value);
 
-/** Replaces the content of @p node, which owns it. @return false if memory is short. */
-bool ReplaceContent(xmlNode* node, const std::string& text);
+/** Replaces the content of @p node, which owns it. */
+void ReplaceContent(xmlNode* node, const std::string& text);
 
-/** Removes every child of @p node, which owns them. @return false if memory is short. */
-bool RemoveChildren(xmlNode* node);
+/** Removes every child of @p node, which owns them. */
+void RemoveChildren(xmlNode* node);
 
 /** Removes every attribute of @p node. */
 void RemoveAttributes(xmlNode* node);
 
-/**
- * Takes @p node out of its tree and frees it with all that it holds. @return false if memory is
- * short: then it stays.
- */
-bool RemoveFromTree(xmlNode* node);
-
-/** The same of a node that is no piece of an attribute's value: that cannot fail. */
+/** Takes @p node out of its tree and frees it with all that it holds. */
 void FreeFromTree(xmlNode* node);
 
 } // namespace kx

@@ -7,6 +7,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cerrno>
 #include <memory>
 
 using namespace kxtest;
@@ -541,16 +542,6 @@ TEST_F(ConditionTest, AttributeThatCannotBeReadForWantOfMemoryDoesNotMatch)
     }
 }
 
-TEST_F(ConditionTest, NamesOfAnyLengthAreFound)
-{
-    for (const std::size_t length : {1u, 62u, 63u, 64u, 65u, 1000u})
-    {
-        const std::string name(length, 'n');
-        EXPECT_TRUE(Accepts(name + "='1'", name + "=1")) << length;
-        EXPECT_FALSE(Accepts(name + "n='1'", name + "=1")) << length;
-    }
-}
-
 TEST_F(ConditionTest, AttributeIsFoundWhateverItsPrefixAndByItsDefault)
 {
     EXPECT_EQ(Found("v"), Ask("<cfg xmlns:p='urn:p'><e p:a='1'>v</e></cfg>", "cfg.e@a=1"));
@@ -745,6 +736,30 @@ TEST_F(LookupTest, KeyAndValueReachTheLogAsArgumentsOnly)
     ASSERT_EQ(7u, records.size());
     EXPECT_EQ(Value("GetValue", "Parsed Value :: %n%s%d"), records[5]);
     EXPECT_EQ(-2, m_reader->GetValue("cfg.%s%s%s.%n", value));
+}
+
+TEST_F(LookupTest, StatusesAreReturnedAndNeverStoredInErrno)
+{
+    CXMLReader empty;
+    std::string value;
+    errno = 1234;
+    for (const char* const key : {"", "cfg", "cfg.missing", "other.name", "cfg.name"})
+    {
+        m_reader->GetValue(key, value);
+        empty.GetValue(key, value);
+    }
+    EXPECT_EQ(1234, errno);
+}
+
+// Who reads the log of a crash sees which operation was looking.
+TEST_F(LookupTest, LogsItsEntryBeforeItLooks)
+{
+    CXMLReader reader;
+    std::string value;
+    LogRecorder log(kMaskTrace);
+    LogRecorder::OnNextCall([&] { reader.ParseFile(m_folder.Path("cfg.xml")); });
+    EXPECT_EQ(0, reader.GetValue("cfg.name", value));
+    EXPECT_EQ("box", value);
 }
 
 TEST_F(LookupTest, AMaskThatChangesTakesEffectAtTheNextOperation)

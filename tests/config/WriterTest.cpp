@@ -248,6 +248,40 @@ TEST_F(WriterTest, ParseFileReturnsTheResultOfSetPathWhenTheParseSucceeds)
     EXPECT_EQ(22, writer.ParseFile(m_missing));
 }
 
+namespace
+{
+
+/** Saves what it holds before it takes a new path. */
+class SavingWriter : public CXMLWriter
+{
+public:
+    using CXMLWriter::CXMLWriter;
+
+    int SetPath(const std::string& path) override
+    {
+        LogRecorder::Note(Engine("SetPath"));
+        SaveData();
+        return CXMLWriter::SetPath(path);
+    }
+};
+
+} // namespace
+
+TEST_F(WriterTest, ParseFileSetsThePathAfterItsEntryAndBeforeItFreesTheEarlierDocument)
+{
+    SavingWriter writer(m_file);
+    EXPECT_EQ(0, writer.SetValue("cfg.name", "kept"));
+    EngineCalls calls;
+    calls.ShowAmongRecords();
+    LogRecorder log;
+    EXPECT_EQ(0, writer.ParseFile(m_other));
+    EXPECT_EQ(Records({Trace("ParseFile", "+"), Engine("SetPath"), Trace("SaveData", "+"),
+                       Engine("xmlSaveFileEnc"), Engine("xmlFreeDoc"), Engine("xmlParseFile"),
+                       Trace("ParseFile", "-")}),
+              log.Take());
+    EXPECT_EQ(kDeclaration + "<cfg><name>kept</name></cfg>\n", ReadFile(m_file));
+}
+
 // --- SetPath
 
 TEST_F(WriterTest, SetPathNamesThePathWithoutParsingOrLogging)
@@ -381,6 +415,31 @@ TEST_F(WriterTest, SaveDataKeepsTheDocument)
     EXPECT_EQ(0, writer.SaveData());
     EXPECT_EQ(0u, calls.Frees());
     EXPECT_EQ(kDeclaration + "<cfg><name>again</name></cfg>\n", ReadFile(m_file));
+}
+
+TEST_F(WriterTest, SaveDataLeavesTheDocumentUnchanged)
+{
+    for (const char* const head : {"", "<?xml version='1.0' encoding='ISO-8859-1'?>"})
+    {
+        const OwnedDocument document(ParseText(
+            std::string(head) + "<!DOCTYPE cfg [<!ENTITY e 'x'>]>\n<cfg> <a>&e;</a></cfg>"));
+        const auto whole = [&document]
+        {
+            xmlChar* text = nullptr;
+            int size = 0;
+            xmlDocDumpMemory(document.get(), &text, &size); // in the document's own encoding
+            const std::string copy(reinterpret_cast<char*>(text), static_cast<std::size_t>(size));
+            xmlFree(text);
+            return copy;
+        };
+        const std::string before = whole();
+        CXMLWriter writer;
+        writer.SetDataPtr(document.get());
+        writer.SetPath(m_other);
+        EXPECT_EQ(0, writer.SaveData());
+        EXPECT_EQ(before, whole());
+        writer.SetDataPtr(nullptr);
+    }
 }
 
 TEST_F(WriterTest, AnyNegativeAnswerOfTheEngineIsAFailure)

@@ -290,3 +290,9 @@ TEST_F(AttributeTest, SetAttributeValueAnswersSuccessAndDoesNothing)
     ExpectRecords(records, [&] { m_net.SetAttributeValue("id", "x"); });
     ExpectRecords(records, [&] { m_null.SetAttributeValue("id", "x"); });
 }
+
+TEST_F(AttributeTest, FirstPieceThatIsAReferenceShowsWhatItStandsFor)
+{
+    EXPECT_EQ(Pairs({{"a", "xyz"}}),
+              Items(NodeOf(Parse("<!DOCTYPE e [<!ENTITY x 'xyz'>]><e a='&x; two'/>"), "/e")));
+}

@@ -491,3 +491,19 @@ TEST_F(ChildrenTest, RemovingAMissingChildAnswers22)
                       [&] { node.RemoveChildNode("cfg"); });
     }
 }
+
+TEST_F(ChildrenTest, AddedChildTakesADefaultNamespace)
+{
+    const xmlDocPtr document = Parse("<r xmlns='urn:d'/>");
+    CXmlNode(document->children).AddChildNode("c", "");
+    EXPECT_EQ(document->children->ns, document->children->children->ns);
+}
+
+TEST_F(ChildrenTest, ContentOfAnAddedChildIsMadeForTheDocument)
+{
+    const xmlDocPtr document = Parse("<!DOCTYPE r [<!ENTITY e 'words'>]><r/>");
+    CXmlNode root(xmlDocGetRootElement(document));
+    root.AddChildNode("c", "x &e; y").AddSiblingNode("s", "x &e; y");
+    EXPECT_NE(nullptr, NodeOf(document, "/r/c[. = 'x words y']"));
+    EXPECT_NE(nullptr, NodeOf(document, "/r/s[. = 'x words y']"));
+}

@@ -321,6 +321,32 @@ TEST_F(HandleTest, ClearNodeLeavesTheElementEmptyInItsPlace)
     EXPECT_EQ("<r><x/><e/><y/></r>", TextOf(document->children));
 }
 
+namespace
+{
+
+std::vector<xmlElementType> g_freed;
+
+void NoteFreed(xmlNodePtr node)
+{
+    g_freed.push_back(node->type);
+}
+
+} // namespace
+
+// A client that has data of its own behind the nodes frees it in this order.
+TEST_F(HandleTest, ClearNodeRemovesChildrenBeforeAttributes)
+{
+    const xmlDocPtr document = Parse("<e a='1' b='2'><c/><d/></e>");
+    const auto before = xmlDeregisterNodeDefault(NoteFreed);
+    g_freed.clear();
+    EXPECT_EQ(0, CXmlNode(document->children).ClearNode());
+    xmlDeregisterNodeDefault(before);
+    // An attribute is told before its text.
+    EXPECT_EQ((std::vector<xmlElementType>{XML_ELEMENT_NODE, XML_ELEMENT_NODE, XML_ATTRIBUTE_NODE,
+                                           XML_TEXT_NODE, XML_ATTRIBUTE_NODE, XML_TEXT_NODE}),
+              g_freed);
+}
+
 TEST_F(HandleTest, ClearNodeKeepsNamespaceAndItsDeclarations)
 {
     const xmlDocPtr document = Parse("<p:e xmlns:p='urn:p' xmlns:q='urn:q' q:a='1'><p:c/></p:e>");

@@ -513,39 +513,6 @@ protected:
     CXmlParser m_parser;
 };
 
-TEST_F(NodeTest, IdWhoseValueWasChangedIsNoIdAnyMore)
-{
-    const auto changes = {+[](xmlNodePtr id) { CXmlNode(id).SetContent("i2"); },
-                          +[](xmlNodePtr id) { CXmlNode(id).ClearNode(); },
-                          +[](xmlNodePtr id) { CXmlNode(id->children).SetContent("i2"); },
-                          +[](xmlNodePtr id) { CXmlParser().RemoveNode(CXmlNode(id->children)); }};
-    for (const auto& change : changes)
-    {
-        const xmlDocPtr document = Parse(kXml);
-        const xmlNodePtr id = NodeOf(document, "/a/@id");
-        ASSERT_NE(nullptr, NodeOf(document, "id('i1')"));
-        change(id);
-        EXPECT_EQ(nullptr, NodeOf(document, "id('i1')"));
-        // Freed now, and the engine must not look at it again.
-        EXPECT_EQ(0, m_parser.RemoveNode(CXmlNode(id)));
-        EXPECT_EQ(nullptr, NodeOf(document, "id('i1') | id('i2')"));
-    }
-}
-
-TEST_F(NodeTest, RemovedIdAttributeIsForgotten)
-{
-    const xmlDocPtr document = Parse(kXml);
-    EXPECT_EQ(0, m_parser.RemoveNode(CXmlNode(NodeOf(document, "/a/@id"))));
-    EXPECT_EQ(nullptr, NodeOf(document, "id('i1')"));
-}
-
-TEST_F(NodeTest, OtherIdsStay)
-{
-    const xmlDocPtr document = Parse(kXml);
-    CXmlNode(NodeOf(document, "/a/@q")).SetContent("i1");
-    EXPECT_NE(nullptr, NodeOf(document, "id('i1')"));
-}
-
 TEST_F(NodeTest, EntityWhoseContentLiesInTheDocumentIsNotCleared)
 {
     // As some engines leave it when they replace references while parsing.

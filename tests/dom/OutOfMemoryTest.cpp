@@ -4,7 +4,6 @@
 #include "DomTest.h"
 
 #include <libxml/parser.h>
-#include <libxml/valid.h>
 #include <libxml/xpath.h>
 
 #include <sys/wait.h>
@@ -161,45 +160,6 @@ TEST_F(OutOfMemoryTest, SettingContentLosesNoMemory)
             EXPECT_EQ(0, memory.Live());
             return failed;
         });
-}
-
-TEST_F(OutOfMemoryTest, AttributeStaysAnIdWhileItsValueCannotBeChanged)
-{
-    // Older engines need memory to find the ID that an attribute is; newer ones keep it there.
-    const xmlDocPtr lookedUp = Parse("<!DOCTYPE a [<!ATTLIST a id ID #IMPLIED>]><a id='i'/>");
-    const xmlNodePtr attribute = NodeOf(lookedUp, "/a/@id");
-    const EngineMemory memory;
-    EXPECT_EQ(0, xmlRemoveID(lookedUp, reinterpret_cast<xmlAttrPtr>(attribute)));
-    const std::size_t fewest = memory.Requests();
-
-    const auto changes = {+[](xmlNodePtr id) { return CXmlNode(id).SetContent("other"); },
-                          +[](xmlNodePtr id) { return CXmlNode(id).ClearNode(); },
-                          +[](xmlNodePtr id) { return CXmlNode(id->children).SetContent("other"); },
-                          +[](xmlNodePtr id)
-                          { return CXmlParser().RemoveNode(CXmlNode(id->children)); }};
-    for (const auto& change : changes)
-    {
-        FailInTurn(
-            [&](std::size_t n)
-            {
-                const xmlDocPtr document = Parse("<!DOCTYPE a [<!ATTLIST a id ID #IMPLIED>]><a "
-                                                 "id='a rather long value of it'/>");
-                const xmlNodePtr id = NodeOf(document, "/a/@id");
-                int status = -1;
-                const bool failed = Failing(n, [&] { status = change(id); });
-                EXPECT_TRUE(status == 0 || (failed && status == 22)) << status;
-                if (status == 22)
-                {
-                    EXPECT_EQ("<a id=\"a rather long value of it\"/>",
-                              TextOf(xmlDocGetRootElement(document)));
-                }
-                // Freed now, and the engine must not look at it again.
-                EXPECT_EQ(0, CXmlParser().RemoveNode(CXmlNode(id)));
-                EXPECT_EQ(nullptr, NodeOf(document, "id('a rather long value of it')"));
-                return failed;
-            },
-            fewest);
-    }
 }
 
 TEST_F(OutOfMemoryTest, ContentIsReadOrEmpty)

@@ -85,6 +85,11 @@ TEST(KxLog, TakesBackOnlyTheSignalThatItRaised)
     EXPECT_EQ(0, RunProgram({kProbe, "pending"}).status);
 }
 
+TEST(KxLog, LetsACancelledThreadEnd)
+{
+    EXPECT_EQ(0, RunProgram({kProbe, "cancel"}).status);
+}
+
 TEST(KxLog, WritesOnAfterPartialAndInterruptedWrites)
 {
     const Outcome outcome = RunProgram({kProbe, "piecemeal"});

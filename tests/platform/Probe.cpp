@@ -2,6 +2,7 @@
 
 #include "KxLog.h"
 
+#include <atomic>
 #include <cerrno>
 #include <csignal>
 #include <cstdio>
@@ -11,6 +12,7 @@
 #include <string>
 
 #include <fcntl.h>
+#include <pthread.h>
 #include <sys/time.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -88,6 +90,30 @@ int LogWithPendingSignal()
     sigset_t pending;
     sigpending(&pending);
     return sigismember(&pending, SIGPIPE) == 1 ? 0 : 3;
+}
+
+/** Cancels a thread that then logs: it ends in the write, and nothing but the thread does. */
+int LogWhenCancelled()
+{
+    std::atomic<bool> cancelled(false);
+    pthread_t thread;
+    const auto run = [](void* go) -> void*
+    {
+        while (!static_cast<std::atomic<bool>*>(go)->load())
+        {
+        }
+        KxLog(1, 9, "Tag", "lost");
+        return nullptr;
+    };
+    if (pthread_create(&thread, nullptr, run, &cancelled) != 0)
+    {
+        return 2;
+    }
+    pthread_cancel(thread);
+    cancelled = true;
+    void* ending = nullptr;
+    pthread_join(thread, &ending);
+    return ending == PTHREAD_CANCELED ? 0 : 3;
 }
 
 void Nothing(int)
@@ -191,6 +217,10 @@ int main(int argc, char** argv)
     if (task == "memory")
     {
         return LogWithoutMemory();
+    }
+    if (task == "cancel")
+    {
+        return LogWhenCancelled();
     }
     if (task == "pending")
     {

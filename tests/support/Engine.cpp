@@ -31,6 +31,7 @@ int g_saveResult = 0;
 
 std::optional<int> g_formatSaveAnswer;
 std::optional<xmlXPathObjectPtr> g_xpathAnswer;
+std::optional<xmlDocPtr> g_parseAnswer;
 xmlXPathObjectPtr g_lastXPath = nullptr;
 bool g_refuseContext = false;
 bool g_refuseSibling = false;
@@ -84,6 +85,12 @@ extern "C" xmlDocPtr xmlParseFile(const char* path)
         g_parsed.push_back(path);
         Show("xmlParseFile");
     }
+    if (g_parseAnswer)
+    {
+        const xmlDocPtr answer = *g_parseAnswer;
+        g_parseAnswer.reset();
+        return answer;
+    }
     return engine(path);
 }
 
@@ -127,6 +134,7 @@ extern "C" int xmlKeepBlanksDefault(int value)
     if (g_noting)
     {
         g_blanksDefaults.push_back(value);
+        Show("xmlKeepBlanksDefault");
     }
     return engine(value);
 }
@@ -255,6 +263,10 @@ void RefuseNextXPathContext()
 void AnswerNextXPath(xmlXPathObjectPtr result)
 {
     g_xpathAnswer = result;
+}
+void AnswerNextParse(xmlDocPtr document)
+{
+    g_parseAnswer = document;
 }
 xmlXPathObjectPtr LastXPath()
 {

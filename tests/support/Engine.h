@@ -66,6 +66,9 @@ void RefuseNextXPathContext();
 /** Makes the next call of xmlXPathEvalExpression do nothing and answer @p result. */
 void AnswerNextXPath(xmlXPathObjectPtr result);
 
+/** Makes the next call of xmlParseFile parse nothing and answer @p document. */
+void AnswerNextParse(xmlDocPtr document);
+
 /** @return what xmlXPathEvalExpression answered last; possibly freed since. */
 xmlXPathObjectPtr LastXPath();
 
