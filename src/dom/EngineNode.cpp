@@ -72,10 +72,7 @@ void RemoveFromTable(xmlAttr* attribute)
     xmlHashTable* const ids = static_cast<xmlHashTable*>(attribute->doc->ids);
     TableEntry entry = {attribute, 0};
     xmlHashScan(ids, FindEntry, &entry);
-    if (entry.value != 0)
-    {
-        xmlHashRemoveEntry(ids, entry.value, FreeId);
-    }
+    xmlHashRemoveEntry(ids, entry.value, FreeId); // does nothing without a value
     attribute->atype = XML_ATTRIBUTE_CDATA;
 }
 

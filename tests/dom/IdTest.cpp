@@ -173,3 +173,17 @@ TEST_F(IdTest, ElementWhoseContentIsReplacedKeepsItsId)
     EXPECT_EQ(0, CXmlNode(NodeOf(document, "//b[. = 'one']")).SetContent("new"));
     EXPECT_NE(nullptr, NodeOf(document, "id('plain')"));
 }
+
+TEST_F(IdTest, NodesWithoutADocumentHaveNone)
+{
+    const auto name = reinterpret_cast<const xmlChar*>("b");
+    const xmlNodePtr element = xmlNewNode(nullptr, name);
+    xmlNewChild(element, nullptr, name, nullptr);
+    xmlNewProp(element, reinterpret_cast<const xmlChar*>("id"), name);
+    ASSERT_EQ(nullptr, element->doc);
+    CXmlNode handle(element);
+    EXPECT_EQ(0, handle.ClearNode());
+    EXPECT_EQ(nullptr, element->children);
+    EXPECT_EQ(nullptr, element->properties);
+    EXPECT_EQ(0, CXmlParser().RemoveNode(handle));
+}
