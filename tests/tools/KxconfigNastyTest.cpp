@@ -156,3 +156,23 @@ TEST_F(KxconfigNasty, ALongValueAndALongAttribute)
     EXPECT_EQ("cfg.a\t\"" + value + "\"\ncfg.b@i=" + attribute + "\t\"1\"\ncfg.b\t\"1\\n2\"\n",
               Tool({"keys", file}).out);
 }
+
+TEST_F(KxconfigNasty, NamesThatATerminalShouldNotBeShownAreEscaped)
+{
+    const std::pair<std::string, std::string> names[] = {
+        {"caf\xC3\xA9 \xE2\x82\xAC \xED\x9F\xBF \xF0\x9F\x98\x80 \xF4\x8F\xBF\xBF",
+         "caf\xC3\xA9 \xE2\x82\xAC \xED\x9F\xBF \xF0\x9F\x98\x80 \xF4\x8F\xBF\xBF"},
+        {"a\nb\x1B\x7F\xC2\x9B", "a\\nb\\x1b\\x7f\\xc2\\x9b"},
+        {"caf\xE9", "caf\\xe9"},
+        {"\x80 \xBF", "\\x80 \\xbf"},                            // the rest of a character
+        {"\xE2\x82 \xF0\x9F\x98", "\\xe2\\x82 \\xf0\\x9f\\x98"}, // the start of one
+        {"\xC1\x9B \xE0\x82\x9B", "\\xc1\\x9b \\xe0\\x82\\x9b"}, // in too many bytes
+        {"\xF0\x8F\xBF\xBF", "\\xf0\\x8f\\xbf\\xbf"},
+        {"\xED\xA0\x80 \xF4\x90\x80\x80 \xF5",
+         "\\xed\\xa0\\x80 \\xf4\\x90\\x80\\x80 \\xf5"}}; // none that there is
+    for (const auto& [name, shown] : names)
+    {
+        ExpectComplaint(Tool({"get", m_folder.Path(name), "cfg.a"}), 3,
+                        "cannot read " + m_folder.Path(shown) + ": No such file or directory");
+    }
+}

@@ -43,10 +43,16 @@ enum class Colour
 /** @return @p text in colour if standard output is a terminal and the user has not said no. */
 std::string Painted(Colour colour, const std::string& text);
 
-/** @return @p text with its control characters written as escapes. */
+/** @return @p text with its control characters, and bytes that are no UTF-8, written as escapes. */
 std::string OnOneLine(const std::string& text);
 
-/** @return @p text in double quotes and on one line: control characters are written as escapes. */
+/** @return @p text in double quotes and on one line, as OnOneLine() writes it. */
 std::string Quoted(const std::string& text);
+
+/** The same of a text that may be as long as the file: only its start, and then "...". */
+std::string QuotedStart(const std::string& text);
+
+/** @return where the character begins that @p position is in: there a text can be cut. */
+size_t StartOfCharacter(const std::string& text, size_t position);
 
 #endif
