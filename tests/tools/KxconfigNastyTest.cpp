@@ -176,3 +176,30 @@ TEST_F(KxconfigNasty, NamesThatATerminalShouldNotBeShownAreEscaped)
                         "cannot read " + m_folder.Path(shown) + ": No such file or directory");
     }
 }
+
+TEST_F(KxconfigNasty, RunningOutOfMemory)
+{
+    // As many keys as this, each with the long attribute, are 2 GB.
+    std::string xml = "<cfg><b i='" + std::string(1000000, 'x') + "'>";
+    for (int i = 0; i != 2000; ++i)
+    {
+        xml += "<c i='" + std::to_string(i) + "'>1</c>";
+    }
+    const std::string file = m_folder.Write("cfg.xml", xml + "</b><b i='2'>1</b></cfg>");
+    const auto limited = [](const std::string& arguments)
+    { return RunShell("ulimit -v 400000; exec " + InShell(KX_CONFIG_TOOL) + " " + arguments); };
+    if (limited("--version").status != 0)
+    {
+        GTEST_SKIP()
+            << "needs a program that runs in little address space, not an instrumented one";
+    }
+    ExpectComplaint(limited("keys '" + file + "'"), 4, "out of memory");
+    ExpectComplaint(limited("check '" + file + "'"), 4, "out of memory");
+    const Outcome outcome = limited("--json keys '" + file + "'");
+    EXPECT_EQ(4, outcome.status);
+    EXPECT_EQ("", outcome.err);
+    const nlohmann::json answer = nlohmann::json::parse(outcome.out);
+    EXPECT_EQ(4, answer.at("status"));
+    EXPECT_EQ(nlohmann::json({"out of memory"}), answer.at("messages"));
+    EXPECT_TRUE(answer.at("results").empty());
+}

@@ -24,7 +24,7 @@ const ExitStatusMeaning kExitStatuses[] = {
     {ExitStatus::BadUsage, "bad usage, malformed key or expression"},
     {ExitStatus::BadFile, "the file cannot be read, or is not well-formed XML"},
     {ExitStatus::NotSaved,
-     "saving or printing failed; a file that could not be saved is as it was"},
+     "saving or printing failed, or memory ran out; a file that could not be saved is as it was"},
 };
 
 #endif

@@ -203,6 +203,13 @@ ExitStatus Finish(ExitStatus status)
     return ExitStatus::NotSaved;
 }
 
+ExitStatus FinishOutOfMemory()
+{
+    g_answer["results"] = Json::array(); // there may be no room to write them
+    Complain("out of memory");
+    return Finish(ExitStatus::NotSaved);
+}
+
 std::string Painted(Colour colour, const std::string& text)
 {
     return ShowsColours(STDOUT_FILENO) ? Coloured(colour, text) : text;

@@ -33,6 +33,9 @@ void Complain(const std::string& message);
 /** Ends the output. @return @p status, or NotSaved if the output could not be written. */
 ExitStatus Finish(ExitStatus status);
 
+/** The same when memory ran out on the way: says so, without the results in JSON. */
+ExitStatus FinishOutOfMemory();
+
 enum class Colour
 {
     Good,

@@ -11,6 +11,7 @@
 #include <cstdlib>
 #include <cstring>
 #include <functional>
+#include <new>
 #include <sstream>
 
 namespace
@@ -223,5 +224,12 @@ ExitStatus Run(int argc, char** argv)
 
 int main(int argc, char** argv)
 {
-    return static_cast<int>(Finish(Run(argc, argv)));
+    try
+    {
+        return static_cast<int>(Finish(Run(argc, argv)));
+    }
+    catch (const std::bad_alloc&)
+    {
+        return static_cast<int>(FinishOutOfMemory());
+    }
 }
