@@ -1,6 +1,8 @@
 #include "RandomDocument.h"
 #include "ToolTest.h"
 
+#include "CXMLWriter.h"
+
 #include <nlohmann/json.hpp>
 
 #include <chrono>
@@ -194,6 +196,13 @@ TEST_F(KxconfigCheck, TellsWhatSavingChangesFirst)
     expect(kDeclaration + "<cfg/>\n", {});
     expect("<cfg/>\n", {"1: saving changes the XML declaration: none becomes \"<?xml "
                         "version=\\\"1.0\\\" encoding=\\\"UTF-8\\\"?>\""});
+    expect("<?xml\tversion=\"1.0\" encoding=\"UTF-8\"?>\n<cfg/>\n",
+           {"1: saving changes the XML declaration: \"<?xml\\x09version=\\\"1.0\\\" "
+            "encoding=\\\"UTF-8\\\"?>\" becomes \"<?xml version=\\\"1.0\\\" "
+            "encoding=\\\"UTF-8\\\"?>\""});
+    expect("<?xml-stylesheet href=\"a\"?>\n<cfg/>\n",
+           {"1: saving changes the XML declaration: none becomes \"<?xml version=\\\"1.0\\\" "
+            "encoding=\\\"UTF-8\\\"?>\""});
     expect("<?xml version=\"1.0\" encoding=\"ISO-8859-1\"?>\n<cfg/>\n",
            {"1: saving changes the XML declaration: \"<?xml version=\\\"1.0\\\" "
             "encoding=\\\"ISO-8859-1\\\"?>\" becomes \"<?xml version=\\\"1.0\\\" "
@@ -216,6 +225,82 @@ TEST_F(KxconfigCheck, TellsWhatSavingChangesFirst)
            {"2: saving changes line ends (carriage returns): \"\\x0d\" becomes \"\""});
     expect(kDeclaration + "<cfg/>", {"2: saving changes the end of the file: \"\\n\" is added"});
     expect(kDeclaration + "<cfg/>\n\n", {"3: saving changes the end of the file: \"\\n\" is lost"});
+}
+
+TEST_F(KxconfigCheck, TellsThatSavingChangesAFileIfTheLibraryDoesChangeIt)
+{
+    const std::vector<std::string> documents = {
+        "<cfg/>",
+        kDeclaration + "<cfg/>\n",
+        kDeclaration + "<cfg>\n  <a i=\"1\">x &lt; y &amp; z &gt;</a>\n</cfg>\n",
+        kDeclaration + "<cfg><a i='1'></a></cfg>\n",
+        kDeclaration + "<cfg><a><![CDATA[<x>]]></a><b>y<!-- c -->z</b><?p i?></cfg>\n",
+        kDeclaration + "<!-- before -->\n<cfg/>\n<!-- behind -->\n<?p i?>\n",
+        kDeclaration + "<cfg a=\"&#10;&quot;\">&#13;\xC3\xA9\xF0\x9F\x98\x80</cfg>\n",
+        kDeclaration + "<!DOCTYPE cfg [\n<!ENTITY e \"x\">\n<!ATTLIST a i CDATA \"1\">\n]>\n"
+                       "<cfg><a>&e;</a></cfg>\n",
+        kDeclaration + "<!DOCTYPE cfg SYSTEM \"missing.dtd\">\n<cfg>&e;</cfg>\n",
+        kDeclaration + "<html xmlns=\"http://www.w3.org/1999/xhtml\"><p/><br></br></html>\n",
+        kDeclaration +
+            "<!DOCTYPE html PUBLIC \"-//W3C//DTD XHTML 1.0 Strict//EN\" "
+            "\"http://www.w3.org/TR/xhtml1/DTD/xhtml1-strict.dtd\">\n"
+            "<html xmlns=\"http://www.w3.org/1999/xhtml\"><head/><body><p/><br/></body></html>\n",
+        "<?xml version=\"1.0\" encoding=\"UTF-8\" standalone=\"yes\"?>\n<cfg/>\n",
+        "<?xml version=\"1.1\"?>\n<cfg/>\n",
+        "<?xml version=\"1.0\" encoding=\"ISO-8859-1\"?>\n<cfg>gr\xFCn</cfg>\n"};
+    for (const std::string& document : documents)
+    {
+        const std::string loaded = m_folder.Write("loaded.xml", document);
+        const std::string saved = m_folder.Path("saved.xml");
+        CXMLWriter writer(loaded);
+        writer.SetPath(saved);
+        ASSERT_EQ(0, writer.SaveData());
+        for (const std::string& file : {loaded, saved})
+        {
+            CXMLWriter again(file);
+            again.SetPath(m_folder.Path("again.xml"));
+            ASSERT_EQ(0, again.SaveData());
+            const bool changes = ReadFile(file) != ReadFile(m_folder.Path("again.xml"));
+            const std::string out = Tool({"check", file}).out;
+            EXPECT_EQ(changes, out.find(": saving changes ") != std::string::npos)
+                << ReadFile(file) << out;
+        }
+    }
+}
+
+TEST_F(KxconfigCheck, NeedsNoPlaceForTemporaryFiles)
+{
+    Write("<cfg><a>1</a></cfg>");
+    const Outcome outcome =
+        Tool({"check", m_file}, {"TMPDIR=" + m_folder.Path("missing"), "KX_LOG_MASK="});
+    EXPECT_EQ(0, outcome.status) << outcome.err;
+    EXPECT_EQ("", outcome.out + outcome.err);
+}
+
+TEST_F(KxconfigCheck, ReadsAPipeOnceAndTellsNothingOfSaving)
+{
+    Write("<cfg>\n<a>1</a>\n<a>2</a></cfg>");
+    const Outcome outcome =
+        RunShell("cat '" + m_file + "' | " + InShell(KX_CONFIG_TOOL) + " check /dev/stdin");
+    EXPECT_EQ("/dev/stdin:4: \"cfg.a\" matches 2 elements, the first of them /cfg/a[1] (line 3)\n",
+              outcome.out);
+    EXPECT_EQ(1, outcome.status);
+    EXPECT_EQ("", outcome.err);
+}
+
+TEST_F(KxconfigCheck, EscapesTheBytesOfAFileInAnotherEncoding)
+{
+    m_file = m_folder.Write("cfg.xml", "<?xml version=\"1.0\" encoding=\"ISO-8859-1\"?>\n"
+                                       "<cfg>gr\xFCn</cfg>\n");
+    EXPECT_THAT(Tool({"check", m_file, "cfg."}).out,
+                HasSubstr(":2: saving changes the text: \"\\xfcn</cfg>\" becomes "
+                          "\"\xC3\xBCn</cfg>\"\n"));
+    // The character is shown whole also where its first byte is what the file has.
+    m_file = m_folder.Write("cfg.xml", "<?xml version=\"1.0\" encoding=\"ISO-8859-1\"?>\n"
+                                       "<cfg>\xC3z</cfg>\n");
+    EXPECT_THAT(Tool({"check", m_file, "cfg."}).out,
+                HasSubstr(":2: saving changes the text: \"\\xc3z</cfg>\" becomes "
+                          "\"\xC3\x83z</cfg>\"\n"));
 }
 
 TEST_F(KxconfigCheck, TellsOfAFileOfOtherBytesThanItsCharacters)

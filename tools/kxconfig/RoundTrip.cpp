@@ -1,49 +1,51 @@
 #include "RoundTrip.h"
 
-#include "Document.h"
 #include "Output.h"
 
+#include <libxml/tree.h>
+
 #include <algorithm>
+#include <cstring>
 #include <filesystem>
 #include <fstream>
-#include <sstream>
-
-#include <stdlib.h>
-#include <unistd.h>
+#include <memory>
+#include <new>
+#include <optional>
 
 namespace
 {
 
-const size_t kShownText = 40;
-
-std::string BytesOf(const std::string& path)
+/** @return the bytes of the file at @p path; none of what cannot be read a second time: the engine
+ * has read a pipe to its end. */
+std::optional<std::string> BytesOf(const std::string& path)
 {
-    std::ostringstream bytes;
-    bytes << std::ifstream(path, std::ios::binary).rdbuf();
-    return bytes.str();
+    std::error_code error;
+    if (!std::filesystem::is_regular_file(path, error))
+    {
+        return std::nullopt;
+    }
+    const auto size = std::filesystem::file_size(path, error);
+    std::string bytes(error ? 0 : size, '\0');
+    std::ifstream file(path, std::ios::binary);
+    const bool isRead = !error && file.read(bytes.data(), static_cast<std::streamsize>(size));
+    return isRead ? std::optional(bytes) : std::nullopt;
 }
 
-/** A file that is gone when the object is. */
-class ScratchFile
+/** @return what the writer would write: it saves with the engine's other call of this pair, which
+ * writes the same bytes to a file. */
+std::string SavedBytes(xmlDoc* document)
 {
-public:
-    ScratchFile() : m_path(std::filesystem::temp_directory_path() / "kxconfig-XXXXXX")
+    xmlChar* bytes = nullptr;
+    int size = 0;
+    xmlDocDumpMemoryEnc(document, &bytes, &size, "UTF-8");
+    if (bytes == nullptr)
     {
-        const int file = mkstemp(m_path.data());
-        m_failed = file < 0 || close(file) != 0;
+        throw std::bad_alloc();
     }
-
-    ~ScratchFile() { unlink(m_path.c_str()); }
-    ScratchFile(const ScratchFile&) = delete;
-    ScratchFile& operator=(const ScratchFile&) = delete;
-
-    bool Failed() const { return m_failed; }
-    const std::string& Path() const { return m_path; }
-
-private:
-    std::string m_path;
-    bool m_failed;
-};
+    const auto release = [](xmlChar* owned) { xmlFree(owned); };
+    const std::unique_ptr<xmlChar, decltype(release)> owner(bytes, release);
+    return {reinterpret_cast<const char*>(bytes), static_cast<size_t>(size)};
+}
 
 /** A file's bytes, taken apart where saving treats them in different ways. */
 struct Parts
@@ -51,7 +53,7 @@ struct Parts
     explicit Parts(const std::string& bytes) : rest(bytes)
     {
         hasMark = Take("\xEF\xBB\xBF");
-        if (rest.compare(0, 6, "<?xml ") == 0)
+        if (StartsWithDeclaration())
         {
             const size_t end = std::min(rest.find("?>"), rest.size() - 2) + 2;
             declaration = rest.substr(0, end);
@@ -65,6 +67,13 @@ struct Parts
     std::string rest;
 
 private:
+    bool StartsWithDeclaration() const
+    {
+        const std::string name = "<?xml"; // "<?xml-stylesheet" starts like it
+        return rest.compare(0, name.size(), name) == 0 && rest.size() > name.size() &&
+               std::strchr(" \t\r\n", rest[name.size()]) != nullptr;
+    }
+
     bool Take(const std::string& start)
     {
         const bool there = rest.compare(0, start.size(), start) == 0;
@@ -75,8 +84,7 @@ private:
 
 std::string Shown(const std::string& text, size_t position)
 {
-    const std::string line = text.substr(position, text.find('\n', position) - position);
-    return line.size() > kShownText ? Quoted(line.substr(0, kShownText)) + "..." : Quoted(line);
+    return QuotedStart(text.substr(position, text.find('\n', position) - position));
 }
 
 /** @return whether @p position of @p text lies between "<" and ">". */
@@ -112,16 +120,15 @@ std::string DifferenceAtTheEnd(const std::string& before, const std::string& aft
     const bool isAdded = before.size() < after.size();
     const std::string& longer = isAdded ? after : before;
     const std::string end = longer.substr(std::min(before.size(), after.size()));
-    const bool fits = end.size() <= kShownText;
-    return "the end of the file: " + Quoted(end.substr(0, kShownText)) + (fits ? "" : "...") +
-           (isAdded ? " is added" : " is lost");
+    return "the end of the file: " + QuotedStart(end) + (isAdded ? " is added" : " is lost");
 }
 
 Difference FirstDifference(const std::string& before, const std::string& after, long line)
 {
     const auto length = static_cast<std::ptrdiff_t>(std::min(before.size(), after.size()));
     const auto end = std::mismatch(before.begin(), before.begin() + length, after.begin()).first;
-    const auto position = static_cast<size_t>(end - before.begin());
+    // What is saved is UTF-8, whatever the file is, and is not to be shown from within a character.
+    const size_t position = StartOfCharacter(after, static_cast<size_t>(end - before.begin()));
     line += std::count(before.begin(), end, '\n');
     if (position == before.size() || position == after.size())
     {
@@ -169,18 +176,15 @@ std::vector<Difference> Compare(const Parts& before, const Parts& after)
 
 std::vector<Difference> WhatSavingChanges(CXMLReader& reader, const std::string& file)
 {
-    const ScratchFile saved;
-    GuestWriter writer(reader);
-    writer.Get().SetPath(saved.Path());
-    if (saved.Failed() || writer.Get().SaveData() != 0)
+    const std::optional<std::string> bytes = BytesOf(file);
+    if (!bytes)
     {
-        return {{1, "the whole file: it could not be saved to try"}};
+        return {};
     }
-    const std::string bytes = BytesOf(file);
-    const std::string reason = WhyNotCompared(bytes);
+    const std::string reason = WhyNotCompared(*bytes);
     if (!reason.empty())
     {
         return {{1, reason}};
     }
-    return Compare(Parts(bytes), Parts(BytesOf(saved.Path())));
+    return Compare(Parts(*bytes), Parts(SavedBytes(static_cast<xmlDoc*>(reader.GetDataPtr()))));
 }

@@ -14,7 +14,8 @@ struct Difference
 };
 
 /** @return the first difference in the XML declaration and the first one after it; none, if the
- * writer would save @p reader's document as @p file has it, byte for byte. */
+ * writer would save @p reader's document as @p file has it, byte for byte. None either of what is
+ * no regular file: its bytes were there to be read once, by the engine. */
 std::vector<Difference> WhatSavingChanges(CXMLReader& reader, const std::string& file);
 
 #endif
