@@ -171,6 +171,66 @@ TEST_F(KxconfigCheck, WarnsOfValuesThatALookupCannotSee)
          "5: /cfg/c has no value though it holds \"t\": it has 2 children: text, element d"});
 }
 
+TEST_F(KxconfigCheck, WarnsOfATextInTheRoot)
+{
+    Write("<cfg>text</cfg>");
+    ExpectWarnings(
+        {"2: /cfg has no value though it holds \"text\": it is the root, and a key names "
+         "elements below it"});
+    Write("<cfg> </cfg>");
+    ExpectWarnings({});
+}
+
+TEST_F(KxconfigCheck, TakesAReferenceForContentWhateverItStandsFor)
+{
+    const auto expect =
+        [this](const std::string& subset, const std::string& line, const std::string& name)
+    {
+        Write("<!DOCTYPE cfg " + subset + ">\n<cfg><a>&" + name + ";</a></cfg>");
+        ExpectWarnings({line + ": /cfg/a has no value though it holds \"&" + name +
+                        ";\": its only child is no text: entity reference &" + name + ";"});
+    };
+    expect("[\n<!ENTITY full \"x\">\n]", "5", "full");
+    expect("[\n<!ENTITY none \"\">\n]", "5", "none");
+    expect("SYSTEM \"missing.dtd\"", "3", "unknown");
+}
+
+TEST_F(KxconfigCheck, ExpandsNoReferences)
+{
+    // As much as every engine lets pass; engines that let more pass would run out of memory.
+    const std::string entity(4000, 'x');
+    std::string references;
+    for (int i = 0; i != 200; ++i)
+    {
+        references += "&e;";
+    }
+    Write("<!DOCTYPE cfg [\n<!ENTITY e \"" + entity + "\">\n]>\n<cfg><a>" + references +
+          "</a></cfg>");
+    ExpectWarnings({"5: /cfg/a has no value though it holds "
+                    "\"&e;&e;&e;&e;&e;&e;&e;&e;&e;&e;&e;&e;&e;&\"...: it has 200 children: entity "
+                    "reference &e;, entity reference &e;, entity reference &e;, entity reference "
+                    "&e;, entity reference &e;, ..."});
+}
+
+TEST_F(KxconfigCheck, ShowsOfALongTextTheFirstFortyBytesInWholeCharacters)
+{
+    const std::string text(39, 'x');
+    const auto expect = [this](const std::string& held, const std::string& shown)
+    {
+        Write("<cfg><a><![CDATA[" + held + "]]></a></cfg>");
+        ExpectWarnings({"2: /cfg/a has no value though it holds " + shown +
+                        ": its only child is no text: CDATA section"});
+    };
+    expect(text + "y", "\"" + text + "y\"");
+    expect(text + "yz", "\"" + text + "y\"...");
+    expect(text + "\xC3\xA9", "\"" + text + "\"...");
+    Write("<cfg>\n<a >" + text.substr(2) + "\xC3\xA9z</a></cfg>");
+    ExpectWarnings({"3: saving changes white space or quotes in a tag: \" >" + text.substr(2) +
+                    "\"... becomes \">" + text.substr(2) + "\xC3\xA9\"..."});
+    Write("<cfg>\n<a i=\"" + text + "yz\"/>\n<a i=\"" + text + "yz\"/>\n<a/></cfg>");
+    ExpectWarnings({"4: /cfg/a[2] has the same i=\"" + text + "y\"... as /cfg/a[1] (line 3)"});
+}
+
 TEST_F(KxconfigCheck, WarnsOfNamesThatAKeyCannotHold)
 {
     Write("<cfg>\n<a.b>1</a.b></cfg>");
@@ -184,6 +244,55 @@ TEST_F(KxconfigCheck, WarnsOfAttributesThatNoLongerTellElementsApart)
     ExpectWarnings({"5: /cfg/a[3] has the same i=\"1\" as /cfg/a[1] (line 3)"});
     Write("<cfg>\n<a t=\"x\" i=\"1\"/>\n<a t=\"x\" i=\"2\"/></cfg>");
     ExpectWarnings({});
+}
+
+TEST_F(KxconfigCheck, WarnsOfARepeatedAttributeThatTheFirstElementLacks)
+{
+    Write("<cfg>\n<a/>\n<a i=\"1\"/>\n<a i=\"1\"/></cfg>");
+    ExpectWarnings({"5: /cfg/a[3] has the same i=\"1\" as /cfg/a[2] (line 4)"});
+}
+
+TEST_F(KxconfigCheck, TakesAllAttributesTogetherForWhatTellsElementsApart)
+{
+    Write("<cfg>\n<a c=\"1\" l=\"x\"/>\n<a c=\"1\" l=\"y\"/>\n<a c=\"2\" l=\"x\"/>\n"
+          "<a c=\"2\" l=\"y\"/></cfg>");
+    ExpectWarnings({});
+    Write("<cfg>\n<a c=\"1\" l=\"x\"/>\n<a c=\"1\" l=\"y\"/>\n<a c=\"2\" l=\"x\"/>\n"
+          "<a l=\"y\" c=\"1\"/></cfg>");
+    ExpectWarnings({"6: /cfg/a[4] has the same c=\"1\" l=\"y\" as /cfg/a[2] (line 4)"});
+}
+
+TEST_F(KxconfigCheck, TakesNoAttributeThatIsTheSameEverywhereForOneThatTellsElementsApart)
+{
+    Write("<cfg>\n<a u=\"C\"/>\n<a u=\"C\"/></cfg>");
+    ExpectWarnings({});
+    Write("<cfg>\n<a u=\"C\"/>\n<a u=\"C\"/>\n<a u=\"C\" i=\"1\"/></cfg>");
+    ExpectWarnings({});
+}
+
+TEST_F(KxconfigCheck, TakesAttributesAsConditionsSeeThem)
+{
+    // By the name without a prefix, of which the first counts, and with the DTD's default.
+    Write("<!DOCTYPE cfg [\n<!ATTLIST a i CDATA \"1\">\n]>\n<cfg xmlns:p=\"urn:p\">\n<a/>\n"
+          "<a i=\"1\"/>\n<a p:i=\"1\" i=\"2\"/>\n<a i=\"3\"/></cfg>");
+    ExpectWarnings({"7: /cfg/a[2] has the same i=\"1\" as /cfg/a[1] (line 6); 1 more of that name "
+                    "repeat others"});
+}
+
+TEST_F(KxconfigCheck, WarnsOnceOfTheElementsOfANameWhoseAttributesRepeat)
+{
+    Write("<cfg>\n<a i=\"1\"/>\n<a i=\"2\"/>\n<a i=\"1\"/>\n<a i=\"2\"/>\n<a i=\"1\"/>\n"
+          "<b i=\"1\"/>\n<b i=\"1\"/>\n<b i=\"2\"/></cfg>");
+    ExpectWarnings({"5: /cfg/a[3] has the same i=\"1\" as /cfg/a[1] (line 3); 2 more of that name "
+                    "repeat others",
+                    "9: /cfg/b[2] has the same i=\"1\" as /cfg/b[1] (line 8)"});
+}
+
+TEST_F(KxconfigCheck, ListsThreeOfTheAttributesThatRepeat)
+{
+    Write("<cfg>\n<a i=\"1\" j=\"2\" k=\"3\" l=\"4\"/>\n<a/>\n"
+          "<a i=\"1\" j=\"2\" k=\"3\" l=\"4\"/></cfg>");
+    ExpectWarnings({"5: /cfg/a[3] has the same i=\"1\" j=\"2\" k=\"3\" ... as /cfg/a[1] (line 3)"});
 }
 
 TEST_F(KxconfigCheck, TellsWhatSavingChangesFirst)

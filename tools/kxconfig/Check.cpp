@@ -1,73 +1,17 @@
+#include "CheckElements.h"
 #include "Commands.h"
 #include "Document.h"
 #include "KeyList.h"
 #include "KeyValues.h"
-#include "Locations.h"
+#include "Levels.h"
 #include "Nodes.h"
 #include "Output.h"
 #include "RoundTrip.h"
 #include "Trail.h"
-
-#include <map>
-#include <set>
+#include "Warnings.h"
 
 namespace
 {
-
-/** What there is to warn of, each once. */
-class Warnings
-{
-public:
-    void Warn(const xmlNode* node, const char* kind, const std::string& text)
-    {
-        Warn(LineNumberOf(node), kind, text);
-    }
-
-    void Warn(long line, const char* kind, const std::string& text)
-    {
-        if (m_texts.insert(text).second)
-        {
-            m_byLine.emplace(line, Warning{kind, text});
-        }
-    }
-
-    /** @return true once for each @p level and @p name: what many keys share is told once. */
-    bool IsNew(const xmlNode* level, std::string_view name)
-    {
-        return m_levels.emplace(level, Text(name)).second;
-    }
-
-    std::string LocationOf(const xmlNode* node) { return m_locations.Of(node); }
-
-    std::string Place(const xmlNode* node)
-    {
-        return LocationOf(node) + " (line " + LineOf(node) + ")";
-    }
-
-    /** Prints them by line. @return whether there are any. */
-    bool PrintFor(const std::string& file) const
-    {
-        for (const auto& [line, warning] : m_byLine)
-        {
-            const std::string place = file + ":" + std::to_string(line) + ": ";
-            Print(OnOneLine(place + warning.text),
-                  {{"line", line}, {"kind", warning.kind}, {"text", warning.text}});
-        }
-        return !m_byLine.empty();
-    }
-
-private:
-    struct Warning
-    {
-        const char* kind;
-        std::string text;
-    };
-
-    Locations m_locations;
-    std::multimap<long, Warning> m_byLine;
-    std::set<std::string> m_texts;
-    std::set<std::pair<const xmlNode*, std::string>> m_levels;
-};
 
 // Keys: what a lookup finds, and what it would find if the elements stood in another order.
 
@@ -85,6 +29,7 @@ void CheckMatches(const Elements& found, const std::string& key, Warnings& warni
 void CheckOrder(const Order& order, const xmlNode* parent, const std::string& segment,
                 Warnings& warnings)
 {
+    const std::string name = segment.substr(0, segment.find('@'));
     if (order.taken != nullptr)
     {
         warnings.Warn(order.taken, "suspended condition",
@@ -93,7 +38,7 @@ void CheckOrder(const Order& order, const xmlNode* parent, const std::string& se
                           ", of another name and in front of it, suspends the condition");
     }
     else if (order.other != nullptr && order.rejected != nullptr &&
-             warnings.IsNew(parent, segment.substr(0, segment.find('@'))))
+             warnings.IsNew("condition depends on order", parent, name))
     {
         warnings.Warn(order.rejected, "condition depends on order",
                       warnings.LocationOf(order.rejected) + " would be taken for " +
@@ -195,9 +140,8 @@ void CheckLookup(xmlDoc* document, const std::string& key, Warnings& warnings)
 }
 
 /** The same for all keys that can be listed, which are too many to walk for each. */
-void CheckListedKeys(const xmlNode* root, Warnings& warnings)
+void CheckListedKeys(const xmlNode* root, Levels& levels, Warnings& warnings)
 {
-    Levels levels(root->doc);
     KeyValues values(root, levels);
     for (const std::string& key : ListKeys(root, levels))
     {
@@ -208,122 +152,6 @@ void CheckListedKeys(const xmlNode* root, Warnings& warnings)
             {
                 CheckOrder(levels.Below(parent).OrderFor(segment), parent, segment, warnings);
             }
-        }
-    }
-}
-
-// Elements: what no lookup can see, and what no condition can tell apart.
-
-/** @return the text directly in @p element that is more than white space. */
-std::string OwnText(const xmlNode* element)
-{
-    std::string text;
-    for (const xmlNode* child = element->children; child != nullptr; child = child->next)
-    {
-        const bool isText = child->type == XML_TEXT_NODE || child->type == XML_CDATA_SECTION_NODE ||
-                            child->type == XML_ENTITY_REF_NODE;
-        if (isText && xmlIsBlankNode(child) != 1)
-        {
-            text += ContentOf(child);
-        }
-    }
-    return text;
-}
-
-void CheckVisible(const xmlNode* element, Warnings& warnings)
-{
-    const std::string name = Text(element->name);
-    if (name.find('.') != std::string::npos)
-    {
-        warnings.Warn(
-            element, "unreachable element",
-            warnings.LocationOf(element) +
-                " cannot be named by a key: its name holds a \".\", which ends a segment");
-    }
-    const std::string text = OwnText(element);
-    if (OnlyTextOf(element) == nullptr && !text.empty())
-    {
-        warnings.Warn(element, "invisible value",
-                      warnings.LocationOf(element) + " has no value though it holds " +
-                          Quoted(text) + ": " + WhyNoValue(element));
-    }
-}
-
-using Group = std::vector<const xmlNode*>; // siblings of one name
-
-/** @return how often each value of the attribute @p name occurs in @p group. */
-std::map<std::string, int> CountValues(const Group& group, const std::string& name)
-{
-    std::map<std::string, int> counts;
-    for (const xmlNode* const element : group)
-    {
-        if (HasAttribute(element, name))
-        {
-            ++counts[AttributeOf(element, name)];
-        }
-    }
-    return counts;
-}
-
-/** @return the attribute that tells the most elements of @p group apart; empty if there is none. */
-std::string TellingAttribute(const Group& group)
-{
-    std::string telling;
-    size_t most = 0;
-    for (const xmlAttr* attribute = group.front()->properties; attribute != nullptr;
-         attribute = attribute->next)
-    {
-        const size_t values = CountValues(group, Text(attribute->name)).size();
-        if (values > most)
-        {
-            most = values;
-            telling = Text(attribute->name);
-        }
-    }
-    return telling;
-}
-
-void CheckGroup(const Group& group, Warnings& warnings)
-{
-    const std::string telling = TellingAttribute(group);
-    std::map<std::string, const xmlNode*> bearers;
-    for (const xmlNode* const element : group)
-    {
-        if (telling.empty() || !HasAttribute(element, telling))
-        {
-            continue;
-        }
-        const std::string value = AttributeOf(element, telling);
-        const auto bearer = bearers.emplace(value, element);
-        if (!bearer.second)
-        {
-            warnings.Warn(element, "repeated attribute",
-                          warnings.LocationOf(element) + " has the same " + telling + "=" +
-                              Quoted(value) + " as " + warnings.Place(bearer.first->second));
-        }
-    }
-}
-
-void CheckElements(const xmlNode* element, Warnings& warnings)
-{
-    CheckVisible(element, warnings);
-    std::map<std::string, Group> groups;
-    for (const xmlNode* child = element->children; child != nullptr; child = child->next)
-    {
-        if (child->type == XML_ELEMENT_NODE)
-        {
-            groups[Text(child->name)].push_back(child);
-        }
-    }
-    for (const auto& group : groups)
-    {
-        CheckGroup(group.second, warnings);
-    }
-    for (const xmlNode* child = element->children; child != nullptr; child = child->next)
-    {
-        if (child->type == XML_ELEMENT_NODE)
-        {
-            CheckElements(child, warnings);
         }
     }
 }
@@ -353,16 +181,18 @@ ExitStatus Check(const std::string& file, const std::vector<std::string>& keys)
             return status;
         }
     }
+    const xmlNode* const root = RootOf(*reader);
+    Levels levels(root->doc);
     Warnings warnings;
     for (const std::string& key : keys)
     {
-        CheckLookup(static_cast<xmlDoc*>(reader->GetDataPtr()), key, warnings);
+        CheckLookup(root->doc, key, warnings);
     }
     if (keys.empty())
     {
-        CheckListedKeys(RootOf(*reader), warnings);
+        CheckListedKeys(root, levels, warnings);
     }
-    CheckElements(RootOf(*reader), warnings);
+    CheckElements(root, levels, warnings);
     CheckSaving(*reader, file, warnings);
     return warnings.PrintFor(file) ? ExitStatus::NothingFound : ExitStatus::Done;
 }

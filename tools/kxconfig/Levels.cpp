@@ -225,3 +225,16 @@ const Level& Levels::Below(const xmlNode* parent)
                ? level->second
                : m_levels.emplace(parent, Level(parent, m_defaulted)).first->second;
 }
+
+std::map<std::string, std::string> Levels::AttributesOf(const xmlNode* element) const
+{
+    std::map<std::string, std::string> attributes;
+    for (const std::string& name : AttributeNames(element, m_defaulted))
+    {
+        if (HasAttribute(element, name))
+        {
+            attributes[name] = AttributeOf(element, name);
+        }
+    }
+    return attributes;
+}

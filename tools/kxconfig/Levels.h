@@ -76,6 +76,10 @@ public:
 
     const Level& Below(const xmlNode* parent);
 
+    /** @return the attributes that conditions find in @p element, by the names that they find them
+     * by: without a prefix, and with the defaults of the DTD. */
+    std::map<std::string, std::string> AttributesOf(const xmlNode* element) const;
+
 private:
     std::map<std::string, std::vector<std::string>> m_defaulted;
     std::unordered_map<const xmlNode*, Level> m_levels;
