@@ -85,6 +85,18 @@ TEST_F(KxconfigCheck, WarnsOncePerLevelOfConditionsThatDependOnTheOrder)
                     "name, came right before it"});
 }
 
+TEST_F(KxconfigCheck, WarnsOncePerLevelOfConditionsThatAreSuspended)
+{
+    Write("<cfg>\n<z/>\n<a i=\"1\">1</a>\n<a i=\"2\">2</a>\n<a i=\"3\">3</a></cfg>");
+    const auto matchesTwo = [](const std::string& line, const std::string& key)
+    { return line + ": \"" + key + "\" matches 2 elements, the first of them /cfg/a[1] (line 4)"; };
+    ExpectWarnings({"4: /cfg/a[1] is taken for \"a@i=2\" though it does not fulfil it: /cfg/z "
+                    "(line 3), of another name and in front of it, suspends the condition",
+                    "5: /cfg/a[2] would be taken for \"a@i=1\" if /cfg/z (line 3), of another "
+                    "name, came right before it",
+                    matchesTwo("5", "cfg.a@i=2"), matchesTwo("6", "cfg.a@i=3")});
+}
+
 TEST_F(KxconfigCheck, ChecksTheKeysThatItIsGiven)
 {
     Write("<cfg>\n<a i=\"1\">1</a>\n<a i=\"2\">2</a>\n<z/></cfg>");
@@ -95,8 +107,25 @@ TEST_F(KxconfigCheck, ChecksTheKeysThatItIsGiven)
     ExpectWarnings({"3: /cfg/a[1] would be taken for \"a@i=2\" if /cfg/z (line 5), of another "
                     "name, came right before it"},
                    {"cfg.a@i=2"});
-    EXPECT_EQ(2, Tool({"check", m_file, "cfg"}).status);
-    EXPECT_EQ(1, Tool({"check", m_file, "other.a"}).status);
+}
+
+TEST_F(KxconfigCheck, GoesOnAfterAKeyWithAForeignRoot)
+{
+    Write("<cfg>\n<a>1</a>\n<a>2</a><b><![CDATA[x]]></b></cfg>");
+    ExpectWarnings(
+        {"2: \"other.a\" has no value: it starts with \"other\", but the root element is \"cfg\"",
+         "2: \".a\" has no value: it starts with \"\", but the root element is \"cfg\"",
+         "4: \"cfg.a\" matches 2 elements, the first of them /cfg/a[1] (line 3)",
+         "4: /cfg/b has no value though it holds \"x\": its only child is no text: CDATA section"},
+        {"other.a", ".a", "cfg.a"});
+}
+
+TEST_F(KxconfigCheck, ChecksNothingIfAKeyIsMalformed)
+{
+    Write("<cfg><a>1</a><a>2</a></cfg>");
+    ExpectComplaint(Tool({"check", m_file, "cfg.a", "cfg"}), 2,
+                    "malformed key \"cfg\": it names the root element and at least one more, as in "
+                    "root.name");
 }
 
 TEST_F(KxconfigCheck, WarnsOfAGivenKeyThatHasNoValue)

@@ -10,6 +10,8 @@
 #include "Trail.h"
 #include "Warnings.h"
 
+#include <algorithm>
+
 namespace
 {
 
@@ -32,10 +34,13 @@ void CheckOrder(const Order& order, const xmlNode* parent, const std::string& se
     const std::string name = segment.substr(0, segment.find('@'));
     if (order.taken != nullptr)
     {
-        warnings.Warn(order.taken, "suspended condition",
-                      warnings.LocationOf(order.taken) + " is taken for " + Quoted(segment) +
-                          " though it does not fulfil it: " + warnings.Place(order.suspender) +
-                          ", of another name and in front of it, suspends the condition");
+        if (warnings.IsNew("suspended condition", parent, name))
+        {
+            warnings.Warn(order.taken, "suspended condition",
+                          warnings.LocationOf(order.taken) + " is taken for " + Quoted(segment) +
+                              " though it does not fulfil it: " + warnings.Place(order.suspender) +
+                              ", of another name and in front of it, suspends the condition");
+        }
     }
     else if (order.other != nullptr && order.rejected != nullptr &&
              warnings.IsNew("condition depends on order", parent, name))
@@ -110,14 +115,26 @@ Accepted DeepestAccepted(const TrailLevel& level, const Accepted& above)
     return deepest;
 }
 
+/** @return why a lookup of @p key gives nothing, if @p end is as far as it leads. */
+std::string WhyNoValueUnder(const std::string& key, const xmlNode* root, const xmlNode* end,
+                            Warnings& warnings)
+{
+    if (!StartsAtRoot(root->doc, key))
+    {
+        return "it starts with " + Quoted(key.substr(0, key.find('.'))) +
+               ", but the root element is " + Quoted(Text(root->name));
+    }
+    return "it leads as far as " + warnings.LocationOf(end) + "; kxconfig explain tells why";
+}
+
 void WarnOfNoValue(const Trail& trail, xmlDoc* document, const std::string& key, Warnings& warnings)
 {
     const Accepted root = {xmlDocGetRootElement(document), 0};
     const xmlNode* const end =
         trail.top == nullptr ? root.element : DeepestAccepted(*trail.top, root).element;
     warnings.Warn(end, "key without a value",
-                  Quoted(key) + " has no value: it leads as far as " + warnings.LocationOf(end) +
-                      "; kxconfig explain tells why");
+                  Quoted(key) +
+                      " has no value: " + WhyNoValueUnder(key, root.element, end, warnings));
 }
 
 void CheckLookup(xmlDoc* document, const std::string& key, Warnings& warnings)
@@ -173,13 +190,11 @@ ExitStatus Check(const std::string& file, const std::vector<std::string>& keys)
     {
         return ExitStatus::BadFile;
     }
-    for (const std::string& key : keys)
+    const auto malformed =
+        std::find_if(keys.begin(), keys.end(), [](const auto& key) { return IsFreeOf(".", key); });
+    if (malformed != keys.end())
     {
-        const ExitStatus status = CheckKey(file, key, *reader);
-        if (status != ExitStatus::Done)
-        {
-            return status;
-        }
+        return CheckKey(file, *malformed, *reader);
     }
     const xmlNode* const root = RootOf(*reader);
     Levels levels(root->doc);
