@@ -7,6 +7,13 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <set>
+#include <sstream>
+
+#include <fcntl.h>
+#include <stdlib.h>
+#include <unistd.h>
+
 /** Runs kxconfig as a user would. */
 class ToolTest : public testing::Test
 {
@@ -28,6 +35,31 @@ protected:
         EXPECT_EQ("kxconfig: " + message + "\n", outcome.err);
     }
 
+    /** @return the words that @p help lists as options ("--word"). */
+    static std::set<std::string> OptionsOf(const std::string& help)
+    {
+        std::set<std::string> options;
+        std::istringstream lines(help.substr(0, help.find("Examples:")));
+        for (std::string line; std::getline(lines, line);)
+        {
+            const auto at = line.find("--");
+            if (line.compare(0, 3, "  -") == 0 && at != std::string::npos)
+            {
+                options.insert(line.substr(at, line.find_first_of(" ,", at) - at));
+            }
+        }
+        return options;
+    }
+
+    /** @return whether programs can be given a terminal here. */
+    static bool HasTerminals()
+    {
+        const int terminal = posix_openpt(O_RDWR | O_NOCTTY);
+        close(terminal);
+        return terminal >= 0;
+    }
+
+    const std::set<std::string> m_verbs = {"check", "explain", "find", "get", "keys", "set"};
     kxtest::TemporaryFolder m_folder;
 };
 
