@@ -91,6 +91,26 @@ TEST_F(KxconfigUsage, TraceShowsTheLibrarysRecordsBesideTheResult)
     EXPECT_EQ(2, Tool({"--trace", "--log-mask", "error", "get", kGateway, "a.b"}).status);
 }
 
+TEST_F(KxconfigUsage, FlagsTakeNoValue)
+{
+    for (const std::string flag :
+         {"--json=true", "--json=no", "--json=", "--trace=false", "--help=no", "--version=1"})
+    {
+        const std::string name = flag.substr(0, flag.find('='));
+        ExpectComplaint(Tool({flag, "get", m_plain, "cfg.net.ip"}), 2,
+                        name + " takes no value (kxconfig --help shows the usage)");
+    }
+    const std::string before = ReadFile(m_plain);
+    EXPECT_EQ(2, Tool({"set", "--dry-run=no", m_plain, "cfg.net.ip", "x"}).status);
+    EXPECT_EQ(2, Tool({"explain", "--set=no", m_plain, "cfg.net.ip"}).status);
+    EXPECT_EQ(before, ReadFile(m_plain));
+}
+
+TEST_F(KxconfigUsage, ValueMayLookLikeAFlagWithOne)
+{
+    EXPECT_EQ(0, Tool({"set", "--dry-run", m_plain, "cfg.ip", "--", "--json=true"}).status);
+}
+
 TEST_F(KxconfigUsage, EveryVerbRefusesStandardInput)
 {
     for (const std::string& verb : m_verbs)

@@ -8,6 +8,7 @@
 
 #include <CLI/CLI.hpp>
 
+#include <algorithm>
 #include <cstdlib>
 #include <cstring>
 #include <functional>
@@ -45,6 +46,12 @@ void SetLogMask(const std::string& mask)
 std::string RefuseStandardStreams(const std::string& file)
 {
     return file == "-" ? "\"-\" is no file; name one" : std::string();
+}
+
+/** An empty name would stand for the file that was loaded, and overwrite it. */
+std::string RefuseNoFile(const std::string& file)
+{
+    return file.empty() ? "\"\" is no file; name one" : RefuseStandardStreams(file);
 }
 
 /** A subcommand whose first argument is a file. */
@@ -115,7 +122,7 @@ void AddGetAndSet(CLI::App& app, Request& request)
     set->add_flag("--dry-run", arguments.dryRun, "show what would change and save nothing");
     set->add_option("--output", arguments.output, "save to this file instead")
         ->type_name("FILE")
-        ->check(CLI::Validator(RefuseStandardStreams, ""));
+        ->check(CLI::Validator(RefuseNoFile, ""));
     set->callback([&] { request.command = [&] { return Set(arguments); }; });
 }
 
@@ -160,6 +167,34 @@ void AddOptions(CLI::App& app, Request& request)
             ->type_name("MASK")
             ->check(CLI::Validator(CheckLogMask, ""));
     app.add_flag("--trace", request.trace, "show all log records: --log-mask all")->excludes(mask);
+}
+
+bool IsFlag(const CLI::App& app, const std::string& name)
+{
+    const CLI::Option* const option = app.get_option_no_throw(name);
+    return option != nullptr && option->get_items_expected_max() == 0;
+}
+
+bool IsFlagOfAny(const CLI::App& app, const std::string& name)
+{
+    const std::vector<const CLI::App*> commands = app.get_subcommands(nullptr);
+    return IsFlag(app, name) ||
+           std::any_of(commands.begin(), commands.end(),
+                       [&](const CLI::App* command) { return IsFlag(*command, name); });
+}
+
+/** CLI11 would run "--dry-run=no" in earnest, and find no fault with "--help=no". */
+void RefuseFlagsWithValues(const CLI::App& app, int argc, char** argv)
+{
+    for (int i = 1; i < argc && std::strcmp(argv[i], "--") != 0; ++i)
+    {
+        const std::string word = argv[i];
+        const std::string name = word.substr(0, word.find('='));
+        if (name != word && IsFlagOfAny(app, name))
+        {
+            throw CLI::ArgumentMismatch(name + " takes no value");
+        }
+    }
 }
 
 /** Found ahead of all else, since what is wrong with the usage is told in JSON too. */
@@ -211,6 +246,7 @@ ExitStatus Run(int argc, char** argv)
     }
     try
     {
+        RefuseFlagsWithValues(app, argc, argv);
         app.parse(argc, argv);
     }
     catch (const CLI::ParseError& error)
