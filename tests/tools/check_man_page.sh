@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Checks that the man page is well-formed and tells of each option and command that --help lists.
+# Checks that the man page is well-formed and tells of each option, command and argument that --help lists.
 # usage: check_man_page.sh MAN_PAGE KXCONFIG
 set -euo pipefail
 
@@ -9,7 +9,9 @@ tool=$2
 warnings=$(LC_ALL=C groff -man -Tascii -ww -z "$page" 2>&1)
 [ -z "$warnings" ] || { echo "$warnings"; exit 1; }
 
+# The page on one line, where it is of no matter how its lines are filled.
 text=$(groff -man -Tascii -P -cbou "$page")
+told=$(tr -s '[:space:]' ' ' <<<"$text")
 help=$("$tool" --help)
 # "  -h,--help   ..." and, below "Subcommands:", "  get   ...".
 options=$(grep -oE '^ +(-[a-z],)?--[a-z-]+' <<<"$help" | grep -oE -- '--[a-z-]+')
@@ -17,5 +19,27 @@ commands=$(sed -nE '/^Subcommands:/,/^$/s/^  ([a-z]+) .*/\1/p' <<<"$help")
 [ -n "$options" ] && [ -n "$commands" ]
 for word in $options $commands; do
     grep -qwF -e "$word" <<<"$text" || { echo "the man page does not tell of $word"; exit 1; }
+done
+
+# "NAME meaning" of each argument, from lines such as "  FILE TEXT REQUIRED   an XML file".
+positionals()
+{
+    "$tool" "$1" --help |
+        sed -nE '/^Positionals:/,/^$/s/^  ([A-Z]+) TEXT (REQUIRED|\.\.\.) +(.*)/\1 \3/p'
+}
+
+# What the page says of a command: up to the next one's heading.
+section()
+{
+    sed -nE "/^   $1 /,/^(   [a-z]|[A-Z])/p" <<<"$text" | sed '1d' | tr -s '[:space:]' ' '
+}
+
+for command in $commands; do
+    arguments=$(positionals "$command")
+    [ -n "$arguments" ] || { echo "$command --help tells of no arguments"; exit 1; }
+    while read -r argument; do
+        grep -qF -e " $argument " <<<"$(section "$command")" ||
+            { echo "the man page does not tell of $command: $argument"; exit 1; }
+    done <<<"$arguments"
 done
 echo "tells of" $options $commands

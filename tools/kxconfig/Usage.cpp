@@ -100,6 +100,20 @@ std::string Arguments(const CLI::App& command)
     return arguments;
 }
 
+/** @return what --help tells of the arguments of @p command. */
+std::string Positionals(const CLI::App& command)
+{
+    std::string page;
+    for (const CLI::Option* const option : command.get_options())
+    {
+        if (option->get_positional())
+        {
+            page += Tagged(option->get_name(true), option->get_description());
+        }
+    }
+    return page;
+}
+
 std::string Options(const CLI::App& command)
 {
     std::string page;
@@ -124,7 +138,8 @@ std::string Commands(const CLI::App& app)
     for (const CLI::App* const command : app.get_subcommands(nullptr))
     {
         page += ".SS " + Escaped(command->get_name() + Arguments(*command)) + "\n" +
-                Escaped(command->get_description()) + "\n" + Options(*command);
+                Escaped(command->get_description()) + "\n" + Positionals(*command) +
+                Options(*command);
     }
     return page;
 }
