@@ -219,6 +219,28 @@ TEST_F(KxconfigExplain, AgreesWithGet)
     }
 }
 
+TEST_F(KxconfigExplain, EndsWithTheStatusOfGetAndSet)
+{
+    // Of keys that end in a dot the last elements are found, and the library answers an error.
+    const std::string file =
+        m_folder.Write("small.xml", "<cfg><a>1</a><b i='1'><c>2</c><c/></b></cfg>");
+    for (const std::string key :
+         {"cfg.a", "cfg.a.", "cfg.b", "cfg.b.", "cfg.b.c", "cfg.b.c.", "cfg.b@i=1.c.",
+          "cfg.b@i=2.c", "cfg.c.", "cfg..", "cfg.", "cfg", "", ".", "other.a", "other.a."})
+    {
+        EXPECT_EQ(Tool({"get", file, key}).status, Tool({"explain", file, key}).status) << key;
+        EXPECT_EQ(Tool({"set", "--dry-run", file, key, "x"}).status,
+                  Tool({"explain", "--set", file, key}).status)
+            << key;
+    }
+}
+
+TEST_F(KxconfigExplain, UpdateByAKeyThatEndsInADotIsBadUsage)
+{
+    const std::string file = m_folder.Write("dot.xml", "<cfg><a>1</a></cfg>");
+    EXPECT_EQ(2, Tool({"explain", "--set", file, "cfg.a."}).status);
+}
+
 TEST_F(KxconfigExplain, TellsWhatAnUpdateReaches)
 {
     ExpectUpdateExplained(

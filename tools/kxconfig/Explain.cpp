@@ -389,13 +389,14 @@ void TellTrail(const Trail& trail, Walk walk)
     }
 }
 
+/** @return what get or set end with: to the library, too, @p found alone is no success. */
 ExitStatus ToExitStatus(int status, bool found)
 {
-    if (found)
+    if (status == 0)
     {
-        return ExitStatus::Done;
+        return found ? ExitStatus::Done : ExitStatus::NothingFound; // a foreign root is success
     }
-    return status == 7 || status == 22 ? ExitStatus::BadUsage : ExitStatus::NothingFound;
+    return status == -2 ? ExitStatus::NothingFound : ExitStatus::BadUsage;
 }
 
 ExitStatus ExplainLookup(CXMLReader& reader, const std::string& key)
