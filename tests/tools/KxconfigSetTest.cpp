@@ -116,6 +116,15 @@ TEST_F(KxconfigSet, OutputSavesElsewhere)
     EXPECT_EQ(2, FilesInFolder());
 }
 
+TEST_F(KxconfigSet, OutputNeedsAName)
+{
+    const std::string seeHelp = " (kxconfig --help shows the usage)";
+    ExpectRefused({"set", m_file, "cfg.name", "x", "--output", ""}, 2,
+                  "--output: \"\" is no file; name one" + seeHelp);
+    EXPECT_EQ(2, Tool({"set", m_file, "cfg.name", "x", "--output="}).status);
+    ExpectUntouched();
+}
+
 TEST_F(KxconfigSet, SameTextIsNotSavedAgain)
 {
     const Outcome outcome = Tool({"set", m_file, "cfg.name", "box"});
@@ -223,6 +232,28 @@ TEST_F(KxconfigSet, RefusesAValueThatIsNoXmlText)
     }
 }
 
+TEST_F(KxconfigSet, RefusesAReferenceToACharacterThatXmlDoesNotHave)
+{
+    // The engine would make nothing of some of them, and save.
+    for (const std::string value :
+         {"&#0;", "&#x0;", "a&#0;b", "&amp;&#00;", "&#8;", "&#11;", "&#12;", "&#x1F;", "&#xD800;",
+          "&#xDFFF;", "&#xFFFE;", "&#65535;", "&#x110000;", "&#4294967361;",
+          "&#x10000000000000041;"})
+    {
+        ExpectRefused({"set", m_file, "cfg.name", value}, 2,
+                      "VALUE is not XML text: it refers to a character that XML does not have");
+    }
+}
+
+TEST_F(KxconfigSet, TakesReferencesToTheFirstAndTheLastCharacterOfEachRange)
+{
+    EXPECT_EQ("/cfg/name: \"box\" -> \"\\x09\\n\\x0d \xED\x9F\xBF\xEE\x80\x80\xEF\xBF\xBD"
+              "\xF0\x90\x80\x80\xF4\x8F\xBF\xBF\"\n",
+              Tool({"set", m_file, "cfg.name",
+                    "&#9;&#10;&#xD;&#x20;&#xD7FF;&#xE000;&#xFFFD;&#x10000;&#x0010FFFF;"})
+                  .out);
+}
+
 TEST_F(KxconfigSet, RefusesAValueThatIsNoXmlTextWhateverTheKeySelects)
 {
     ExpectRefused({"set", m_file, "cfg.missing", "x&y"}, 2,
@@ -279,6 +310,32 @@ TEST_F(KxconfigSet, RefusesAFileThatMustNotBeWritten)
     EXPECT_EQ(4, outcome.status);
     EXPECT_EQ("kxconfig: cannot save " + m_file + ": Permission denied\n", outcome.err);
     ExpectUntouched();
+}
+
+TEST_F(KxconfigSet, SaysThatItIsTheFolderThatMustNotBeWritten)
+{
+    if (geteuid() != 0)
+    {
+        GTEST_SKIP() << "needs to run as the superuser, to become somebody else";
+    }
+    ASSERT_EQ(0, chmod(m_folder.Path("").c_str(), 0755));
+    ASSERT_EQ(0, chmod(m_file.c_str(), 0666));
+    const Outcome outcome =
+        RunProgram({KX_CONFIG_TOOL, "set", m_file, "cfg.name", "crate"}, {}, 65534);
+    EXPECT_EQ(4, outcome.status);
+    EXPECT_EQ("kxconfig: cannot save " + m_file +
+                  ": no new file can be made in its folder: Permission denied\n",
+              outcome.err);
+    ExpectUntouched();
+}
+
+TEST_F(KxconfigSet, LeavesTheFilesOtherNamesWithTheOldContent)
+{
+    const std::string other = m_folder.Path("other.xml");
+    ASSERT_EQ(0, link(m_file.c_str(), other.c_str()));
+    EXPECT_EQ(0, Tool({"set", m_file, "cfg.name", "crate"}).status);
+    EXPECT_THAT(ReadFile(m_file), testing::HasSubstr("crate"));
+    EXPECT_EQ(m_before, ReadFile(other));
 }
 
 TEST_F(KxconfigSet, KeepsOwnerAndGroup)

@@ -39,18 +39,24 @@ public:
     explicit Replacement(const fs::path& target) : m_target(target)
     {
         const fs::path folder = target.parent_path();
-        m_failed = chdir(folder.empty() ? "." : folder.c_str()) != 0;
-        const int file = m_failed ? -1 : mkstemp(m_name);
-        m_failed = file < 0;
-        if (!m_failed)
+        if (chdir(folder.empty() ? "." : folder.c_str()) != 0)
         {
-            close(file);
+            m_failure = SystemReason();
+            return;
         }
+        const int file = mkstemp(m_name);
+        if (file < 0)
+        {
+            // Whoever may write the file looks for the reason in the file.
+            m_failure = "no new file can be made in its folder: " + SystemReason();
+            return;
+        }
+        close(file);
     }
 
     ~Replacement()
     {
-        if (!m_failed)
+        if (m_failure.empty())
         {
             unlink(m_name);
         }
@@ -59,7 +65,9 @@ public:
     Replacement(const Replacement&) = delete;
     Replacement& operator=(const Replacement&) = delete;
 
-    bool Failed() const { return m_failed; }
+    /** @return why there is no such file; empty if there is. */
+    const std::string& Failure() const { return m_failure; }
+
     const char* Name() const { return m_name; }
 
     /** Gives it the target's owner and permissions, or those of a new file, and its name. */
@@ -100,16 +108,16 @@ private:
 
     const fs::path m_target;
     char m_name[32] = ".kxconfig-XXXXXX";
-    bool m_failed;
+    std::string m_failure;
 };
 
 std::string SaveBeside(CXMLWriter& writer, const std::string& path, const fs::path& target,
                        const FileState* loaded)
 {
     Replacement replacement(target);
-    if (replacement.Failed())
+    if (!replacement.Failure().empty())
     {
-        return "cannot save " + path + ": " + SystemReason();
+        return "cannot save " + path + ": " + replacement.Failure();
     }
     if (!SaveDirectly(writer, replacement.Name()).empty())
     {

@@ -4,25 +4,42 @@
 #include "Save.h"
 #include "Texts.h"
 
+#include <libxml/chvalid.h>
 #include <libxml/xmlstring.h>
 
 #include <algorithm>
+#include <charconv>
 
 namespace
 {
 
-/** Whether @p text, which stands between "&" and ";", can name a character or an entity. */
-bool IsReference(const std::string& text)
+const char* const kBareAmpersand = "write & as &amp;";
+
+/** @return why @p digits, a number of @p base, refer to no character; empty if they do. */
+std::string WhyNoCharacter(const std::string& digits, int base)
 {
-    if (text.compare(0, 2, "#x") == 0)
+    unsigned int code = 0;
+    const char* const end = digits.data() + digits.size();
+    const auto [stop, error] = std::from_chars(digits.data(), end, code, base);
+    if (stop != end || error == std::errc::invalid_argument)
     {
-        return text.size() > 2 && text.find_first_not_of("0123456789abcdefABCDEF", 2) == text.npos;
+        return kBareAmpersand;
     }
+    // Of &#0; the engine makes nothing, and of a value that holds it less than was given.
+    const bool exists = error == std::errc() && xmlIsCharQ(code);
+    return exists ? "" : "it refers to a character that XML does not have";
+}
+
+/** @return why @p text, which stands between "&" and ";", is no reference; empty if it is one. */
+std::string WhyNoReference(const std::string& text)
+{
     if (text.compare(0, 1, "#") == 0)
     {
-        return text.size() > 1 && text.find_first_not_of("0123456789", 1) == text.npos;
+        const bool inHexadecimal = text.compare(1, 1, "x") == 0;
+        return WhyNoCharacter(text.substr(inHexadecimal ? 2 : 1), inHexadecimal ? 16 : 10);
     }
-    return !text.empty() && text.find_first_of("&< \t\r\n") == text.npos;
+    const bool namesEntity = !text.empty() && text.find_first_of("&< \t\r\n") == text.npos;
+    return namesEntity ? "" : kBareAmpersand;
 }
 
 /** Whether @p value is UTF-8 without the control characters that XML does not have. */
@@ -34,20 +51,22 @@ bool HasOnlyXmlCharacters(const std::string& value)
            std::none_of(value.begin(), value.end(), isForbidden);
 }
 
-/** Whether each "&" of @p value begins a reference. */
-bool HasOnlyWholeReferences(const std::string& value)
+/** @return what is wrong with the first "&" of @p value that begins no reference; or nothing. */
+std::string WhyNotOnlyReferences(const std::string& value)
 {
     std::string::size_type at = value.find('&');
     while (at != value.npos)
     {
         const std::string::size_type end = value.find(';', at);
-        if (end == value.npos || !IsReference(value.substr(at + 1, end - at - 1)))
+        const std::string reason =
+            end == value.npos ? kBareAmpersand : WhyNoReference(value.substr(at + 1, end - at - 1));
+        if (!reason.empty())
         {
-            return false;
+            return reason;
         }
         at = value.find('&', end);
     }
-    return true;
+    return "";
 }
 
 ExitStatus RefuseValue(const std::string& why)
@@ -55,8 +74,6 @@ ExitStatus RefuseValue(const std::string& why)
     Complain("VALUE is not XML text: " + why);
     return ExitStatus::BadUsage;
 }
-
-const char* const kBareAmpersand = "write & as &amp;";
 
 ExitStatus Update(CXMLWriter& writer, const SetArguments& arguments)
 {
@@ -66,9 +83,10 @@ ExitStatus Update(CXMLWriter& writer, const SetArguments& arguments)
     {
         return RefuseValue("it has control characters, or bytes that are no UTF-8");
     }
-    if (!HasOnlyWholeReferences(arguments.value))
+    const std::string reason = WhyNotOnlyReferences(arguments.value);
+    if (!reason.empty())
     {
-        return RefuseValue(kBareAmpersand);
+        return RefuseValue(reason);
     }
     const int status = writer.SetValue(arguments.key, arguments.value);
     if (!FirstComplaint("").empty())
