@@ -92,6 +92,29 @@ TEST_F(KxconfigFind, PrintsThePrefixOfAnAttribute)
     EXPECT_EQ(attributes, answer.at("results")[0].at("attributes"));
 }
 
+TEST_F(KxconfigFind, NamespaceWithoutAPrefixHasALocationThatFindsIt)
+{
+    const std::string file = m_folder.Write("default.xml", "<a xmlns='urn:d' xmlns:p='urn:p'/>");
+    const std::string location = "/*/namespace::*[name()='']";
+    const std::string line = location + " namespace \"urn:d\"\n";
+    EXPECT_THAT(Tool({"find", file, "/*/namespace::*"}).out, testing::HasSubstr(line));
+    EXPECT_EQ(line, Tool({"find", file, location}).out);
+    const Outcome outcome = Tool({"--json", "find", file, location});
+    EXPECT_EQ(location, nlohmann::json::parse(outcome.out).at("results")[0].at("location"));
+}
+
+TEST_F(KxconfigFind, TellsHowToSelectByANameWithAPrefix)
+{
+    const std::string file = m_folder.Write("ns.xml", "<p:a xmlns:p='urn:p'><p:b>1</p:b></p:a>");
+    const Outcome outcome = Tool({"find", file, "/p:a/p:b"});
+    EXPECT_EQ(2, outcome.status);
+    EXPECT_THAT(outcome.err,
+                testing::EndsWith("; find knows no prefixes: write *[name()='p:a'] for p:a\n"));
+    EXPECT_EQ("/p:a/p:b element \"1\"\n",
+              Tool({"find", file, "/*[name()='p:a']/*[name()='p:b']"}).out);
+    EXPECT_THAT(Tool({"find", file, "//["}).err, testing::Not(testing::HasSubstr("prefix")));
+}
+
 TEST_F(KxconfigFind, BlamesTheExpressionAndNotTheFile)
 {
     const std::string file = m_folder.Write("undeclared.xml", "<a><p:b/></a>");

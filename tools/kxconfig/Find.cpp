@@ -4,6 +4,7 @@
 #include "Nodes.h"
 #include "Output.h"
 
+#include <libxml/xmlerror.h>
 #include <libxml/xpath.h>
 
 #include <memory>
@@ -47,8 +48,9 @@ const char* TypeName(const xmlNode* node)
 std::string LocationOfNamespace(const xmlNs* space, Locations& locations)
 {
     const auto element = reinterpret_cast<const xmlNode*>(space->next);
-    const std::string prefix = space->prefix == nullptr ? "" : Text(space->prefix);
-    return locations.Of(element) + "/namespace::" + prefix;
+    // One without a prefix has no name, which a path could end in.
+    const std::string name = space->prefix == nullptr ? "*[name()='']" : Text(space->prefix);
+    return locations.Of(element) + "/namespace::" + name;
 }
 
 std::string NameWithPrefix(const xmlAttr* attribute)
@@ -154,6 +156,14 @@ void PrintScalar(xmlXPathObject* result)
     Print(value, {{"value", value}});
 }
 
+/** The library evaluates without prefixes, though the locations that find prints have them. */
+std::string AdviceOnPrefixes()
+{
+    const auto error = xmlGetLastError();
+    const bool isPrefix = error != nullptr && error->code == XML_XPATH_UNDEF_PREFIX_ERROR;
+    return isPrefix ? "; find knows no prefixes: write *[name()='p:a'] for p:a" : "";
+}
+
 } // namespace
 
 ExitStatus Find(const std::string& file, const std::string& expression)
@@ -168,7 +178,8 @@ ExitStatus Find(const std::string& file, const std::string& expression)
     const Result result(document.GetNodeSet(expression, top));
     if (result == nullptr)
     {
-        Complain("malformed expression " + Quoted(expression) + FirstComplaint(": "));
+        Complain("malformed expression " + Quoted(expression) + FirstComplaint(": ") +
+                 AdviceOnPrefixes());
         return ExitStatus::BadUsage;
     }
     if (result->type != XPATH_NODESET)
