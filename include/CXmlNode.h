@@ -319,11 +319,11 @@ public:
      * @return the element's attributes in document order; none for a null handle or a node that is
      *         no element.
      *
-     * Two things differ from GetAttributeValue(). An attribute that was made without a value (one
-     * read from a file never is) shows the value of the attribute before it in the list, or an
-     * empty one if it is the first. Of a value in several pieces, such as text around an entity
-     * reference, only the first piece is shown. Logs the records of each CXmlAttr that is built and
-     * destroyed on the way.
+     * Two things differ from GetAttributeValue(). An attribute without a value shows the value of
+     * the attribute before it in the list, or an empty one if it is the first. No file holds one,
+     * but SetContent("") and ClearNode() on a handle on an attribute leave one. Of a value in
+     * several pieces, such as text around an entity reference, only the first piece is shown. Logs
+     * the records of each CXmlAttr that is built and destroyed on the way.
      */
     std::list<CXmlAttr> GetAttributeItems();
 

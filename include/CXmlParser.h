@@ -103,7 +103,9 @@ public:
 
     /**
      * Saves the document: indented, in UTF-8, over a file that exists and can be read. A file is
-     * never created; make an empty one first.
+     * never created; make an empty one first. The exception: the engine decodes escapes such as %20
+     * in the path, so that a file "x%20y" lets a file "x y" be written, made if need be, and stays
+     * as it was.
      *
      * @param path  the file to write, or an empty string for the recorded path. The recorded path
      * is not changed.

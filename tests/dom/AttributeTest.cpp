@@ -220,6 +220,26 @@ TEST_F(AttributeTest, FirstAttributeWithoutAValueShowsAnEmptyOne)
     EXPECT_EQ(Pairs({{"a", ""}}), Items(element));
 }
 
+TEST_F(AttributeTest, EmptiedAttributeShowsTheOneBeforeIt)
+{
+    const xmlDocPtr document = Parse("<e a='1' b='2' c='3'/>");
+    EXPECT_EQ(0, CXmlNode(NodeOf(document, "/e/@b")).SetContent(""));
+    EXPECT_EQ(Pairs({{"a", "1"}, {"b", "1"}, {"c", "3"}}), Items(NodeOf(document, "/e")));
+    EXPECT_EQ(0, CXmlNode(NodeOf(document, "/e/@c")).ClearNode());
+    EXPECT_EQ(Pairs({{"a", "1"}, {"b", "1"}, {"c", "1"}}), Items(NodeOf(document, "/e")));
+    std::string value = "before";
+    EXPECT_EQ(0, CXmlNode(NodeOf(document, "/e")).GetAttributeValue("b", value));
+    EXPECT_EQ("", value);
+}
+
+TEST_F(AttributeTest, EmptiedAttributeIsEmptyOnceItIsSavedAndLoaded)
+{
+    const xmlDocPtr document = Parse("<e a='1' b='2'/>");
+    CXmlNode(NodeOf(document, "/e/@b")).SetContent("");
+    EXPECT_EQ("<e a=\"1\" b=\"\"/>", TextOf(document->children));
+    EXPECT_EQ(Pairs({{"a", "1"}, {"b", ""}}), Items(NodeOf(Parse("<e a='1' b=''/>"), "/e")));
+}
+
 TEST_F(AttributeTest, ParsedEmptyValueIsEmpty)
 {
     EXPECT_EQ(Pairs({{"a", "1"}, {"b", ""}, {"c", "3"}}),

@@ -175,6 +175,16 @@ TEST_F(TrustTest, PathsAreUnescapedWhenSaving)
     EXPECT_FALSE(FileExists(m_folder.Path("a%20b.xml")));
 }
 
+TEST_F(TrustTest, DocumentIsSavedToANewFileIfOneOfTheEscapedNameExists)
+{
+    const std::string literal = m_folder.Write("x%20y.xml", "<old/>");
+    ASSERT_EQ(0, m_parser->CreateNewXmlDoc("cfg"));
+    EXPECT_EQ(0, m_parser->SaveXml(literal));
+    EXPECT_EQ("<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<cfg/>\n",
+              ReadFile(m_folder.Path("x y.xml")));
+    EXPECT_EQ("<old/>", ReadFile(literal));
+}
+
 TEST_F(TrustTest, PathsEndAtANulByte)
 {
     const std::string file = Write("<cfg/>");
