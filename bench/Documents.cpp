@@ -142,7 +142,7 @@ const std::vector<FirstRead>& FirstReads()
              "",
              "/xkbConfigRegistry/modelList/model/configItem/hwList/hwId",
              "046d:c313",
-             false},
+             false}, // only the 91st of the models has a list of hardware
             {"load and read, MIME types (2.4 MB)",
              "/usr/share/mime/packages/freedesktop.org.xml",
              "mime-info",

@@ -23,7 +23,8 @@ struct FirstRead
     std::string attributeValue;
     std::string xpath; ///< the same as an expression
     std::string value;
-    bool firstWillDo; ///< whether the value lies under the first element of each name
+    bool firstWillDo; ///< whether the value lies under the first element of each name; if not,
+                      ///< libraries that step down by name would not find it
 };
 
 /** Generated configurations of several sizes, and those real files that this machine has. */

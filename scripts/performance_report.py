@@ -355,7 +355,8 @@ def workload_tables(results, workloads):
 
 def parsing_text(results):
     factors = {}
-    for workload in (w for w in results.workloads() if w.startswith("load and read")):
+    loads = [w for w in results.workloads() if w.startswith("load and read")]
+    for workload in loads:
         for name in results.implementations(workload):
             if name not in (LIBRARY, WALK, FRESH):
                 factors.setdefault(name, []).append(1 / results.ratio(workload, name, LIBRARY))
@@ -363,9 +364,19 @@ def parsing_text(results):
     sentences = [f"{name} {min(values):.1f} to {max(values):.1f}" for name, values in ordered]
     faster = [name for name, values in ordered if min(values) > 1]
     claim = ("**Who loads a file, reads one value and throws the document away is served faster by "
-             f"{' and by '.join(faster)}, whatever the file.** ") if faster else ""
+             f"{' and by '.join(faster)}, whatever file they were measured on.** ") if faster else ""
     return (f"{claim}This library takes what the engine takes. How many times as fast as this library the others "
-            f"are, from the least to the most favourable of the files: {', '.join(sentences)}.\n\n")
+            f"are, from the least to the most favourable of the files: {', '.join(sentences)}."
+            f"{absence_text(results, loads, factors)}\n\n")
+
+
+def absence_text(results, loads, names):
+    """Why some are missing in the table of a file."""
+    places = [w.removeprefix("load and read, ") for w in loads if not set(names) <= set(results.implementations(w))]
+    if not places:
+        return ""
+    return (f" Those that are missing at {' and '.join(places)} step down to the first element of each name, and the "
+            "value that is read there lies below a later one: they would not find it.")
 
 
 def price(results, variant, name):
