@@ -11,6 +11,7 @@
 #include <memory>
 #include <new>
 #include <optional>
+#include <utility>
 
 namespace
 {
@@ -25,10 +26,16 @@ std::optional<std::string> BytesOf(const std::string& path)
         return std::nullopt;
     }
     const auto size = std::filesystem::file_size(path, error);
-    std::string bytes(error ? 0 : size, '\0');
+    std::string bytes;
+    if (error || size > bytes.max_size())
+    {
+        return std::nullopt;
+    }
+    bytes.resize(static_cast<size_t>(size));
     std::ifstream file(path, std::ios::binary);
-    const bool isRead = !error && file.read(bytes.data(), static_cast<std::streamsize>(size));
-    return isRead ? std::optional(bytes) : std::nullopt;
+    const bool isRead =
+        static_cast<bool>(file.read(bytes.data(), static_cast<std::streamsize>(bytes.size())));
+    return isRead ? std::optional(std::move(bytes)) : std::nullopt;
 }
 
 /** @return what the writer would write: it saves with the engine's other call of this pair, which
