@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# fuzz.sh [TARGET [SECONDS]] — fuzzes a target of fuzz/, or all of them one after the other, and fails if
+# fuzz.sh [TARGET [SECONDS]] — fuzzes a target of fuzz/, or all of them at a time, and fails if
 # one finds something. Findings go to build/fuzz/findings; each becomes a test before it is mended.
 # A run goes on where the last one ended: what it found worth keeping is in build/fuzz/corpus.
 set -euo pipefail
@@ -7,7 +7,7 @@ cd "$(dirname "$0")/.."
 . scripts/packages.sh
 
 targets=(keypath document loader)
-seconds=${2:-12}
+seconds=${2:-20}
 if [ "${1:-all}" != all ]; then
     targets=("$1")
 fi
@@ -18,9 +18,9 @@ build=build/fuzz
 mkdir -p $build/findings
 { cmake --preset fuzz && cmake --build --preset fuzz; } >$build/build.log 2>&1 || { tail -n 40 $build/build.log >&2; exit 1; }
 
-for target in "${targets[@]}"; do
-    corpus=$build/corpus/$target
-    log=$build/$target.log
+# fuzz TARGET
+fuzz() {
+    local target=$1 corpus=$build/corpus/$1 log=$build/$1.log
     mkdir -p "$corpus"
     if ! $build/fuzz/fuzz_"$target" "$corpus" fuzz/corpus/"$target" \
         -dict=fuzz/xml.dict -max_len=4096 -timeout=10 -rss_limit_mb=1024 -max_total_time="$seconds" \
@@ -31,4 +31,13 @@ for target in "${targets[@]}"; do
     echo "fuzz $target: $(awk '/number_of_executed_units/ { runs = $2 }
         / cov: / { for (i = 1; i < NF; ++i) if ($i == "cov:") edges = $(i + 1) }
         END { print runs " runs, " edges " edges of library and target covered" }' "$log")"
+}
+
+fuzzing=()
+for target in "${targets[@]}"; do
+    fuzz "$target" &
+    fuzzing+=($!)
+done
+for job in "${fuzzing[@]}"; do
+    wait "$job"
 done

@@ -8,40 +8,61 @@ cd "$(dirname "$0")/.."
 need "${build_packages[@]}" "${test_packages[@]}" valgrind libc6-dbg
 
 build=build/dev
-log=build/valgrind.log
-mkdir -p build
-{ cmake --preset dev && cmake --build --preset dev; } >$log 2>&1 || { tail -n 40 $log >&2; exit 1; }
+logs=build/valgrind
+mkdir -p $logs
+{ cmake --preset dev && cmake --build --preset dev; } >$logs/build.log 2>&1 || { tail -n 40 $logs/build.log >&2; exit 1; }
 
-# check COMMAND... — under Valgrind. The tests count what passes through their own operator new:
-# Valgrind must not put its own in its place. A program that hangs fails; the slowest takes about a minute.
-# What kxconfig ends with when all went well is not always 0: expected=STATUS check COMMAND...
+# check STATUS COMMAND... — under Valgrind, ends as it should. The tests count what passes through their own
+# operator new: Valgrind must not put its own in its place. A program that hangs fails; the slowest takes about a
+# minute.
 check() {
-    local status=0
+    local expected=$1 log status=0
+    shift
+    log=$(mktemp -p $logs)
     timeout 900 valgrind --quiet --error-exitcode=99 --leak-check=full \
         --errors-for-leak-kinds=definite,indirect,possible --show-leak-kinds=definite,indirect,possible \
         --soname-synonyms=somalloc=nouserintercepts --suppressions=tests/valgrind.supp \
-        "$@" >$log 2>&1 || status=$?
-    if [ $status -ne "${expected:-0}" ]; then
-        tail -n 60 $log >&2
-        exit 1
+        "$@" >"$log" 2>&1 || status=$?
+    if [ $status -ne "$expected" ]; then
+        tail -n 60 "$log" >&2
+        echo "valgrind: $* ended with $status" >&2
+        return 1
     fi
-    echo "valgrind: ${1##*/} clean"
+    rm "$log"
+    echo "valgrind: ${1##*/}${2:+ $2} clean"
 }
 
-for room in config diag dom faults model platform threads trust; do
-    KX_EVALUATIONS=4000 check $build/tests/$room/${room}_tests
+# start STATUS COMMAND... — checks beside what runs already, as soon as there is a processor for it.
+running=0
+start() {
+    if [ $running -ge "$(nproc)" ]; then
+        wait -n
+        running=$((running - 1))
+    fi
+    check "$@" &
+    running=$((running + 1))
+}
+
+export KX_EVALUATIONS=4000
+for room in config dom faults model threads trust platform diag; do # the slow ones first
+    start 0 $build/tests/$room/${room}_tests
 done
 for target in keypath document loader; do
-    check $build/fuzz/replay_$target fuzz/corpus/$target
+    start 0 $build/fuzz/replay_$target fuzz/corpus/$target
 done
 
-# The client as a person runs it. What it answers is tested elsewhere.
+# The client as a person runs it. What it answers is tested elsewhere; it warns of the sample.
 sample=examples/data/gateway.xml
 for arguments in "get $sample gateway.name" "keys $sample" "find $sample //@*" "explain $sample gateway.log.level" \
     "explain --set $sample gateway.name" "set --dry-run $sample gateway.name crate" \
-    "set --output build/valgrind.xml $sample gateway.name crate" "--json keys $sample"; do
+    "set --output $logs/written.xml $sample gateway.name crate" "--json keys $sample"; do
     # shellcheck disable=SC2086  # words without blanks in them
-    check $build/tools/kxconfig $arguments
+    start 0 $build/tools/kxconfig $arguments
 done
-expected=1 check $build/tools/kxconfig check $sample # there is something to warn of
-expected=1 check $build/tools/kxconfig check $sample gateway.name other.name
+start 1 $build/tools/kxconfig check $sample
+start 1 $build/tools/kxconfig check $sample gateway.name other.name
+
+while [ $running -gt 0 ]; do
+    wait -n
+    running=$((running - 1))
+done
