@@ -20,8 +20,9 @@ $programs/kx_bench_allocations >$results/allocations.json
 # long as the process: each workload has processes of its own, in several rounds, the median of which counts.
 mapfile -t workloads < <($programs/kx_bench --benchmark_list_tests | sed 's,/[^/]*$,,' | awk '!seen[$0]++')
 rm -f $results/time-*.json
-for round in 1 2 3 4 5; do
-    echo "== time, round $round of 5"
+rounds=9
+for round in $(seq $rounds); do
+    echo "== time, round $round of $rounds"
     for i in "${!workloads[@]}"; do
         $programs/kx_bench --benchmark_filter="^$(sed 's/[(|)]/\\&/g' <<<"${workloads[i]}")/" \
             --benchmark_repetitions=3 --benchmark_min_time=0.05 --benchmark_enable_random_interleaving=true \

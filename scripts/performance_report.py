@@ -71,9 +71,13 @@ class Results:
 
     def ratio(self, workload, implementation, reference, of="times"):
         """The median of the ratios of the rounds: what disturbs a round disturbs both sides of a ratio."""
+        return statistics.median(self.ratios(workload, implementation, reference, of))
+
+    def ratios(self, workload, implementation, reference, of="times"):
+        """The ratio in each of the rounds; the only one of what repeats."""
         values = self.rounds if of == "times" else [getattr(self, of)]
         one, other = f"{workload}/{implementation}", f"{workload}/{reference}"
-        return statistics.median(round[one] / round[other] for round in values)
+        return [round[one] / round[other] for round in values]
 
 
 def found_ones(matches):
@@ -190,6 +194,16 @@ def worst(figures):
     return (min if figures[0][1].faster else max)(figures, key=lambda entry: entry[0])
 
 
+def spread(results, check):
+    """The least and the most that single rounds measured; nothing of what repeats."""
+    if check.of != "times":
+        return ""
+    ratios = results.ratios(check.workload, check.implementation, check.reference)
+    figures = sorted(1 / ratio if check.faster else ratio for ratio in ratios)
+    digits = 1 if check.faster else 2
+    return f"{figures[0]:.{digits}f} to {figures[-1]:.{digits}f}"
+
+
 def is_kept(results, figure, check):
     if check.limit == FEW_MORE:
         own, reference = (results.allocations[f"{check.workload}/{i}"] for i in (check.implementation, check.reference))
@@ -201,19 +215,19 @@ def target_rows(results):
     for target in targets(results):
         figures = measured(results, target.checks)
         if not figures:
-            yield [target.operation, target.against, target.limit, "not measured", ""]
+            yield [target.operation, target.against, target.limit, "not measured", "", ""]
             continue
         figure, check = worst(figures)
         note = note_text(results, target.note)
         where = "" if len(target.checks) == 1 else f" ({place(check, target)})"
         shown = f"{figure:.1f} times" if check.faster else f"{figure:.2f}×"
         kept = [c for f, c in figures if is_kept(results, f, c)]
-        yield [target.operation, target.against, target.limit, shown + where + note,
+        yield [target.operation, target.against, target.limit, shown + where + note, spread(results, check),
                partial_verdict(kept, figures, target)]
     yield from growth_targets(results)
     name, percent = dearest_lookup(results, "no_gates")
     yield ["log gates, instructions of a lookup", "a build without them", "5 %",
-           f"{percent:.1f} % ({escape(name)})", verdict(percent <= 5)]
+           f"{percent:.1f} % ({escape(name)})", "", verdict(percent <= 5)]
 
 
 def growth_targets(results):
@@ -224,7 +238,7 @@ def growth_targets(results):
         steepest, curve = max(exponents, key=lambda entry: entry[0])
         where = "" if len(exponents) == 1 else f" ({escape(curve.title)})"
         yield [f"growth with the number of {name}, instructions", "a straight line, fitted exponent", "1.02",
-               f"{steepest:.3f}{where}", verdict(steepest <= 1.02)]
+               f"{steepest:.3f}{where}", "", verdict(steepest <= 1.02)]
 
 
 def verdict(kept):
@@ -460,7 +474,8 @@ libxml++ keeps the white space.
 {targets}
 
 Of several measurements, the one that comes closest to its limit is shown, and in brackets which it is; "returned" is \
-the form of `GetValue()` that returns the value.
+the form of `GetValue()` that returns the value. Where single rounds lie far apart, where a process's memory \
+happens to lie, or what else the machine does, decides more than the code.
 
 What lies behind the aims that are hard to keep: each handle that is returned is made, set and released by calls that \
 log, behind gates, and a name is passed as a copy; clients are linked against that. On few siblings it is most of \
@@ -526,7 +541,8 @@ def page(results):
         compiler=context["compiler"],
         versions=versions(results),
         rounds=len(results.rounds),
-        targets=text_table(["operation", "measured against", "at most", "measured", ""], target_rows(results)),
+        targets=text_table(["operation", "measured against", "at most", "measured", "in single rounds", ""],
+                           target_rows(results)),
         parsing=parsing_text(results),
         tables="\n\n".join(parts),
         growth=table(["with the number of", "sizes", "instructions", "of the walk", "time", "of the walk"],
