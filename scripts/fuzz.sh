@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# fuzz.sh [TARGET [SECONDS]] — fuzzes a target of fuzz/, or all of them at a time, and fails if
+# fuzz.sh [TARGET [SECONDS]] — fuzzes a target of fuzz/, or all of them side by side, and fails if
 # one finds something. Findings go to build/fuzz/findings; each becomes a test before it is mended.
 # A run goes on where the last one ended: what it found worth keeping is in build/fuzz/corpus.
 set -euo pipefail
@@ -38,6 +38,8 @@ for target in "${targets[@]}"; do
     fuzz "$target" &
     fuzzing+=($!)
 done
+failed=0
 for job in "${fuzzing[@]}"; do
-    wait "$job"
+    wait "$job" || failed=1
 done
+exit $failed

@@ -33,16 +33,19 @@ check() {
 }
 
 # start STATUS COMMAND... — checks beside what runs already, as soon as there is a processor for it.
-running=0
 start() {
-    if [ $running -ge "$(nproc)" ]; then
-        wait -n
-        running=$((running - 1))
-    fi
+    [ $running -lt "$(nproc)" ] || await_one
     check "$@" &
     running=$((running + 1))
 }
 
+await_one() {
+    wait -n || failed=1
+    running=$((running - 1))
+}
+
+running=0
+failed=0
 export KX_EVALUATIONS=4000
 for room in config dom faults model threads trust platform diag; do # the slow ones first
     start 0 $build/tests/$room/${room}_tests
@@ -63,6 +66,6 @@ start 1 $build/tools/kxconfig check $sample
 start 1 $build/tools/kxconfig check $sample gateway.name other.name
 
 while [ $running -gt 0 ]; do
-    wait -n
-    running=$((running - 1))
+    await_one
 done
+exit $failed
