@@ -38,9 +38,8 @@ def filtered(page):
             if heading:
                 line += f" {{#{name_of(page, heading.group(2))}}}"
             line = re.sub(r"\]\(#([\w-]+)\)", lambda link: f"](#{pathlib.Path(page).stem.lower()}-{link.group(1)})", line)
-            line = re.sub(r"\]\((?:\.\./|handbook/)?([\w-]+)\.md#([\w-]+)\)", r"](#\1-\2)", line)
+            line = re.sub(r"\]\(([\w-]+)\.md#([\w-]+)\)", r"](#\1-\2)", line)
             line = line.replace("](README.md)", "](index.html)").replace("](../../include)", "](files.html)")
-            line = line.replace("](../first-steps.txt)", "](first-steps.txt)")
             line = re.sub(r"`([^`]+)`", lambda quoted: quotation(quoted.group(1)), line)
         yield line
 

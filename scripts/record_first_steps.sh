@@ -1,12 +1,12 @@
 #!/usr/bin/env bash
-# Records docs/first-steps.txt: what a new user types and sees, from a clean clone to a key that gives nothing and why.
+# Records docs/handbook/first-steps.txt: what a new user types and sees, from a clean clone to a key that gives nothing and why.
 # The clone is of the last commit of this one, in an empty folder.
 # usage: record_first_steps.sh [--check]   --check writes nothing and fails if the recording is not up to date
 # shellcheck disable=SC2016,SC2034  # commands are typed in as they stand
 set -euo pipefail
 cd "$(dirname "$0")/.."
 
-recording=docs/first-steps.txt
+recording=docs/handbook/first-steps.txt
 PROJECT=$PWD
 empty=$(mktemp -d)
 trap 'rm -rf "$empty"' EXIT

@@ -2,7 +2,7 @@
 #
 # The environment says where the SDK is, as its own setup script does: QNX_HOST (the tools) and QNX_TARGET (headers
 # and libraries). KX_QNX_CXX_RUNTIME selects the C++ run-time library: cpp (Dinkum, the SDK's default) or gpp (GNU).
-# All code of a process must use the same one. docs/building-for-qnx.md tells the rest.
+# All code of a process must use the same one. docs/development/building-for-qnx.md tells the rest.
 set(CMAKE_SYSTEM_NAME QNX)
 set(CMAKE_SYSTEM_VERSION 6.5.0)
 set(CMAKE_SYSTEM_PROCESSOR armv7le)

@@ -1,4 +1,4 @@
-// Several threads at once, each with objects of its own: what docs/threads.md allows. The tests
+// Several threads at once, each with objects of its own: what docs/handbook/threads.md allows. The tests
 // mean most under ThreadSanitizer.
 
 #include "CXMLReader.h"
@@ -85,7 +85,7 @@ class ThreadsTest : public testing::Test
 protected:
     ThreadsTest()
     {
-        // Alone, as docs/threads.md asks: threads that miss a file would do it at once.
+        // Alone, as docs/handbook/threads.md asks: threads that miss a file would do it at once.
         xmlInitParser();
         xmlInitializeCatalog();
         g_LumLogParams.xmlConfigParserMask = 0xFFFFFFFFu;

@@ -1,4 +1,4 @@
-// What docs/security.md says about input that comes from untrusted hands.
+// What docs/handbook/security.md says about input that comes from untrusted hands.
 
 #include "CXMLReader.h"
 #include "CXMLWriter.h"
