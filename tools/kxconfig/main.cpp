@@ -1,7 +1,7 @@
-#include "Commands.h"
-#include "Document.h"
-#include "Output.h"
-#include "Usage.h"
+#include "cli/Usage.h"
+#include "commands/Commands.h"
+#include "file/Document.h"
+#include "output/Output.h"
 
 #include "KxLog.h"
 #include "LogMask.h"

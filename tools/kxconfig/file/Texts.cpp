@@ -1,7 +1,7 @@
-#include "Texts.h"
+#include "file/Texts.h"
 
-#include "Locations.h"
-#include "Nodes.h"
+#include "file/Locations.h"
+#include "file/Nodes.h"
 
 namespace
 {

@@ -1,7 +1,7 @@
-#include "Warnings.h"
+#include "checks/Warnings.h"
 
-#include "Nodes.h"
-#include "Output.h"
+#include "file/Nodes.h"
+#include "output/Output.h"
 
 void Warnings::Warn(const xmlNode* node, const char* kind, const std::string& text)
 {

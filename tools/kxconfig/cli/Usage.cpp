@@ -1,6 +1,6 @@
-#include "Usage.h"
+#include "cli/Usage.h"
 
-#include "ExitStatus.h"
+#include "output/ExitStatus.h"
 
 #include <CLI/CLI.hpp>
 

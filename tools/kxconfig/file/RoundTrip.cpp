@@ -1,6 +1,6 @@
-#include "RoundTrip.h"
+#include "file/RoundTrip.h"
 
-#include "Output.h"
+#include "output/Output.h"
 
 #include <libxml/tree.h>
 

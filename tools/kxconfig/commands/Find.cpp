@@ -1,8 +1,8 @@
-#include "Commands.h"
-#include "Document.h"
-#include "Locations.h"
-#include "Nodes.h"
-#include "Output.h"
+#include "commands/Commands.h"
+#include "file/Document.h"
+#include "file/Locations.h"
+#include "file/Nodes.h"
+#include "output/Output.h"
 
 #include <libxml/xmlerror.h>
 #include <libxml/xpath.h>

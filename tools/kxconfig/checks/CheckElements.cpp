@@ -1,7 +1,7 @@
-#include "CheckElements.h"
+#include "checks/CheckElements.h"
 
-#include "Nodes.h"
-#include "Output.h"
+#include "file/Nodes.h"
+#include "output/Output.h"
 
 #include <iterator>
 

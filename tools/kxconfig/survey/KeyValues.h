@@ -1,7 +1,7 @@
 #ifndef KX_TOOLS_KEYVALUES_H
 #define KX_TOOLS_KEYVALUES_H
 
-#include "Levels.h"
+#include "survey/Levels.h"
 
 #include <string>
 #include <vector>

@@ -1,4 +1,4 @@
-#include "Save.h"
+#include "file/Save.h"
 
 #include <algorithm>
 #include <cerrno>

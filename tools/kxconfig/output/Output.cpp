@@ -1,4 +1,4 @@
-#include "Output.h"
+#include "output/Output.h"
 
 #include <algorithm>
 #include <cstdlib>

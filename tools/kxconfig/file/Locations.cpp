@@ -1,6 +1,6 @@
-#include "Locations.h"
+#include "file/Locations.h"
 
-#include "Nodes.h"
+#include "file/Nodes.h"
 
 #include <map>
 #include <utility>

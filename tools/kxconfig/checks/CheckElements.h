@@ -1,8 +1,8 @@
 #ifndef KX_TOOLS_CHECKELEMENTS_H
 #define KX_TOOLS_CHECKELEMENTS_H
 
-#include "Levels.h"
-#include "Warnings.h"
+#include "checks/Warnings.h"
+#include "survey/Levels.h"
 
 /** Warns of what no lookup can see in @p element and below, and of what no condition can tell
  * apart. */

@@ -1,7 +1,7 @@
 #ifndef KX_TOOLS_DOCUMENT_H
 #define KX_TOOLS_DOCUMENT_H
 
-#include "ExitStatus.h"
+#include "output/ExitStatus.h"
 
 #include "CXMLReader.h"
 #include "CXMLWriter.h"

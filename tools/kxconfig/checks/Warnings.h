@@ -1,7 +1,7 @@
 #ifndef KX_TOOLS_WARNINGS_H
 #define KX_TOOLS_WARNINGS_H
 
-#include "Locations.h"
+#include "file/Locations.h"
 
 #include <map>
 #include <set>

@@ -1,8 +1,8 @@
-#include "Commands.h"
-#include "Document.h"
-#include "Output.h"
-#include "Save.h"
-#include "Texts.h"
+#include "commands/Commands.h"
+#include "file/Document.h"
+#include "file/Save.h"
+#include "file/Texts.h"
+#include "output/Output.h"
 
 #include <libxml/chvalid.h>
 #include <libxml/xmlstring.h>

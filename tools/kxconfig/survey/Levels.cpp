@@ -1,6 +1,6 @@
-#include "Levels.h"
+#include "survey/Levels.h"
 
-#include "Nodes.h"
+#include "file/Nodes.h"
 
 #include <algorithm>
 #include <iterator>

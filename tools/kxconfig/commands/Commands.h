@@ -1,7 +1,7 @@
 #ifndef KX_TOOLS_COMMANDS_H
 #define KX_TOOLS_COMMANDS_H
 
-#include "ExitStatus.h"
+#include "output/ExitStatus.h"
 
 #include <string>
 #include <vector>

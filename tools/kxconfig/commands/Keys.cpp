@@ -1,8 +1,8 @@
-#include "Commands.h"
-#include "Document.h"
-#include "KeyList.h"
-#include "KeyValues.h"
-#include "Output.h"
+#include "commands/Commands.h"
+#include "file/Document.h"
+#include "output/Output.h"
+#include "survey/KeyList.h"
+#include "survey/KeyValues.h"
 
 ExitStatus Keys(const std::string& file)
 {

@@ -1,6 +1,6 @@
-#include "KeyValues.h"
+#include "survey/KeyValues.h"
 
-#include "Nodes.h"
+#include "file/Nodes.h"
 
 #include <algorithm>
 #include <iterator>

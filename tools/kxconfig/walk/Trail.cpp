@@ -1,4 +1,4 @@
-#include "Trail.h"
+#include "walk/Trail.h"
 
 #include "KxLog.h"
 #include "config/ConditionEvaluation.h"

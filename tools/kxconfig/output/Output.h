@@ -1,7 +1,7 @@
 #ifndef KX_TOOLS_OUTPUT_H
 #define KX_TOOLS_OUTPUT_H
 
-#include "ExitStatus.h"
+#include "output/ExitStatus.h"
 
 #include <nlohmann/json.hpp>
 

@@ -1,6 +1,6 @@
-#include "KeyList.h"
+#include "survey/KeyList.h"
 
-#include "Nodes.h"
+#include "file/Nodes.h"
 
 #include <unordered_set>
 

@@ -1,9 +1,9 @@
-#include "Commands.h"
-#include "Document.h"
-#include "Locations.h"
-#include "Nodes.h"
-#include "Output.h"
-#include "Trail.h"
+#include "commands/Commands.h"
+#include "file/Document.h"
+#include "file/Locations.h"
+#include "file/Nodes.h"
+#include "output/Output.h"
+#include "walk/Trail.h"
 
 namespace
 {

@@ -1,4 +1,4 @@
-#include "Nodes.h"
+#include "file/Nodes.h"
 
 namespace
 {

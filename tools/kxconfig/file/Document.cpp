@@ -1,7 +1,7 @@
-#include "Document.h"
+#include "file/Document.h"
 
-#include "Nodes.h"
-#include "Output.h"
+#include "file/Nodes.h"
+#include "output/Output.h"
 
 #include <libxml/parser.h>
 #include <libxml/tree.h>
