@@ -9,12 +9,6 @@
 namespace kx
 {
 
-/** The value that @p text holds; never null. */
-inline const char* ContentOf(const xmlNode* text)
-{
-    return text->content != 0 ? reinterpret_cast<const char*>(text->content) : "";
-}
-
 /** One level of the lookup that separates every value. */
 template <class Observer>
 class Appender

@@ -99,15 +99,6 @@ private:
     int m_current;
 };
 
-inline xmlNode* ElementFrom(xmlNode* node)
-{
-    while (node != 0 && node->type != XML_ELEMENT_NODE)
-    {
-        node = node->next;
-    }
-    return node;
-}
-
 /**
  * The walk of an update, in document order.
  *

@@ -1,0 +1,83 @@
+#ifndef KX_ENGINE_TEXT_H
+#define KX_ENGINE_TEXT_H
+
+/**
+ * @file Text.h
+ * Text as the engine has it, zero-terminated, and as the library does, with a length.
+ */
+
+#include <libxml/xmlstring.h>
+
+#include <stddef.h>
+#include <string.h>
+
+#include <string>
+
+namespace kx
+{
+
+/** A run of bytes in a string that outlives the view. Any byte may occur, NUL included. */
+struct TextView
+{
+    TextView() : data(""), size(0) {}
+    TextView(const char* bytes, size_t count) : data(bytes), size(count) {}
+    explicit TextView(const std::string& text) : data(text.c_str()), size(text.size()) {}
+
+    bool IsEmpty() const { return size == 0; }
+
+    /** @return the position of the first @p separator, or the view's size if there is none. */
+    size_t Find(char separator) const
+    {
+        const void* const found = memchr(data, separator, size);
+        return found == 0 ? size : static_cast<size_t>(static_cast<const char*>(found) - data);
+    }
+
+    /** @return the bytes before @p position. */
+    TextView Before(size_t position) const { return TextView(data, position); }
+
+    /** @return the bytes after @p position; empty if the view ends there or before. */
+    TextView After(size_t position) const
+    {
+        const size_t begin = position + (position < size);
+        return TextView(data + begin, size - begin);
+    }
+
+    const char* data;
+    size_t size;
+};
+
+inline const xmlChar* ToEngine(const std::string& text)
+{
+    return reinterpret_cast<const xmlChar*>(text.c_str());
+}
+
+/** @return @p text, which may be null: then it reads as empty. */
+inline const char* FromEngine(const xmlChar* text)
+{
+    return text != 0 ? reinterpret_cast<const char*>(text) : "";
+}
+
+/**
+ * @return whether the engine's @p text consists of exactly the bytes of @p view.
+ *
+ * A null @p text equals nothing: short of memory the engine makes elements without a name.
+ */
+inline bool SameText(const xmlChar* text, TextView view)
+{
+    if (text == 0)
+    {
+        return false;
+    }
+    const xmlChar* const bytes = reinterpret_cast<const xmlChar*>(view.data);
+    size_t same = 0;
+    // A NUL in the view is no byte of the text: it must not lead past the terminator.
+    while (same != view.size && text[same] == bytes[same] && text[same] != 0)
+    {
+        ++same;
+    }
+    return same == view.size && text[same] == 0;
+}
+
+} // namespace kx
+
+#endif
