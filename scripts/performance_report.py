@@ -1,9 +1,12 @@
 #!/usr/bin/python3
-"""Writes docs/performance.md and its plots from what scripts/bench.sh measured.
+"""Writes docs/performance.md and its plots from the measurements of scripts/bench.sh.
+
+The prose of the page is in performance.template.md, beside this script.
 
 usage: performance_report.py RESULTS_FOLDER DOCS_FOLDER
 """
 
+import io
 import json
 import math
 import re
@@ -24,6 +27,11 @@ FRESH = "XPath, fresh"
 COMPILED = "XPath, compiled"
 LISTED = "XPath, fresh, into a list"
 LIBXMLPP = "libxml++"
+BOOST = "Boost.PropertyTree"
+POCO = "Poco XMLConfiguration"
+PUGIXML = "pugixml"
+TINYXML = "TinyXML-2"
+OTHERS = (PUGIXML, TINYXML, POCO, BOOST, LIBXMLPP)
 
 PLAIN = "look up, match at sibling"
 CONDITION = "look up with a condition, match at sibling"
@@ -42,7 +50,7 @@ QUERY_VALUE = "find 200 nodes by XPath, among 1000 by value"
 
 
 class Results:
-    """What was measured, by workload and implementation."""
+    """The measurements, by workload and implementation."""
 
     def __init__(self, folder):
         rounds = {}
@@ -367,30 +375,34 @@ def workload_tables(results, workloads):
     return "\n\n".join(parts)
 
 
-def parsing_text(results):
-    factors = {}
-    loads = [w for w in results.workloads() if w.startswith("load and read")]
-    for workload in loads:
-        for name in results.implementations(workload):
-            if name not in (LIBRARY, WALK, FRESH):
-                factors.setdefault(name, []).append(1 / results.ratio(workload, name, LIBRARY))
-    ordered = sorted(factors.items(), key=lambda entry: -max(entry[1]))
-    sentences = [f"{name} {min(values):.1f} to {max(values):.1f}" for name, values in ordered]
-    faster = [name for name, values in ordered if min(values) > 1]
-    claim = ("**Who loads a file, reads one value and throws the document away is served faster by "
-             f"{' and by '.join(faster)}, whatever file they were measured on.** ") if faster else ""
-    return (f"{claim}This library takes what the engine takes. How many times as fast as this library the others "
-            f"are, from the least to the most favourable of the files: {', '.join(sentences)}."
-            f"{absence_text(results, loads, factors)}\n\n")
+def loading_rows(results):
+    """For each other library, its speed relative to this one in the least and in the most favorable file."""
+    for name in OTHERS:
+        factors = [1 / results.ratio(workload, name, LIBRARY) for workload in results.workloads()
+                   if workload.startswith("load and read") and f"{workload}/{name}" in results.times]
+        yield [name, f"{min(factors):.1f}", f"{max(factors):.1f}"]
 
 
-def absence_text(results, loads, names):
-    """Why some are missing in the table of a file."""
-    places = [w.removeprefix("load and read, ") for w in loads if not set(names) <= set(results.implementations(w))]
-    if not places:
-        return ""
-    return (f" Those that are missing at {' and '.join(places)} step down to the first element of each name, and the "
-            "value that is read there lies below a later one: they would not find it.")
+# The operations that the verdict lists.
+STANDING = ["load and read, 100 KB", f"{PLAIN} 10", f"{PLAIN} 1000", f"{CONDITION} 10", f"{CONDITION} 1000",
+            UPDATE, SAVE, ITERATE, f"{FIND_CHILD} 10", QUERY_NAME]
+
+
+def standing_rows(results):
+    """For each operation, the libraries that are faster and those that are slower, with their factors."""
+    for workload in STANDING:
+        ratios = {name: results.ratio(workload, name, LIBRARY) for name in OTHERS
+                  if f"{workload}/{name}" in results.times}
+        ordered = sorted(ratios.items(), key=lambda entry: entry[1])
+        yield [workload, ratio_text(results.ratio(workload, LIBRARY, WALK)),
+               ", ".join(f"{name} {ratio_text(ratio)}" for name, ratio in ordered if ratio < 1),
+               ", ".join(f"{name} {ratio_text(ratio)}" for name, ratio in ordered if ratio >= 1)]
+
+
+def missed_text(rows):
+    """The targets that are not met, by operation and reference."""
+    missed = [f"{row[0]} (relative to {row[1]})" for row in rows if "missed" in row[-1]]
+    return f"Missed: {'; '.join(missed)}." if missed else ""
 
 
 def price(results, variant, name):
@@ -441,84 +453,7 @@ SECTIONS = [
     ("XPath", "find 200"),
 ]
 
-TEXT = """# Performance
-
-Written by `scripts/bench.sh` from its own measurements; nothing in here is typed by hand.
-
-| | |
-| --- | --- |
-| date | {date} |
-| machine | {processor}, {cpus} processors at {mhz:,} MHz, caches {caches} |
-| system | {system}, {compiler} {flags} |
-| compared with | {versions} |
-| commands | `./scripts/bench.sh`; of it, `build/bench/bench/kx_bench` (time), `kx_bench_allocations`, \
-`scripts/count_instructions.sh` (instructions) and `scripts/performance_report.py` (this page) |
-
-Times are processor times. In each of {rounds} rounds a process for each workload measured all that take part in \
-random order, so that what disturbs one disturbs all; times and ratios are the medians of the rounds. The ratios, \
-time or instructions relative to the hand-written walk, are the figures to look at. Instructions are counted by Valgrind's callgrind, with the C \
-library's plainest string functions, and repeat. Allocations are requests to `malloc` and its like. The log mask is \
-zero. What each operation yields is compared with what it should before it is measured.
-
-The **hand-written walk** is the limit that the engine sets: a fixed path, names compared with `strcmp`, no \
-allocation but the result. It works on the very document of the library's reader and finds all matches, as a lookup \
-does. The other libraries stop at the first match where that is how they are used; and Boost.PropertyTree, Poco, \
-pugixml and TinyXML-2 have left out the white space between elements when they loaded the document, which the engine \
-keeps: they step over half as many nodes. So does this library's toolkit, and XPath is measured on its document; \
-libxml++ keeps the white space.
-
-![Time relative to the hand-written walk](performance/ratios.svg)
-
-## What is aimed at
-
-{targets}
-
-Of several measurements, the one that comes closest to its limit is shown, and in brackets which it is; "returned" is \
-the form of `GetValue()` that returns the value. Where single rounds lie far apart, where a process's memory \
-happens to lie, or what else the machine does, decides more than the code.
-
-What lies behind the aims that are hard to keep: each handle that is returned is made, set and released by calls that \
-log, behind gates, and a name is passed as a copy; clients are linked against that. On few siblings it is most of \
-`FindChildNode()`, and in `Children()` it comes on top of a list's own allocation for each child, as in \
-`FindAllNodes()`, where that list alone takes what the aim leaves. With many siblings and a condition the engine has to \
-copy an attribute of each for whoever asks, the walk included, and a large document is fetched from memory in the \
-meantime: XPath, which does more, waits for the same memory.
-
-## How it compares
-
-{parsing}{tables}
-
-## Growth
-
-Time and instructions grow with a power of the size; the exponent is fitted to the measurements from the first size \
-that is given. 1 is linear. Where a document outgrows the processor's caches, time grows faster than work, in the \
-walk as well.
-
-{growth}
-
-![Growth](performance/growth.svg)
-
-## The price of log gates and of the observer
-
-Instructions of an operation with the log mask at zero, against a build in which every gate is compiled out, and \
-against one in which the walks do not call the observer that `kxconfig explain` watches them by. The lookup that \
-pays most for the gates pays {gate_price[1]:.1f} % ({gate_price[0]}), for the observer {watch_price[1]:.1f} % \
-({watch_price[0]}): its calls vanish when compiled. A few instructions more or less are the compiler's choice of \
-registers. Not all sizes are listed.
-
-{prices}
-
-## Keeping it so
-
-`scripts/check_speed.sh` counts the instructions of six operations and fails if one takes 3 % more than \
-`bench/instructions.txt` says, or if the observer costs something. To see where they went:
-
-<!-- untested: needs what scripts/bench.sh builds -->
-```sh
-valgrind --tool=callgrind --instr-atstart=no --callgrind-out-file=build/out build/bench/bench/kx_bench_guard '{example}'
-callgrind_annotate build/out.1
-```
-"""
+TEMPLATE = Path(__file__).with_name("performance.template.md")
 
 
 def page(results):
@@ -530,7 +465,8 @@ def page(results):
         if chosen:
             parts.append(f"### {title}\n\n{workload_tables(results, chosen)}")
     context = results.context
-    return TEXT.format(
+    targets_table = list(target_rows(results))
+    return TEMPLATE.read_text().format(
         date=context["date"][:10],
         processor=context["processor"],
         cpus=context["num_cpus"],
@@ -541,9 +477,13 @@ def page(results):
         compiler=context["compiler"],
         versions=versions(results),
         rounds=len(results.rounds),
-        targets=text_table(["operation", "measured against", "at most", "measured", "in single rounds", ""],
-                           target_rows(results)),
-        parsing=parsing_text(results),
+        kept=sum(row[-1] == "kept" for row in targets_table),
+        total=len(targets_table),
+        missed=missed_text(targets_table),
+        standing=text_table(["operation", "to the walk", "faster", "slower"], standing_rows(results)),
+        targets=text_table(["operation", "measured against", "at most", "measured", "single rounds", ""],
+                           targets_table),
+        loading=table(["library", "least favorable file", "most favorable file"], loading_rows(results)),
         tables="\n\n".join(parts),
         growth=table(["with the number of", "sizes", "instructions", "of the walk", "time", "of the walk"],
                      growth_rows(results)),
@@ -557,34 +497,54 @@ def page(results):
 
 # --- Plots
 
-COLOURS = {LIBRARY: "#c1121f", FRESH: "#7fb3d5", COMPILED: "#2471a3", "Poco XMLConfiguration": "#8e44ad",
-           "Boost.PropertyTree": "#af7ac5", "pugixml": "#229954", "TinyXML-2": "#82c99a", LIBXMLPP: "#d68910",
-           WALK: "#444444"}
+# Libraries differ by shape as well as by color.
+Mark = namedtuple("Mark", "color shape")
+MARKS = {LIBRARY: Mark("#c1121f", "D"), FRESH: Mark("#7fb3d5", "v"), COMPILED: Mark("#2471a3", "^"),
+         POCO: Mark("#8e44ad", "s"), BOOST: Mark("#af7ac5", "*"), PUGIXML: Mark("#229954", "o"),
+         TINYXML: Mark("#82c99a", "X"), LIBXMLPP: Mark("#d68910", "P"), WALK: Mark("#444444", "s")}
+
+
+# Text stays text, which keeps the files small.
+plt.rcParams.update({"svg.hashsalt": "fixed", "svg.fonttype": "none", "font.family": "sans-serif"})
 
 
 def save(figure, path):
-    plt.rcParams["svg.hashsalt"] = "fixed"
-    figure.savefig(path, metadata={"Date": None}, bbox_inches="tight")
+    drawing = io.StringIO()
+    figure.savefig(drawing, format="svg", metadata={"Date": None}, bbox_inches="tight")
     plt.close(figure)
+    path.write_text(compact(drawing.getvalue()))
+
+
+def compact(svg):
+    """The same drawing without indentation and comments, and with coordinates to a tenth of a point."""
+    rounded = re.sub(r"\d+\.\d{2,}", lambda number: f"{float(number[0]):.1f}", svg)
+    return re.sub(r"^ +|<!--.*?-->\n", "", rounded, flags=re.M)
+
+
+def calm_grid(axes):
+    """Lines at the major ticks only, and no tick marks beside them."""
+    axes.minorticks_off()
+    axes.tick_params(bottom=False, left=False)
+    axes.grid(alpha=0.3, zorder=0)
 
 
 def plot_ratios(results, path):
     workloads = [w for _, prefix in SECTIONS for w in results.workloads()
-                 if w.startswith(prefix) and len(set(results.implementations(w)) & set(COLOURS)) > 2][::-1]
+                 if w.startswith(prefix) and len(set(results.implementations(w)) & set(MARKS)) > 2][::-1]
     figure, axes = plt.subplots(figsize=(10, 0.32 * len(workloads) + 1.5))
-    for name, colour in COLOURS.items():
+    for name, mark in MARKS.items():
         if name == WALK:
             continue
         known = [(results.ratio(w, name, WALK), row) for row, w in enumerate(workloads)
                  if f"{w}/{name}" in results.times]
         if known:
-            axes.scatter(*zip(*known), color=colour, label=name, zorder=3,
-                         s=60 if name == LIBRARY else 26, marker="D" if name == LIBRARY else "o")
-    axes.axvline(1, color=COLOURS[WALK], linewidth=1)
+            axes.scatter(*zip(*known), color=mark.color, marker=mark.shape, label=name, zorder=3,
+                         s=60 if name == LIBRARY else 36)
+    axes.axvline(1, color=MARKS[WALK].color, linewidth=1)
     axes.set_xscale("log")
     axes.set_yticks(range(len(workloads)), workloads, fontsize=8)
     axes.set_xlabel("time relative to the hand-written walk over libxml2 (left is faster)")
-    axes.grid(axis="both", alpha=0.3, zorder=0)
+    calm_grid(axes)
     axes.legend(fontsize=8, loc="upper center", bbox_to_anchor=(0.3, 1 + 1.6 / len(workloads)), ncol=4, frameon=False)
     save(figure, path)
 
@@ -594,9 +554,9 @@ def plot_growth(results, path):
     for axes, curve in zip(grid.flat, CURVES):
         for name in (WALK, LIBRARY):
             line = points(results.times, curve, name)
-            # The two mostly cover each other: the walk shows as a border.
-            axes.plot(*zip(*line), "o-", color=COLOURS[name], label=name, markersize=7 if name == WALK else 4,
-                      linewidth=2.5 if name == WALK else 1.2)
+            # The two lines nearly coincide: the walk shows as a border.
+            axes.plot(*zip(*line), marker=MARKS[name].shape, color=MARKS[name].color, label=name,
+                      markersize=8 if name == WALK else 4, linewidth=2.5 if name == WALK else 1.2)
         # From the last point of the walk backwards, as nothing weighs there but the size.
         (x, y), (start, _) = points(results.times, curve, WALK)[-1], line[0]
         axes.plot([start, x], [y * start / x, y], ":", color="#888888", label="linear", zorder=0)
@@ -605,7 +565,7 @@ def plot_growth(results, path):
         axes.set_title(curve.title, fontsize=10)
         axes.set_xlabel(curve.unit)
         axes.set_ylabel("time, ns")
-        axes.grid(alpha=0.3)
+        calm_grid(axes)
     grid.flat[0].legend(fontsize=8)
     save(figure, path)
 
