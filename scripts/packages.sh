@@ -38,10 +38,13 @@ need() {
 build_packages=(g++ cmake ninja-build libxml2-dev libcli11-dev nlohmann-json3-dev)
 
 # For the tests of any build; the last line: packages whose files the tests read.
-test_packages=(clang python3 libgtest-dev libgmock-dev pkg-config groff-base bsdutils
+test_packages=(clang git python3 libgtest-dev libgmock-dev pkg-config groff-base bsdutils
     fontconfig-config shared-mime-info xkb-data)
 
 # For the benchmarks: what measures, what the library is compared with, what draws the plots.
 bench_packages=(libbenchmark-dev valgrind python3-matplotlib pkg-config
     libpoco-dev libboost-dev libpugixml-dev libtinyxml2-dev libxml++2.6-dev
     fontconfig-config shared-mime-info xkb-data)
+
+# For making the Debian packages, and for their tests.
+packaging_packages=(dpkg-dev file fakeroot lintian man-db pkg-config)

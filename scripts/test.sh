@@ -36,7 +36,7 @@ stage_fast() {
 }
 
 stage_package() {
-    need "${build_packages[@]}" pkg-config dpkg-dev fakeroot file
+    need "${build_packages[@]}" "${packaging_packages[@]}"
     run_preset package
 }
 

@@ -1,6 +1,8 @@
 #!/usr/bin/env bash
-# Builds and runs the clients against an installed package, by one of the roads that clients take.
+# Builds and runs the clients, by one of the roads that clients take: against an installed package, or together
+# with the library's sources.
 # usage: build.sh cmake|pkg-config PREFIX LIBDIR BUILD_FOLDER CONFIGURATION_FILE
+#        build.sh add_subdirectory|FetchContent SOURCE_FOLDER LIBDIR BUILD_FOLDER CONFIGURATION_FILE
 #
 # From the environment: CXX, CXXFLAGS, LDFLAGS; TOOLCHAIN (a CMake toolchain file), EMULATOR (what runs the
 # programs, words joined by ";") and ENGINE (the folder of libxml2's headers), all of which may be empty.
@@ -16,11 +18,32 @@ source=$(cd "$(dirname "$0")" && pwd)
 rm -rf "$build"
 mkdir -p "$build"
 
+# by_cmake OPTION...
 by_cmake() {
     cmake -G Ninja -S "$source" -B "$build" -DCMAKE_BUILD_TYPE=Debug \
-        -DCMAKE_TOOLCHAIN_FILE="${TOOLCHAIN:-}" -DCMAKE_PREFIX_PATH="$prefix" \
-        -DCMAKE_FIND_ROOT_PATH="$prefix" -DKX_CONSUMER_FILE="$file" &&
+        -DCMAKE_TOOLCHAIN_FILE="${TOOLCHAIN:-}" -DKX_CONSUMER_FILE="$file" "$@" &&
         cmake --build "$build" -j 2
+}
+
+by_package() {
+    by_cmake -DCMAKE_PREFIX_PATH="$prefix" -DCMAKE_FIND_ROOT_PATH="$prefix"
+}
+
+# by_sources FOLDER_OR_URL
+by_sources() {
+    by_cmake -DKX_CONSUMER_ROAD="$road" -DKX_CONSUMER_SOURCE="$1"
+}
+
+# repository_of FOLDER — makes a repository of the folder as it is now, which may be no clone or have changes.
+repository_of() {
+    local git=(git --git-dir "$build/repository/.git" -c user.name=test -c user.email=test@localhost)
+    git init --quiet --initial-branch main "$build/repository" &&
+        "${git[@]}" --work-tree "$1" add --all &&
+        "${git[@]}" --work-tree "$1" commit --quiet --message "The sources"
+}
+
+by_fetched_sources() {
+    repository_of "$prefix" && by_sources "file://$build/repository"
 }
 
 by_pkg_config() {
@@ -66,7 +89,9 @@ quietly() {
 }
 
 case $road in
-cmake) quietly by_cmake && quietly run_by_cmake ;;
+cmake) quietly by_package && quietly run_by_cmake ;;
+add_subdirectory) quietly by_sources "$prefix" && quietly run_by_cmake ;;
+FetchContent) quietly by_fetched_sources && quietly run_by_cmake ;;
 pkg-config) quietly by_pkg_config && run_by_pkg_config ;;
 *) echo "unknown road: $road" >&2; exit 2 ;;
 esac

@@ -17,7 +17,9 @@ rm -rf "$root"
 mkdir -p "$root"/var/lib/dpkg/{info,updates,triggers}
 cp /var/lib/dpkg/status "$root/var/lib/dpkg/status"
 
-# The packages have the loader's cache renewed; this machine's is none of their business here.
+# The packages trigger a renewal of the loader's cache, which libc-bin does. The cache of this machine stays as it is.
+cp /var/lib/dpkg/triggers/* "$root/var/lib/dpkg/triggers/"
+cp /var/lib/dpkg/info/libc-bin.{postinst,triggers} "$root/var/lib/dpkg/info/"
 mkdir -p "$packages/bin"
 printf '#!/bin/sh\necho called >>"%s"\n' "$packages/ldconfig.calls" >"$packages/bin/ldconfig"
 chmod +x "$packages/bin/ldconfig"
@@ -39,6 +41,7 @@ for binary in "$root/usr/bin/kxconfig" "$root/usr/$libdir"/lib*.so.1; do
         exit 1
     fi
 done
+MANPATH=$root/usr/share/man man --where kxconfig >/dev/null || { echo "man finds no page of kxconfig"; exit 1; }
 cmp "$source/CHANGELOG.md" "$root/usr/share/doc/KX_XMLConfigParser/CHANGELOG.md"
 for package in "$packages"/*.deb; do
     dpkg-deb --field "$package" Package Version Depends
