@@ -65,6 +65,15 @@ void AppendEntries(const xmlNodeSet* nodes, std::list<CXmlNode>& found)
     } while (index < nodes->nodeNr);
 }
 
+/** Frees @p result; without one the engine is not called. */
+void FreeResult(xmlXPathObject* result)
+{
+    if (result != 0)
+    {
+        xmlXPathFreeObject(result);
+    }
+}
+
 } // namespace
 
 // --- Queries
@@ -106,7 +115,7 @@ CXmlNode CXmlParser::FindNode(std::string expression, CXmlNode contextNode)
     {
         first.SetXmlNodePtr(EntryOf(nodes, 0));
     }
-    xmlXPathFreeObject(result);
+    FreeResult(result);
     KX_TRACE("-");
     return first;
 }
@@ -121,7 +130,7 @@ std::list<CXmlNode> CXmlParser::FindAllNodes(std::string expression, CXmlNode co
     {
         AppendEntries(nodes, found);
     }
-    xmlXPathFreeObject(result);
+    FreeResult(result);
     KX_TRACE("-");
     return found;
 }

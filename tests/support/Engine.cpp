@@ -1,12 +1,11 @@
 #include "support/Engine.h"
 
+#include "support/EngineTranscript.h"
 #include "support/Log.h"
 #include "support/Memory.h"
 
 #include <libxml/parser.h>
 #include <libxml/xmlerror.h>
-
-#include <dlfcn.h>
 
 #include <algorithm>
 #include <cstdarg>
@@ -36,12 +35,6 @@ xmlXPathObjectPtr g_lastXPath = nullptr;
 bool g_refuseContext = false;
 bool g_refuseSibling = false;
 
-template <class Function>
-Function* Next(Function*, const char* name)
-{
-    return reinterpret_cast<Function*>(dlsym(RTLD_NEXT, name));
-}
-
 void Show(const char* call)
 {
     if (g_showing)
@@ -66,20 +59,21 @@ void CollectError(void*, const char* format, ...)
 
 } // namespace
 
+using kxtest::Answer;
+using kxtest::Forward;
+
 extern "C" void xmlFreeDoc(xmlDocPtr document)
 {
-    static const auto engine = Next(&xmlFreeDoc, "xmlFreeDoc");
     if (g_noting)
     {
         g_freed.push_back(document);
         Show("xmlFreeDoc");
     }
-    engine(document);
+    Forward<&xmlFreeDoc>("xmlFreeDoc", document);
 }
 
 extern "C" xmlDocPtr xmlParseFile(const char* path)
 {
-    static const auto engine = Next(&xmlParseFile, "xmlParseFile");
     if (g_noting)
     {
         g_parsed.push_back(path);
@@ -89,32 +83,30 @@ extern "C" xmlDocPtr xmlParseFile(const char* path)
     {
         const xmlDocPtr answer = *g_parseAnswer;
         g_parseAnswer.reset();
-        return answer;
+        return Answer("xmlParseFile", answer, path);
     }
-    return engine(path);
+    return Forward<&xmlParseFile>("xmlParseFile", path);
 }
 
 extern "C" xmlChar* xmlGetProp(const xmlNode* node, const xmlChar* name)
 {
-    static const auto engine = Next(&xmlGetProp, "xmlGetProp");
     if (g_noting)
     {
         g_properties.push_back(reinterpret_cast<const char*>(name));
     }
-    return engine(node, name);
+    return Forward<&xmlGetProp>("xmlGetProp", node, name);
 }
 
 extern "C" int xmlSaveFileEnc(const char* path, xmlDocPtr document, const char* encoding)
 {
-    static const auto engine = Next(&xmlSaveFileEnc, "xmlSaveFileEnc");
     Show("xmlSaveFileEnc");
-    return g_answerSaves ? g_saveResult : engine(path, document, encoding);
+    return g_answerSaves ? Answer("xmlSaveFileEnc", g_saveResult, path, document, encoding)
+                         : Forward<&xmlSaveFileEnc>("xmlSaveFileEnc", path, document, encoding);
 }
 
 extern "C" int xmlSaveFormatFileEnc(const char* path, xmlDocPtr document, const char* encoding,
                                     int format)
 {
-    static const auto engine = Next(&xmlSaveFormatFileEnc, "xmlSaveFormatFileEnc");
     if (g_noting)
     {
         g_formatSaves.push_back(path + std::string(" ") + encoding + " " + std::to_string(format));
@@ -123,72 +115,64 @@ extern "C" int xmlSaveFormatFileEnc(const char* path, xmlDocPtr document, const 
     {
         const int answer = *g_formatSaveAnswer;
         g_formatSaveAnswer.reset();
-        return answer;
+        return Answer("xmlSaveFormatFileEnc", answer, path, document, encoding, format);
     }
-    return engine(path, document, encoding, format);
+    return Forward<&xmlSaveFormatFileEnc>("xmlSaveFormatFileEnc", path, document, encoding, format);
 }
 
 extern "C" int xmlKeepBlanksDefault(int value)
 {
-    static const auto engine = Next(&xmlKeepBlanksDefault, "xmlKeepBlanksDefault");
     if (g_noting)
     {
         g_blanksDefaults.push_back(value);
         Show("xmlKeepBlanksDefault");
     }
-    return engine(value);
+    return Forward<&xmlKeepBlanksDefault>("xmlKeepBlanksDefault", value);
 }
 
 extern "C" void xmlCleanupParser()
 {
-    static const auto engine = Next(&xmlCleanupParser, "xmlCleanupParser");
     g_cleanups += g_noting;
     Show("xmlCleanupParser");
-    engine();
+    Forward<&xmlCleanupParser>("xmlCleanupParser");
 }
 
 extern "C" xmlXPathContextPtr xmlXPathNewContext(xmlDocPtr document)
 {
-    static const auto engine = Next(&xmlXPathNewContext, "xmlXPathNewContext");
-    if (g_refuseContext)
-    {
-        g_refuseContext = false;
-        return nullptr;
-    }
-    const xmlXPathContextPtr context = engine(document);
+    const xmlXPathContextPtr context =
+        g_refuseContext ? Answer("xmlXPathNewContext", xmlXPathContextPtr(), document)
+                        : Forward<&xmlXPathNewContext>("xmlXPathNewContext", document);
+    g_refuseContext = false;
     g_contexts += context != nullptr;
     return context;
 }
 
 extern "C" void xmlXPathFreeContext(xmlXPathContextPtr context)
 {
-    static const auto engine = Next(&xmlXPathFreeContext, "xmlXPathFreeContext");
     g_contexts -= context != nullptr;
-    engine(context);
+    Forward<&xmlXPathFreeContext>("xmlXPathFreeContext", context);
 }
 
 extern "C" xmlXPathObjectPtr xmlXPathEvalExpression(const xmlChar* text, xmlXPathContextPtr context)
 {
-    static const auto engine = Next(&xmlXPathEvalExpression, "xmlXPathEvalExpression");
     if (g_xpathAnswer)
     {
         g_lastXPath = *g_xpathAnswer;
         g_xpathAnswer.reset();
-        return g_lastXPath;
+        return Answer("xmlXPathEvalExpression", g_lastXPath, text, context);
     }
-    g_lastXPath = engine(text, context);
+    g_lastXPath = Forward<&xmlXPathEvalExpression>("xmlXPathEvalExpression", text, context);
     return g_lastXPath;
 }
 
 extern "C" xmlNodePtr xmlAddSibling(xmlNodePtr node, xmlNodePtr sibling)
 {
-    static const auto engine = Next(&xmlAddSibling, "xmlAddSibling");
     if (g_refuseSibling)
     {
         g_refuseSibling = false;
-        return nullptr;
+        return Answer("xmlAddSibling", xmlNodePtr(), node, sibling);
     }
-    return engine(node, sibling);
+    return Forward<&xmlAddSibling>("xmlAddSibling", node, sibling);
 }
 
 namespace kxtest

@@ -18,7 +18,8 @@ unsigned long g_calls = 0;
 unsigned long g_throwAt = 0;
 int g_lastLine = 0;
 std::string g_lastFormat;
-std::function<void()> g_onNextCall;
+unsigned long g_callsUntilAct = 0;
+std::function<void()> g_act;
 
 } // namespace
 
@@ -50,9 +51,9 @@ extern "C" int KxLog(int line, int level, const char* tag, const char* format, .
         g_lastLine = line;
         g_lastFormat = format;
     }
-    if (g_onNextCall)
+    if (g_act && --g_callsUntilAct == 0)
     {
-        std::exchange(g_onNextCall, nullptr)();
+        std::exchange(g_act, nullptr)();
     }
     return -1; // whatever: callers ignore it
 }
@@ -106,7 +107,7 @@ LogRecorder::~LogRecorder()
     SetMask(kMaskNone);
     g_recording = false;
     g_throwAt = 0;
-    g_onNextCall = nullptr;
+    g_act = nullptr;
 }
 
 Records LogRecorder::Take()
@@ -141,7 +142,12 @@ unsigned long LogRecorder::Calls()
 }
 void LogRecorder::OnNextCall(std::function<void()> act)
 {
-    g_onNextCall = std::move(act);
+    OnCall(1, std::move(act));
+}
+void LogRecorder::OnCall(unsigned long n, std::function<void()> act)
+{
+    g_callsUntilAct = n;
+    g_act = std::move(act);
 }
 void LogRecorder::ThrowAt(unsigned long n)
 {

@@ -96,6 +96,9 @@ public:
     /** Makes the next KxLog call run @p act, once. */
     static void OnNextCall(std::function<void()> act);
 
+    /** Makes the n-th KxLog call from now on run @p act, once. */
+    static void OnCall(unsigned long n, std::function<void()> act);
+
     /** Makes the n-th KxLog call from now on throw @p n > 0, or none with 0. */
     static void ThrowAt(unsigned long n);
 };
