@@ -1,7 +1,7 @@
 #include "checks/CheckElements.h"
 
 #include "file/Nodes.h"
-#include "output/Output.h"
+#include "output/Quoting.h"
 
 #include <iterator>
 
@@ -46,7 +46,7 @@ void CheckName(const xmlNode* element, Warnings& warnings)
 
 void CheckText(const xmlNode* element, Warnings& warnings)
 {
-    const bool isValue = OnlyTextOf(element) != nullptr;
+    const bool isValue = kx::OnlyTextChild(element) != nullptr;
     const std::string text = isValue && !IsRoot(element) ? "" : OwnText(element);
     if (!text.empty())
     {
@@ -148,12 +148,10 @@ void CheckGroup(const Group& group, const Levels& levels, Warnings& warnings)
 std::map<std::string, Group> GroupsBelow(const xmlNode* parent)
 {
     std::map<std::string, Group> groups;
-    for (const xmlNode* child = parent->children; child != nullptr; child = child->next)
+    for (const xmlNode* child = kx::ElementFrom(parent->children); child != nullptr;
+         child = kx::ElementFrom(child->next))
     {
-        if (child->type == XML_ELEMENT_NODE)
-        {
-            groups[Text(child->name)].push_back(child);
-        }
+        groups[Text(child->name)].push_back(child);
     }
     return groups;
 }
@@ -168,11 +166,9 @@ void CheckElements(const xmlNode* element, const Levels& levels, Warnings& warni
     {
         CheckGroup(group, levels, warnings);
     }
-    for (const xmlNode* child = element->children; child != nullptr; child = child->next)
+    for (const xmlNode* child = kx::ElementFrom(element->children); child != nullptr;
+         child = kx::ElementFrom(child->next))
     {
-        if (child->type == XML_ELEMENT_NODE)
-        {
-            CheckElements(child, levels, warnings);
-        }
+        CheckElements(child, levels, warnings);
     }
 }

@@ -8,6 +8,14 @@
 #include <string>
 #include <tuple>
 
+/** A pitfall for lookups, and where it is. */
+struct Warning
+{
+    long line;
+    const char* kind;
+    std::string text;
+};
+
 /** What there is to warn of in a file, each once. */
 class Warnings
 {
@@ -28,16 +36,10 @@ public:
     /** @return the location and the line. */
     std::string Place(const xmlNode* node);
 
-    /** Prints them by line. @return whether there are any. */
-    bool PrintFor(const std::string& file) const;
+    /** @return them all, sorted by line. */
+    const std::multimap<long, Warning>& ByLine() const { return m_byLine; }
 
 private:
-    struct Warning
-    {
-        const char* kind;
-        std::string text;
-    };
-
     Locations m_locations;
     std::multimap<long, Warning> m_byLine;
     std::set<std::string> m_texts;

@@ -1,11 +1,17 @@
-#include "commands/Commands.h"
-#include "file/Document.h"
+#include "commands/Find.h"
+
+#include "file/Engine.h"
+#include "file/Load.h"
 #include "file/Locations.h"
 #include "file/Nodes.h"
-#include "output/Output.h"
+#include "output/Failure.h"
+#include "output/Quoting.h"
+#include "output/Report.h"
 
 #include <libxml/xmlerror.h>
 #include <libxml/xpath.h>
+
+#include <nlohmann/json.hpp>
 
 #include <memory>
 
@@ -53,12 +59,6 @@ std::string LocationOfNamespace(const xmlNs* space, Locations& locations)
     return locations.Of(element) + "/namespace::" + name;
 }
 
-std::string NameWithPrefix(const xmlAttr* attribute)
-{
-    const bool hasPrefix = attribute->ns != nullptr && attribute->ns->prefix != nullptr;
-    return (hasPrefix ? Text(attribute->ns->prefix) + ":" : "") + Text(attribute->name);
-}
-
 std::string Attributes(const xmlNode* element)
 {
     std::string attributes;
@@ -66,7 +66,7 @@ std::string Attributes(const xmlNode* element)
          attribute = attribute->next)
     {
         const auto node = reinterpret_cast<const xmlNode*>(attribute);
-        attributes += " " + NameWithPrefix(attribute) + "=" + Quoted(ContentOf(node));
+        attributes += " " + NameWithPrefix(node) + "=" + Quoted(ContentOf(node));
     }
     return attributes;
 }
@@ -75,7 +75,7 @@ std::string Attributes(const xmlNode* element)
 bool ShowsContent(const xmlNode* node)
 {
     return node->type != XML_DOCUMENT_NODE &&
-           (node->type != XML_ELEMENT_NODE || OnlyTextOf(node) != nullptr);
+           (node->type != XML_ELEMENT_NODE || kx::OnlyTextChild(node) != nullptr);
 }
 
 std::string Line(const xmlNode* node, Locations& locations)
@@ -103,8 +103,8 @@ Json AttributesInJson(const xmlNode* element)
     for (const xmlAttr* attribute = element->properties; attribute != nullptr;
          attribute = attribute->next)
     {
-        attributes[NameWithPrefix(attribute)] =
-            ContentOf(reinterpret_cast<const xmlNode*>(attribute));
+        const auto node = reinterpret_cast<const xmlNode*>(attribute);
+        attributes[NameWithPrefix(node)] = ContentOf(node);
     }
     return attributes;
 }
@@ -130,30 +130,35 @@ Json InJson(const xmlNode* node, Locations& locations)
     return result;
 }
 
-/** @return the number of nodes printed. */
-int PrintNodes(const xmlNodeSet* nodes)
+/** A node that the expression selects. */
+struct SelectedNode
+{
+    const xmlNode* node;
+    Locations& locations;
+
+    std::string Line() const { return ::Line(node, locations); }
+    Json InJson() const { return ::InJson(node, locations); }
+};
+
+/** What an expression evaluates to that selects no nodes. */
+struct Scalar
+{
+    std::string value;
+
+    std::string Line() const { return value; }
+    Json InJson() const { return {{"value", value}}; }
+};
+
+/** @return the number of nodes. */
+int AddNodes(const xmlNodeSet* nodes, Report& report)
 {
     const int count = nodes == nullptr ? 0 : nodes->nodeNr;
     Locations locations;
     for (int i = 0; i < count; ++i)
     {
-        const xmlNode* const node = nodes->nodeTab[i];
-        if (AnswersInJson())
-        {
-            PrintResult(InJson(node, locations));
-        }
-        else
-        {
-            PrintLine(Line(node, locations));
-        }
+        report.Add(SelectedNode{nodes->nodeTab[i], locations});
     }
     return count;
-}
-
-void PrintScalar(xmlXPathObject* result)
-{
-    const std::string value = Taken(xmlXPathCastToString(result));
-    Print(value, {{"value", value}});
 }
 
 /** The library evaluates without prefixes, though the locations that find prints have them. */
@@ -164,33 +169,36 @@ std::string AdviceOnPrefixes()
     return isPrefix ? "; find knows no prefixes: write *[name()='p:a'] for p:a" : "";
 }
 
-} // namespace
-
-ExitStatus Find(const std::string& file, const std::string& expression)
+Result Evaluate(CXmlParser& document, const std::string& expression)
 {
-    CXmlParser document;
-    if (!LoadDocument(file, document))
-    {
-        return ExitStatus::BadFile;
-    }
     const CXmlNode top = document.FindNode("/", CXmlNode());
+    const FirstEngineError error;
     // Not FindAllNodes(), which ends at 255 nodes.
-    const Result result(document.GetNodeSet(expression, top));
+    Result result(document.GetNodeSet(expression, top));
     if (result == nullptr)
     {
-        Complain("malformed expression " + Quoted(expression) + FirstComplaint(": ") +
-                 AdviceOnPrefixes());
-        return ExitStatus::BadUsage;
+        const std::string reason = error.IsNone() ? "" : ": " + error.Text();
+        throw Failure(ExitStatus::BadUsage,
+                      "malformed expression " + Quoted(expression) + reason + AdviceOnPrefixes());
     }
+    return result;
+}
+
+} // namespace
+
+ExitStatus Find(const FindArguments& arguments, Report& report)
+{
+    CXmlParser document;
+    LoadDocument(arguments.file, document);
+    const Result result = Evaluate(document, arguments.expression);
     if (result->type != XPATH_NODESET)
     {
-        PrintScalar(result.get());
-        return ExitStatus::Done;
+        report.Add(Scalar{Taken(xmlXPathCastToString(result.get()))});
     }
-    if (PrintNodes(result->nodesetval) == 0)
+    else if (AddNodes(result->nodesetval, report) == 0)
     {
-        Complain("nothing found: " + Quoted(expression) + " selects no node of " + file);
-        return ExitStatus::NothingFound;
+        throw Failure(ExitStatus::NothingFound, "nothing found: " + Quoted(arguments.expression) +
+                                                    " selects no node of " + arguments.file);
     }
     return ExitStatus::Done;
 }

@@ -1,46 +1,47 @@
-#include "commands/Commands.h"
-#include "file/Document.h"
+#include "commands/Get.h"
+
+#include "commands/KeyArgument.h"
+#include "file/Load.h"
 #include "file/Locations.h"
 #include "file/Nodes.h"
-#include "output/Output.h"
+#include "output/Failure.h"
+#include "output/Quoting.h"
+#include "output/Report.h"
 #include "walk/Trail.h"
+
+#include <nlohmann/json.hpp>
 
 namespace
 {
 
-/** The lookup runs all values together; a script wants them one by one, and from where. */
-void PrintEachResult(const Trail& trail)
+/** The lookup joins all values; a script wants them one by one, with their places. */
+void AddEachValue(const Trail& trail, Report& report)
 {
     Locations locations;
     for (const TrailStep* const step : trail.StepsWithText())
     {
-        PrintResult({{"location", locations.Of(step->element)},
-                     {"line", LineNumberOf(step->element)},
-                     {"value", *step->text}});
+        report.AddJson({{"location", locations.Of(step->element)},
+                        {"line", LineNumberOf(step->element)},
+                        {"value", *step->text}});
     }
 }
 
 } // namespace
 
-ExitStatus Get(const std::string& file, const std::string& key)
+ExitStatus Get(const GetArguments& arguments, Report& report)
 {
-    const std::unique_ptr<CXMLReader> reader = LoadFile(file);
-    if (reader == nullptr)
-    {
-        return ExitStatus::BadFile;
-    }
-    const ExitStatus keyStatus = CheckKey(file, key, *reader);
-    if (keyStatus != ExitStatus::Done)
-    {
-        return keyStatus;
-    }
+    const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file);
+    RequireKey(arguments.key, arguments.file, *reader);
     std::string values;
-    if (reader->GetValue(key, values) != 0)
+    if (reader->GetValue(arguments.key, values) != 0)
     {
-        Complain("nothing found: no element of " + file + " has a value under " + Quoted(key));
-        return ExitStatus::NothingFound;
+        throw Failure(ExitStatus::NothingFound, "nothing found: no element of " + arguments.file +
+                                                    " has a value under " + Quoted(arguments.key));
     }
-    PrintLine(values);
-    PrintEachResult(RecordLookup(static_cast<xmlDoc*>(reader->GetDataPtr()), key));
+    if (report.IsJson())
+    {
+        AddEachValue(RecordLookup(DocumentOf(*reader), arguments.key), report);
+    }
+    report.AddLine(values);
     return ExitStatus::Done;
 }

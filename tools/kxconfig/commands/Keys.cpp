@@ -1,37 +1,43 @@
-#include "commands/Commands.h"
-#include "file/Document.h"
-#include "output/Output.h"
+#include "commands/Keys.h"
+
+#include "file/Load.h"
+#include "output/Failure.h"
+#include "output/Quoting.h"
+#include "output/Report.h"
 #include "survey/KeyList.h"
 #include "survey/KeyValues.h"
 
-ExitStatus Keys(const std::string& file)
+#include <nlohmann/json.hpp>
+
+namespace
 {
-    const std::unique_ptr<CXMLReader> reader = LoadFile(file);
-    if (reader == nullptr)
-    {
-        return ExitStatus::BadFile;
-    }
+
+struct KeyAndValue
+{
+    const std::string& key;
+    std::string value; ///< of several elements where a key cannot tell them apart
+
+    std::string Line() const { return key + '\t' + Quoted(value); }
+    Json InJson() const { return {{"key", key}, {"value", value}}; }
+};
+
+} // namespace
+
+ExitStatus Keys(const KeysArguments& arguments, Report& report)
+{
+    const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file);
     const xmlNode* const root = RootOf(*reader);
     Levels levels(root->doc);
     KeyValues values(root, levels);
     const std::vector<std::string> keys = ListKeys(root, levels);
-    for (const std::string& key : keys)
-    {
-        // More than one element's where a key cannot tell.
-        const std::string value = values.Under(key);
-        if (AnswersInJson())
-        {
-            PrintResult({{"key", key}, {"value", value}});
-        }
-        else
-        {
-            PrintLine(key + '\t' + Quoted(value));
-        }
-    }
     if (keys.empty())
     {
-        Complain("nothing found: " + file + " holds no value that a key path can name");
-        return ExitStatus::NothingFound;
+        throw Failure(ExitStatus::NothingFound, "nothing found: " + arguments.file +
+                                                    " holds no value that a key path can name");
+    }
+    for (const std::string& key : keys)
+    {
+        report.Add(KeyAndValue{key, values.Under(key)});
     }
     return ExitStatus::Done;
 }

@@ -26,16 +26,6 @@ bool HasNoPath(const xmlNode* node)
     }
 }
 
-/** @return the name of @p node, an element or an attribute, with its prefix. */
-std::string NameWithPrefix(const xmlNode* node)
-{
-    // Elements and attributes have their namespace at different places of the record.
-    const xmlNs* const space =
-        node->type == XML_ATTRIBUTE_NODE ? reinterpret_cast<const xmlAttr*>(node)->ns : node->ns;
-    const bool hasPrefix = space != nullptr && space->prefix != nullptr;
-    return (hasPrefix ? Text(space->prefix) + ":" : "") + Text(node->name);
-}
-
 /** @return whether XPath has no name for the element: it is in a namespace without a prefix. */
 bool IsNameless(const xmlNode* node)
 {

@@ -3,11 +3,6 @@
 namespace
 {
 
-const xmlChar* ToEngine(const std::string& text)
-{
-    return reinterpret_cast<const xmlChar*>(text.c_str());
-}
-
 const long kLastCountedLine = 65535;
 
 /** More children than these are not listed one by one. */
@@ -36,11 +31,6 @@ std::string KindOf(const xmlNode* node)
 
 } // namespace
 
-std::string Text(const xmlChar* text)
-{
-    return text == nullptr ? "" : reinterpret_cast<const char*>(text);
-}
-
 std::string Taken(xmlChar* text)
 {
     const std::string copy = Text(text);
@@ -60,25 +50,18 @@ std::string LineOf(const xmlNode* node)
     return std::to_string(line) + (line < kLastCountedLine ? "" : " or later");
 }
 
-void CountLines()
-{
-#pragma GCC diagnostic push
-#pragma GCC diagnostic ignored "-Wdeprecated-declarations" // engines that always count say so
-    xmlLineNumbersDefault(1);
-#pragma GCC diagnostic pop
-}
-
 std::string ContentOf(const xmlNode* node)
 {
     return Taken(xmlNodeGetContent(const_cast<xmlNode*>(node)));
 }
 
-const xmlNode* OnlyTextOf(const xmlNode* element)
+std::string NameWithPrefix(const xmlNode* node)
 {
-    const xmlNode* const child = element->children;
-    const bool isOnlyText =
-        child != nullptr && child->type == XML_TEXT_NODE && child->next == nullptr;
-    return isOnlyText ? child : nullptr;
+    // Elements and attributes have their namespace at different places of the record.
+    const xmlNs* const space =
+        node->type == XML_ATTRIBUTE_NODE ? reinterpret_cast<const xmlAttr*>(node)->ns : node->ns;
+    const bool hasPrefix = space != nullptr && space->prefix != nullptr;
+    return (hasPrefix ? Text(space->prefix) + ":" : "") + Text(node->name);
 }
 
 std::string WhyNoValue(const xmlNode* element)
@@ -107,12 +90,12 @@ std::string WhyNoValue(const xmlNode* element)
 
 bool HasAttribute(const xmlNode* element, const std::string& name)
 {
-    xmlChar* const text = xmlGetProp(const_cast<xmlNode*>(element), ToEngine(name));
+    xmlChar* const text = xmlGetProp(const_cast<xmlNode*>(element), kx::ToEngine(name));
     xmlFree(text);
     return text != nullptr;
 }
 
 std::string AttributeOf(const xmlNode* element, const std::string& name)
 {
-    return Taken(xmlGetProp(const_cast<xmlNode*>(element), ToEngine(name)));
+    return Taken(xmlGetProp(const_cast<xmlNode*>(element), kx::ToEngine(name)));
 }

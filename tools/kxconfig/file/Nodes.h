@@ -1,7 +1,7 @@
 #ifndef KX_TOOLS_NODES_H
 #define KX_TOOLS_NODES_H
 
-#include <libxml/tree.h>
+#include "engine/Node.h"
 
 #include <string>
 #include <string_view>
@@ -9,11 +9,19 @@
 // What kxconfig shows of the engine's nodes.
 
 /** @return a copy of the engine's @p text; empty for null. */
-std::string Text(const xmlChar* text);
+inline std::string Text(const xmlChar* text)
+{
+    return kx::FromEngine(text);
+}
 
 inline std::string Text(std::string_view view)
 {
     return std::string(view);
+}
+
+inline std::string Text(const kx::TextView& view)
+{
+    return {view.data, view.size};
 }
 
 /** The same of a text that the caller owns, which is freed. */
@@ -25,17 +33,13 @@ long LineNumberOf(const xmlNode* node);
 /** The same as it is told: the engine counts up to 65535. */
 std::string LineOf(const xmlNode* node);
 
-/** Makes the engine count lines; before a file is loaded. */
-void CountLines();
-
 /** @return the text of @p node and of all below it. */
 std::string ContentOf(const xmlNode* node);
 
-/** @return the text node that is the only child of @p element, or null: only then it has a value.
- */
-const xmlNode* OnlyTextOf(const xmlNode* element);
+/** @return the name of @p node, an element or an attribute, with its prefix. */
+std::string NameWithPrefix(const xmlNode* node);
 
-/** @return why @p element, which OnlyTextOf() finds no text in, has no value. */
+/** @return why @p element, whose only child is not a text, has no value. */
 std::string WhyNoValue(const xmlNode* element);
 
 /** @return whether the library's conditions see the attribute, be it by a default of the DTD. */

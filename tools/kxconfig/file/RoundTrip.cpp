@@ -1,8 +1,11 @@
 #include "file/RoundTrip.h"
 
-#include "output/Output.h"
+#include "file/Engine.h"
+#include "file/Load.h"
+#include "output/Failure.h"
+#include "output/Quoting.h"
 
-#include <libxml/tree.h>
+#include <libxml/parser.h>
 
 #include <algorithm>
 #include <cstring>
@@ -145,16 +148,19 @@ Difference FirstDifference(const std::string& before, const std::string& after, 
                       " becomes " + Shown(after, position)};
 }
 
-/** @return what is said of a file that bytes cannot be compared of; empty if they can. */
-std::string WhyNotCompared(const std::string& bytes)
+/** @return what saving changes in a file whose bytes cannot be compared, if it is one. */
+std::optional<std::string> WholeChange(const std::string& bytes)
 {
     const std::string start = bytes.substr(0, 2);
     if (start == "\xFE\xFF" || start == "\xFF\xFE")
     {
         return "every character: UTF-16 becomes UTF-8";
     }
-    return start == "\x1F\x8B" ? "the whole file, which is compressed: it is saved as plain text"
-                               : "";
+    if (start == "\x1F\x8B")
+    {
+        return "the whole file, which is compressed: it is saved as plain text";
+    }
+    return std::nullopt;
 }
 
 std::vector<Difference> Compare(const Parts& before, const Parts& after)
@@ -188,10 +194,27 @@ std::vector<Difference> WhatSavingChanges(CXMLReader& reader, const std::string&
     {
         return {};
     }
-    const std::string reason = WhyNotCompared(*bytes);
-    if (!reason.empty())
+    const std::optional<std::string> change = WholeChange(*bytes);
+    if (change)
     {
-        return {{1, reason}};
+        return {{1, *change}};
     }
-    return Compare(Parts(*bytes), Parts(SavedBytes(static_cast<xmlDoc*>(reader.GetDataPtr()))));
+    return Compare(Parts(*bytes), Parts(SavedBytes(DocumentOf(reader))));
+}
+
+void RequireLoadsAgain(CXMLReader& reader, const std::string& target)
+{
+    xmlChar* text = nullptr;
+    int size = 0;
+    xmlDocDumpMemoryEnc(DocumentOf(reader), &text, &size, "UTF-8");
+    const FirstEngineError error;
+    xmlDoc* const again =
+        xmlReadMemory(reinterpret_cast<const char*>(text), size, nullptr, nullptr, 0);
+    xmlFree(text);
+    xmlFreeDoc(again);
+    if (again == nullptr)
+    {
+        throw Failure(ExitStatus::NotSaved,
+                      "not saved: " + target + " would not load any more, line " + error.Text());
+    }
 }

@@ -18,4 +18,12 @@ struct Difference
  * no regular file: its bytes were there to be read once, by the engine. */
 std::vector<Difference> WhatSavingChanges(CXMLReader& reader, const std::string& file);
 
+/**
+ * Requires that the document of @p reader loads again once it is saved.
+ *
+ * @param target  the file to save to, for the message.
+ * @throws Failure with the line and the engine's reason.
+ */
+void RequireLoadsAgain(CXMLReader& reader, const std::string& target);
+
 #endif

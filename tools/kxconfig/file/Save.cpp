@@ -1,5 +1,7 @@
 #include "file/Save.h"
 
+#include "output/Failure.h"
+
 #include <algorithm>
 #include <cerrno>
 #include <cstring>
@@ -15,17 +17,57 @@ namespace fs = std::filesystem;
 namespace
 {
 
+Failure CannotSave(const std::string& path, const std::string& reason)
+{
+    return {ExitStatus::NotSaved, "cannot save " + path + ": " + reason};
+}
+
 /** @return why the system refused the last call. */
 std::string SystemReason()
 {
     return std::strerror(errno);
 }
 
-std::string SaveDirectly(CXMLWriter& writer, const std::string& path)
+bool Write(CXMLWriter& writer, const std::string& path)
 {
     writer.SetPath(path);
-    return writer.SaveData() == 0 ? "" : "cannot save " + path;
+    return writer.SaveData() == 0;
 }
+
+/** Changes the current folder for the life of the object. */
+class InFolder
+{
+public:
+    explicit InFolder(const fs::path& folder) : m_former(open(".", O_PATH | O_CLOEXEC))
+    {
+        if (m_former < 0 || chdir(folder.c_str()) != 0)
+        {
+            const int error = errno;
+            close(m_former);
+            errno = error;
+            m_former = -1;
+        }
+    }
+
+    ~InFolder()
+    {
+        if (m_former >= 0)
+        {
+            // It fails only if the folder was closed to the user meanwhile.
+            [[maybe_unused]] const int result = fchdir(m_former);
+            close(m_former);
+        }
+    }
+
+    InFolder(const InFolder&) = delete;
+    InFolder& operator=(const InFolder&) = delete;
+
+    /** @return whether the folder could be entered; errno tells why not. */
+    explicit operator bool() const { return m_former >= 0; }
+
+private:
+    int m_former;
+};
 
 /**
  * A file beside the one that it is to replace.
@@ -36,37 +78,28 @@ std::string SaveDirectly(CXMLWriter& writer, const std::string& path)
 class Replacement
 {
 public:
-    explicit Replacement(const fs::path& target) : m_target(target)
+    /** @param path  the target as the user named it, for messages. */
+    Replacement(const std::string& path, const fs::path& target)
+        : m_target(target),
+          m_folder(target.has_parent_path() ? target.parent_path() : fs::path("."))
     {
-        const fs::path folder = target.parent_path();
-        if (chdir(folder.empty() ? "." : folder.c_str()) != 0)
+        if (!m_folder)
         {
-            m_failure = SystemReason();
-            return;
+            throw CannotSave(path, SystemReason());
         }
         const int file = mkstemp(m_name);
         if (file < 0)
         {
-            // Whoever may write the file looks for the reason in the file.
-            m_failure = "no new file can be made in its folder: " + SystemReason();
-            return;
+            // A user who may write the file would look for the reason there.
+            throw CannotSave(path, "no new file can be made in its folder: " + SystemReason());
         }
         close(file);
     }
 
-    ~Replacement()
-    {
-        if (m_failure.empty())
-        {
-            unlink(m_name);
-        }
-    }
+    ~Replacement() { unlink(m_name); }
 
     Replacement(const Replacement&) = delete;
     Replacement& operator=(const Replacement&) = delete;
-
-    /** @return why there is no such file; empty if there is. */
-    const std::string& Failure() const { return m_failure; }
 
     const char* Name() const { return m_name; }
 
@@ -107,27 +140,36 @@ private:
     }
 
     const fs::path m_target;
+    const InFolder m_folder;
     char m_name[32] = ".kxconfig-XXXXXX";
-    std::string m_failure;
 };
 
-std::string SaveBeside(CXMLWriter& writer, const std::string& path, const fs::path& target,
-                       const FileState* loaded)
+void SaveBeside(CXMLWriter& writer, const std::string& path, const fs::path& target,
+                const FileState* loaded)
 {
-    Replacement replacement(target);
-    if (!replacement.Failure().empty())
+    Replacement replacement(path, target);
+    if (!Write(writer, replacement.Name()))
     {
-        return "cannot save " + path + ": " + replacement.Failure();
-    }
-    if (!SaveDirectly(writer, replacement.Name()).empty())
-    {
-        return "cannot save " + path + ": the engine could not write it";
+        throw CannotSave(path, "the engine could not write it");
     }
     if (loaded != nullptr && loaded->HasChanged(target))
     {
-        return "not saved: " + path + " was changed by somebody else meanwhile";
+        throw Failure(ExitStatus::NotSaved,
+                      "not saved: " + path + " was changed by somebody else meanwhile");
     }
-    return replacement.TakePlace() ? "" : "cannot save " + path + ": " + SystemReason();
+    if (!replacement.TakePlace())
+    {
+        throw CannotSave(path, SystemReason());
+    }
+}
+
+/** Writes what is not a regular file, such as a device. */
+void SaveDirectly(CXMLWriter& writer, const std::string& path)
+{
+    if (!Write(writer, path))
+    {
+        throw Failure(ExitStatus::NotSaved, "cannot save " + path);
+    }
 }
 
 /** @return the file that @p path leads to by symbolic links; it need not exist. */
@@ -165,22 +207,23 @@ bool FileState::HasChanged(const std::string& path) const
     return now.m_exists != m_exists || !std::equal(m_numbers, m_numbers + 5, now.m_numbers);
 }
 
-std::string Save(CXMLWriter& writer, const std::string& path, const FileState* loaded)
+void Save(CXMLWriter& writer, const std::string& path, const FileState* loaded)
 {
     std::error_code error;
     const fs::path target = FollowLinks(path);
     const fs::file_status status = fs::status(target, error);
     if (fs::is_directory(status))
     {
-        return "cannot save " + path + ": " + std::strerror(EISDIR);
+        throw CannotSave(path, std::strerror(EISDIR));
     }
     if (fs::exists(status) && !fs::is_regular_file(status))
     {
-        return SaveDirectly(writer, path);
+        SaveDirectly(writer, path);
+        return;
     }
     if (fs::exists(status) && access(target.c_str(), W_OK) != 0)
     {
-        return "cannot save " + path + ": " + SystemReason();
+        throw CannotSave(path, SystemReason());
     }
-    return SaveBeside(writer, path, target, loaded);
+    SaveBeside(writer, path, target, loaded);
 }

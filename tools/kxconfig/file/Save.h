@@ -30,8 +30,8 @@ private:
  *
  * @param loaded  the state of the file at @p path when the document was loaded from it: a change
  *                by somebody else is not overwritten. Null if the document came from elsewhere.
- * @return an empty string, or one line that says why nothing was saved.
+ * @throws Failure if nothing was saved.
  */
-std::string Save(CXMLWriter& writer, const std::string& path, const FileState* loaded);
+void Save(CXMLWriter& writer, const std::string& path, const FileState* loaded);
 
 #endif

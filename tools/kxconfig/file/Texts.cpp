@@ -27,7 +27,7 @@ Texts::Texts(void* document)
     xmlNode* node = xmlDocGetRootElement(static_cast<xmlDoc*>(document));
     for (; node != nullptr; node = NextInDocument(node))
     {
-        if (node->type == XML_ELEMENT_NODE && OnlyTextOf(node) != nullptr)
+        if (node->type == XML_ELEMENT_NODE && kx::OnlyTextChild(node) != nullptr)
         {
             m_texts.push_back({node, ContentOf(node)});
         }

@@ -16,12 +16,13 @@ public:
     void ListBelow(const xmlNode* parent, const std::string& key)
     {
         const Level& level = m_levels.Below(parent);
-        for (const xmlNode* node = parent->children; node != nullptr; node = node->next)
+        for (const xmlNode* node = kx::ElementFrom(parent->children); node != nullptr;
+             node = kx::ElementFrom(node->next))
         {
-            if (node->type == XML_ELEMENT_NODE && IsFreeOf(".@", Text(node->name)))
+            if (IsFreeOf(".@", Text(node->name)))
             {
                 const std::string keyOfNode = key + "." + level.SegmentOf(node);
-                if (OnlyTextOf(node) != nullptr)
+                if (kx::OnlyTextChild(node) != nullptr)
                 {
                     List(keyOfNode);
                 }

@@ -2,6 +2,8 @@
 
 #include "file/Nodes.h"
 
+#include "config/KeyPath.h"
+
 #include <algorithm>
 #include <iterator>
 
@@ -11,11 +13,13 @@ namespace
 std::vector<std::string> Segments(const std::string& key)
 {
     std::vector<std::string> segments;
-    for (size_t begin = 0; begin <= key.size();)
+    kx::TextView rest(key);
+    for (bool hasRest = true; hasRest;)
     {
-        const size_t end = std::min(key.find('.', begin), key.size());
-        segments.push_back(key.substr(begin, end - begin));
-        begin = end + 1;
+        const kx::KeySplit split(rest);
+        segments.push_back(Text(split.first));
+        rest = split.rest;
+        hasRest = split.hasRest;
     }
     return segments;
 }
@@ -32,7 +36,7 @@ std::string KeyValues::Under(const std::string& key)
     std::string joined; // as the lookup joins them
     for (const xmlNode* const element : BearersUnder(key))
     {
-        joined += (joined.empty() ? "" : "\n") + Text(OnlyTextOf(element)->content);
+        joined += (joined.empty() ? "" : "\n") + Text(kx::OnlyTextChild(element)->content);
     }
     return joined;
 }
@@ -59,7 +63,7 @@ Elements KeyValues::BearersUnder(const std::string& key)
     Elements bearers;
     const Elements& reached = m_path.back().reached;
     std::copy_if(reached.begin(), reached.end(), std::back_inserter(bearers),
-                 [](const xmlNode* element) { return OnlyTextOf(element) != nullptr; });
+                 [](const xmlNode* element) { return kx::OnlyTextChild(element) != nullptr; });
     return bearers;
 }
 
@@ -71,7 +75,7 @@ void KeyValues::ReachFrom(const xmlNode* element, size_t depth)
         return;
     }
     // A lookup takes the text of every element on its way, and there is no way on below one.
-    if (OnlyTextOf(element) != nullptr)
+    if (kx::OnlyTextChild(element) != nullptr)
     {
         m_path[depth].reached.push_back(element);
         ReachFrom(element, depth + 1);

@@ -2,6 +2,8 @@
 
 #include "file/Nodes.h"
 
+#include "config/KeyPath.h"
+
 #include <algorithm>
 #include <iterator>
 
@@ -85,12 +87,9 @@ Level::Level(const xmlNode* parent, const std::map<std::string, Names>& defaulte
     : m_defaulted(defaulted)
 {
     const xmlNode* before = nullptr;
-    for (const xmlNode* node = parent->children; node != nullptr; node = node->next)
+    for (const xmlNode* node = kx::ElementFrom(parent->children); node != nullptr;
+         node = kx::ElementFrom(node->next))
     {
-        if (node->type != XML_ELEMENT_NODE)
-        {
-            continue;
-        }
         const Sibling sibling = {m_elements.size(), node};
         m_elements.push_back(node);
         const std::string name = Text(node->name);
@@ -129,13 +128,13 @@ std::string Level::SegmentOf(const xmlNode* element) const
 
 Siblings Level::SelectedBy(const std::string& segment) const
 {
-    const size_t at = segment.find('@');
-    const auto namesakes = m_byName.find(segment.substr(0, at));
+    const kx::Segment split((kx::TextView(segment)));
+    const auto namesakes = m_byName.find(Text(split.name));
     if (namesakes == m_byName.end())
     {
         return {};
     }
-    if (at == std::string::npos)
+    if (split.condition.IsEmpty())
     {
         return namesakes->second.all;
     }
@@ -156,7 +155,7 @@ const Siblings& Level::Fulfilling(const std::string& segment) const
 
 Order Level::OrderFor(const std::string& segment) const
 {
-    const std::string name = segment.substr(0, segment.find('@'));
+    const std::string name = Text(kx::Segment(kx::TextView(segment)).name);
     Order order;
     order.other = FirstNotNamed(name);
     const auto found = m_byName.find(name);

@@ -1,0 +1,53 @@
+#include "cli/Run.h"
+
+#include "cli/CommandLine.h"
+#include "cli/LogMaskChoice.h"
+#include "file/Engine.h"
+#include "output/Failure.h"
+#include "output/Report.h"
+
+#include <new>
+
+namespace
+{
+
+ExitStatus RunCommand(const std::vector<std::string>& arguments, Report& report)
+{
+    CommandLine commandLine;
+    if (!commandLine.Parse(arguments, report))
+    {
+        return ExitStatus::Done;
+    }
+    const LogMaskChoice logMask(commandLine.LogMask());
+    const EngineSettings engine;
+    return commandLine.RunCommand(report);
+}
+
+ExitStatus RunOrComplain(const std::vector<std::string>& arguments, Report& report)
+{
+    try
+    {
+        return RunCommand(arguments, report);
+    }
+    catch (const Failure& failure)
+    {
+        report.Complain(failure.Message());
+        return failure.Status();
+    }
+}
+
+} // namespace
+
+int Run(const std::vector<std::string>& arguments, std::istream& /*input*/, std::ostream& output,
+        std::ostream& errors)
+{
+    Report report(output, errors);
+    try
+    {
+        return static_cast<int>(report.Finish(RunOrComplain(arguments, report)));
+    }
+    catch (const std::bad_alloc&)
+    {
+        return static_cast<int>(report.FinishOutOfMemory());
+    }
+}

@@ -1,0 +1,19 @@
+#ifndef KX_TOOLS_FIND_H
+#define KX_TOOLS_FIND_H
+
+#include "output/ExitStatus.h"
+
+#include <string>
+
+class Report;
+
+struct FindArguments
+{
+    std::string file;
+    std::string expression; ///< XPath 1.0
+};
+
+/** kxconfig find: prints each node that an expression selects, or the value that it has. */
+ExitStatus Find(const FindArguments& arguments, Report& report);
+
+#endif

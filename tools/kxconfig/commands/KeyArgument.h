@@ -1,0 +1,19 @@
+#ifndef KX_TOOLS_KEYARGUMENT_H
+#define KX_TOOLS_KEYARGUMENT_H
+
+#include <string>
+
+class CXMLReader;
+
+/** Throws a Failure unless @p key names the root element and at least one more. */
+void RequireWellFormedKey(const std::string& key);
+
+/**
+ * The same, and requires that @p key starts with the name of the root of @p reader: to the library
+ * itself another name is success.
+ *
+ * @param file  the name of the document, for the message.
+ */
+void RequireKey(const std::string& key, const std::string& file, CXMLReader& reader);
+
+#endif

@@ -1,0 +1,152 @@
+#include "commands/TrailEvents.h"
+
+#include "commands/StepText.h"
+#include "file/Nodes.h"
+#include "output/Quoting.h"
+
+#include <nlohmann/json.hpp>
+
+namespace
+{
+
+std::string Indented(int depth, const std::string& line)
+{
+    return std::string(2 * static_cast<size_t>(depth), ' ') + line;
+}
+
+const char* VerdictInJson(const TrailStep& step)
+{
+    switch (step.verdict)
+    {
+    case Verdict::OtherName:
+        return "other name";
+    case Verdict::Rejected:
+        return "rejected";
+    default:
+        return step.suspended ? "accepted by name alone" : "accepted";
+    }
+}
+
+} // namespace
+
+std::string LevelEvent::Line() const
+{
+    std::string line = "below " + narration.locations.Of(level.parent) + ": ";
+    if (level.keyEnds)
+    {
+        line += "the key ends in \".\", so nothing is sought";
+    }
+    else if (level.steps.empty())
+    {
+        line += "there is no element";
+    }
+    else
+    {
+        line += narration.walk == Walk::Lookup ? "looking for " : "looking, to begin with, for ";
+        line += DescribeSegment(level.steps.front());
+    }
+    return Indented(depth, line);
+}
+
+Json LevelEvent::InJson() const
+{
+    return {{"event", "level"},
+            {"location", narration.locations.Of(level.parent)},
+            {"sought", level.steps.empty() ? Json() : SegmentInJson(level.steps.front())},
+            {"depth", depth}};
+}
+
+std::string StepEvent::Line() const
+{
+    return Indented(depth, "line " + LineOf(step.element) + ": " +
+                               narration.locations.Of(step.element) + ": " + DescribeVerdict());
+}
+
+Json StepEvent::InJson() const
+{
+    Json result = {{"event", "element"},
+                   {"line", LineNumberOf(step.element)},
+                   {"location", narration.locations.Of(step.element)},
+                   {"sought", SegmentInJson(step)},
+                   {"verdict", VerdictInJson(step)},
+                   {"terms", TermsInJson(step)},
+                   {"value", step.text ? Json(*step.text) : Json()}};
+    if (step.verdict == Verdict::Accepted && !step.text)
+    {
+        result["reason"] = WhyNoValue(step.element);
+    }
+    result["depth"] = depth;
+    return result;
+}
+
+std::string StepEvent::DescribeVerdict() const
+{
+    const Report& report = narration.report;
+    switch (step.verdict)
+    {
+    case Verdict::OtherName:
+        return report.Paint(Color::Faint, DescribeOtherName());
+    case Verdict::Rejected:
+        return report.Paint(Color::Bad, "rejected") + ": " + DescribeTerms(step) +
+               (narration.walk == Walk::Update ? "; left out with all that is below" : "");
+    default:
+        return report.Paint(Color::Good, "accepted") + DescribeAcceptance() + DescribeValue();
+    }
+}
+
+std::string StepEvent::DescribeOtherName() const
+{
+    if (narration.walk == Walk::Update)
+    {
+        return "not " + DescribeSegment(step);
+    }
+    const bool suspends = !step.condition.empty() && suspender == nullptr;
+    return "not named " + Quoted(Text(step.name)) +
+           (suspends ? "; suspends the condition for the next element that is" : "");
+}
+
+std::string StepEvent::DescribeAcceptance() const
+{
+    if (step.suspended)
+    {
+        return DescribeSuspension();
+    }
+    const std::string segment =
+        narration.walk == Walk::Update ? " as " + DescribeSegment(step) : "";
+    return segment + (step.terms.empty() ? "" : ": " + DescribeTerms(step));
+}
+
+std::string StepEvent::DescribeSuspension() const
+{
+    const std::string wouldHold =
+        Fulfils(step.element, step.condition) ? "fulfils anyway" : "does not fulfil";
+    return " by name alone: " + narration.locations.Of(suspender) + " (line " + LineOf(suspender) +
+           ") suspended the condition " + Quoted(Text(step.condition)) + ", which it " + wouldHold;
+}
+
+std::string StepEvent::DescribeValue() const
+{
+    const bool isUpdate = narration.walk == Walk::Update;
+    if (step.text)
+    {
+        const std::string text = narration.report.Paint(Color::Good, Quoted(*step.text));
+        return isUpdate ? "; its text " + text + " is replaced" : "; value " + text;
+    }
+    // In the middle of a path a value is not expected.
+    if (!isUpdate && (step.below != nullptr || step.keyEnds))
+    {
+        return "";
+    }
+    const std::string what = isUpdate ? "no text to replace: " : "no value: ";
+    return "; " + narration.report.Paint(Color::Bad, what + WhyNoValue(step.element));
+}
+
+std::string MoreEvent::Line() const
+{
+    return Indented(depth, "... " + std::to_string(count) + " more " + what);
+}
+
+Json MoreEvent::InJson() const
+{
+    return {{"event", "more"}, {"count", count}, {"what", what}, {"depth", depth}};
+}

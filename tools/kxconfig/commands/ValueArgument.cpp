@@ -1,0 +1,86 @@
+#include "commands/ValueArgument.h"
+
+#include "output/Failure.h"
+
+#include <libxml/chvalid.h>
+#include <libxml/xmlstring.h>
+
+#include <algorithm>
+#include <charconv>
+
+namespace
+{
+
+/** Requires that @p digits, a number of @p base, refer to a character. */
+void RequireCharacter(const std::string& digits, int base)
+{
+    unsigned int code = 0;
+    const char* const end = digits.data() + digits.size();
+    const auto [stop, error] = std::from_chars(digits.data(), end, code, base);
+    if (stop != end || error == std::errc::invalid_argument)
+    {
+        RefuseValue(g_bareAmpersand);
+    }
+    // The engine drops &#0; and stores less of the value than was given.
+    if (error != std::errc() || !xmlIsCharQ(code))
+    {
+        RefuseValue("it refers to a character that XML does not have");
+    }
+}
+
+/** Requires that @p text, found between "&" and ";", is a reference. */
+void RequireReference(const std::string& text)
+{
+    if (text.compare(0, 1, "#") == 0)
+    {
+        const bool isHexadecimal = text.compare(1, 1, "x") == 0;
+        RequireCharacter(text.substr(isHexadecimal ? 2 : 1), isHexadecimal ? 16 : 10);
+    }
+    else if (text.empty() || text.find_first_of("&< \t\r\n") != text.npos)
+    {
+        RefuseValue(g_bareAmpersand);
+    }
+}
+
+void RequireReferencesOnly(const std::string& value)
+{
+    for (size_t at = value.find('&'); at != value.npos;)
+    {
+        const size_t end = value.find(';', at);
+        if (end == value.npos)
+        {
+            RefuseValue(g_bareAmpersand);
+        }
+        RequireReference(value.substr(at + 1, end - at - 1));
+        at = value.find('&', end);
+    }
+}
+
+/** @return whether @p value is UTF-8 without the control characters that XML does not have. */
+bool HasOnlyXmlCharacters(const std::string& value)
+{
+    const auto isForbidden = [](unsigned char byte)
+    { return byte < ' ' && byte != '\t' && byte != '\n' && byte != '\r'; };
+    return xmlCheckUTF8(reinterpret_cast<const xmlChar*>(value.c_str())) != 0 &&
+           std::none_of(value.begin(), value.end(), isForbidden);
+}
+
+} // namespace
+
+const char* const g_bareAmpersand = "write & as &amp;";
+
+void RefuseValue(const std::string& why)
+{
+    throw Failure(ExitStatus::BadUsage, "VALUE is not XML text: " + why);
+}
+
+void RequireXmlText(const std::string& value)
+{
+    // Only older engines report a bare "&"; newer ones take the text around it, and replace
+    // characters that they cannot save.
+    if (!HasOnlyXmlCharacters(value))
+    {
+        RefuseValue("it has control characters, or bytes that are no UTF-8");
+    }
+    RequireReferencesOnly(value);
+}

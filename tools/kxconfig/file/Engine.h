@@ -1,0 +1,68 @@
+#ifndef KX_TOOLS_ENGINE_H
+#define KX_TOOLS_ENGINE_H
+
+#include <libxml/xmlerror.h>
+
+#include <string>
+
+// How kxconfig uses the engine, whose settings belong to the thread.
+
+#if LIBXML_VERSION >= 21200
+using EngineError = const xmlError*;
+#else
+using EngineError = xmlErrorPtr;
+#endif
+
+/** Receives the engine's errors from construction to destruction, then the former receiver does. */
+class EngineErrorReceiver
+{
+public:
+    EngineErrorReceiver(xmlStructuredErrorFunc receive, void* context);
+    ~EngineErrorReceiver();
+    EngineErrorReceiver(const EngineErrorReceiver&) = delete;
+    EngineErrorReceiver& operator=(const EngineErrorReceiver&) = delete;
+
+private:
+    const xmlStructuredErrorFunc m_formerReceive;
+    void* const m_formerContext;
+};
+
+/**
+ * The engine as a run of kxconfig needs it: it counts lines and prints nothing. At the end all
+ * settings that kxconfig or the library change are as they were.
+ */
+class EngineSettings
+{
+public:
+    EngineSettings();
+    ~EngineSettings();
+    EngineSettings(const EngineSettings&) = delete;
+    EngineSettings& operator=(const EngineSettings&) = delete;
+
+private:
+    const EngineErrorReceiver m_errors;
+    const xmlGenericErrorFunc m_formerPrint;
+    void* const m_formerContext;
+    const int m_formerLineNumbers;
+    const int m_formerKeepBlanks;
+};
+
+/** Keeps the first error that the engine reports during the object's life. */
+class FirstEngineError
+{
+public:
+    FirstEngineError();
+
+    bool IsNone() const { return m_text.empty(); }
+
+    /** @return "LINE: reason", or the reason alone if it is on no line; empty if there is none. */
+    const std::string& Text() const { return m_text; }
+
+private:
+    static void Keep(void* self, EngineError error);
+
+    std::string m_text;
+    const EngineErrorReceiver m_receiver;
+};
+
+#endif

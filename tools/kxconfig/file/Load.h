@@ -1,0 +1,45 @@
+#ifndef KX_TOOLS_LOAD_H
+#define KX_TOOLS_LOAD_H
+
+#include "CXMLReader.h"
+#include "CXMLWriter.h"
+#include "CXmlParser.h"
+
+#include <memory>
+#include <string>
+
+struct _xmlDoc;
+
+/**
+ * Loads a file of this machine; URLs and other names that the engine would fetch are not files.
+ *
+ * @return a reader that holds a document.
+ * @throws Failure with the line number if the file is not well-formed.
+ */
+std::unique_ptr<CXMLReader> LoadFile(const std::string& path);
+
+/** Loads a file in the same way into a document of the toolkit. */
+void LoadDocument(const std::string& path, CXmlParser& document);
+
+/** @return the document that @p reader holds. */
+_xmlDoc* DocumentOf(CXMLReader& reader);
+
+/** @return the root element of the document that @p reader holds. */
+const _xmlNode* RootOf(CXMLReader& reader);
+
+/** A writer on the document of a reader, which keeps owning it. */
+class GuestWriter
+{
+public:
+    explicit GuestWriter(CXMLReader& reader) { m_writer.SetDataPtr(reader.GetDataPtr()); }
+    ~GuestWriter() { m_writer.SetDataPtr(nullptr); }
+    GuestWriter(const GuestWriter&) = delete;
+    GuestWriter& operator=(const GuestWriter&) = delete;
+
+    CXMLWriter& Get() { return m_writer; }
+
+private:
+    CXMLWriter m_writer;
+};
+
+#endif

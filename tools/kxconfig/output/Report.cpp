@@ -1,0 +1,140 @@
+#include "output/Report.h"
+
+#include "output/Quoting.h"
+
+#include <nlohmann/json.hpp>
+
+#include <cstdlib>
+#include <cstring>
+#include <iostream>
+#include <utility>
+
+#include <unistd.h>
+
+namespace
+{
+
+bool IsSet(const char* variable)
+{
+    const char* const value = std::getenv(variable);
+    return value != nullptr && *value != 0;
+}
+
+/** @return whether @p stream is one of the process's own, and that is a terminal. */
+bool IsTerminal(const std::ostream& stream)
+{
+    return (stream.rdbuf() == std::cout.rdbuf() && isatty(STDOUT_FILENO) == 1) ||
+           (stream.rdbuf() == std::cerr.rdbuf() && isatty(STDERR_FILENO) == 1);
+}
+
+bool ShowsColors(const std::ostream& stream)
+{
+    const char* const terminal = std::getenv("TERM");
+    const bool isDumb = terminal == nullptr || std::strcmp(terminal, "dumb") == 0;
+    return IsTerminal(stream) && !isDumb && !IsSet("NO_COLOR");
+}
+
+const char* StartOf(Color color)
+{
+    switch (color)
+    {
+    case Color::Good:
+        return "\x1B[32m";
+    case Color::Bad:
+        return "\x1B[31m";
+    default:
+        return "\x1B[2m";
+    }
+}
+
+std::string Colored(Color color, const std::string& text)
+{
+    return StartOf(color) + text + "\x1B[0m";
+}
+
+/** @return the text as JSON, or null if there is none. */
+Json OrNull(const std::optional<std::string>& text)
+{
+    return text ? Json(*text) : Json();
+}
+
+} // namespace
+
+Report::Report(std::ostream& output, std::ostream& errors) : m_output(output), m_errors(errors)
+{
+}
+
+Report::~Report() = default;
+
+void Report::SetSubject(const std::string& verb, const std::string& file)
+{
+    m_verb = verb;
+    m_file = file;
+}
+
+void Report::AddLine(const std::string& line)
+{
+    if (!m_isJson)
+    {
+        m_output << line << '\n';
+    }
+}
+
+void Report::AddJson(Json result)
+{
+    if (m_isJson)
+    {
+        m_results.push_back(std::move(result));
+    }
+}
+
+void Report::Complain(const std::string& message)
+{
+    if (m_isJson)
+    {
+        m_messages.push_back(message);
+        return;
+    }
+    const std::string name = "kxconfig:";
+    m_errors << (ShowsColors(m_errors) ? Colored(Color::Bad, name) : name) + " " +
+                    OnOneLine(message) + "\n";
+}
+
+std::string Report::Paint(Color color, const std::string& text) const
+{
+    return !m_isJson && ShowsColors(m_output) ? Colored(color, text) : text;
+}
+
+ExitStatus Report::Finish(ExitStatus status)
+{
+    if (m_isJson)
+    {
+        WriteAnswer(status);
+    }
+    if (m_output.flush())
+    {
+        return status;
+    }
+    m_isJson = false; // no one could read it
+    Complain("cannot write to standard output");
+    return ExitStatus::NotSaved;
+}
+
+ExitStatus Report::FinishOutOfMemory()
+{
+    std::vector<Json>().swap(m_results); // there may be no memory to write them
+    Complain("out of memory");
+    return Finish(ExitStatus::NotSaved);
+}
+
+void Report::WriteAnswer(ExitStatus status)
+{
+    Json answer = {{"file", OrNull(m_file)},
+                   {"verb", OrNull(m_verb)},
+                   {"status", static_cast<int>(status)},
+                   {"results", Json::array()},
+                   {"messages", m_messages}};
+    answer["results"].get_ref<Json::array_t&>().swap(m_results);
+    // Bytes that are not UTF-8 become U+FFFD, so that any parser accepts the object.
+    m_output << answer.dump(2, ' ', false, Json::error_handler_t::replace) << '\n';
+}

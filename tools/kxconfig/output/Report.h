@@ -1,0 +1,85 @@
+#ifndef KX_TOOLS_REPORT_H
+#define KX_TOOLS_REPORT_H
+
+#include "output/ExitStatus.h"
+
+#include <nlohmann/json_fwd.hpp>
+
+#include <iosfwd>
+#include <optional>
+#include <string>
+#include <vector>
+
+using Json = nlohmann::ordered_json;
+
+enum class Color
+{
+    Good,
+    Bad,
+    Faint
+};
+
+/** What one run of kxconfig prints: lines for people, or one JSON object at the end. */
+class Report
+{
+public:
+    /** Neither stream is written to before the first line, message or Finish(). */
+    Report(std::ostream& output, std::ostream& errors);
+    ~Report();
+    Report(const Report&) = delete;
+    Report& operator=(const Report&) = delete;
+
+    /** From now on results and messages are kept for the JSON object. */
+    void AnswerInJson() { m_isJson = true; }
+    bool IsJson() const { return m_isJson; }
+
+    /** Names the command and the file in the JSON object. */
+    void SetSubject(const std::string& verb, const std::string& file);
+
+    /**
+     * Adds one result, rendered in the form that was asked for and only in that.
+     *
+     * @param result  a value with the members `std::string Line() const` and `Json InJson() const`.
+     */
+    template <class Result>
+    void Add(const Result& result)
+    {
+        if (m_isJson)
+        {
+            AddJson(result.InJson());
+        }
+        else
+        {
+            AddLine(result.Line());
+        }
+    }
+
+    /** For what exists in one form only: nothing happens if the other one was asked for. */
+    void AddLine(const std::string& line);
+    void AddJson(Json result);
+
+    /** Prints "kxconfig: " and @p message to the errors, on one line regardless of its content. */
+    void Complain(const std::string& message);
+
+    /** @return @p text in color if the output is a terminal that shows colors. */
+    std::string Paint(Color color, const std::string& text) const;
+
+    /** Ends the output. @return @p status, or NotSaved if the output could not be written. */
+    ExitStatus Finish(ExitStatus status);
+
+    /** The same after memory ran out: without the results that JSON would show. */
+    ExitStatus FinishOutOfMemory();
+
+private:
+    void WriteAnswer(ExitStatus status);
+
+    std::ostream& m_output;
+    std::ostream& m_errors;
+    bool m_isJson = false;
+    std::optional<std::string> m_verb;
+    std::optional<std::string> m_file;
+    std::vector<Json> m_results;
+    std::vector<std::string> m_messages;
+};
+
+#endif
