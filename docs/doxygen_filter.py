@@ -1,5 +1,7 @@
 #!/usr/bin/env python3
-"""Prints a page as Doxygen wants it; used by docs/Doxyfile.in.
+"""Prints a page or a header as Doxygen wants it; used by docs/Doxyfile.in.
+
+In a header, the path of a page of the handbook becomes a link to it. In a page:
 
 Headings get the names that links call them by. What is quoted as `CXMLReader::GetValue()` or `CXmlNode` becomes plain,
 so that it is linked to the reference. Other quotations are written so that Doxygen reads nothing into them.
@@ -44,4 +46,9 @@ def filtered(page):
         yield line
 
 
-print("\n".join(filtered(sys.argv[1])))
+def linked(header):
+    return re.sub(r"docs/handbook/([\w-]+)\.md", lambda page: f"[{page[0]}](@ref md_docs_handbook_{page[1].replace('-', '_')})",
+                  pathlib.Path(header).read_text())
+
+
+print(linked(sys.argv[1]) if sys.argv[1].endswith(".h") else "\n".join(filtered(sys.argv[1])))

@@ -1,44 +1,24 @@
 #ifndef KX_CXMLATTR_H
 #define KX_CXMLATTR_H
 
-/**
- * @file CXmlAttr.h
- * An attribute's name and value, as CXmlNode::GetAttributeItems() lists them.
- */
+/// @file CXmlAttr.h
+/// The name and value of an attribute, as CXmlNode::GetAttributeItems() lists them.
 
 #include <string>
 
 #pragma GCC visibility push(default)
 
-/**
- * A plain pair of strings, read and written directly.
- *
- * It is a copy of what the document held when it was made: changing it changes no document. Copying
- * and assignment work member by member and log nothing.
- *
- * @code
- * std::list<CXmlAttr> items = node.GetAttributeItems();
- * for (std::list<CXmlAttr>::iterator item = items.begin(); item != items.end(); ++item)
- * {
- *     std::cout << item->m_strName << "=" << item->m_strValue << "\n";
- * }
- * @endcode
- */
+/// A pair of strings, copied from the document: changing it does not change the document.
 class CXmlAttr
 {
 public:
-    /** Makes a pair of empty strings. Logs "+" and "-" (level 11, tag "CXmlAttr"). */
+    /// Creates a pair of empty strings.
     CXmlAttr();
 
-    /**
-     * Makes a pair. Logs "+" and "-" (level 11, tag "CXmlAttr").
-     *
-     * @param name   the attribute's name.
-     * @param value  the attribute's value.
-     */
+    /// Creates a pair of name and value.
     CXmlAttr(std::string name, std::string value);
 
-    /** Logs "+" and "-" (level 11, tag "~CXmlAttr"), then releases both strings. */
+    /// Releases the strings.
     ~CXmlAttr();
 
     std::string m_strName;  ///< the attribute's name, without a namespace prefix

@@ -1,32 +1,147 @@
 #!/usr/bin/env python3
-"""Checks that a page tells every message of the library's sources, with its level, and no other.
+"""Compares the records that the library's sources log with those that a page lists.
 
-usage: check_messages.py SOURCE_FOLDER PAGE
+usage: check_messages.py SOURCE_FOLDER HEADER_FOLDER PAGE
 
-The page's tables tell a message as | "text" | level | ... in their rows.
+A row of the page lists a record as | `"text"` | level | `Class::Operation`, ... | meaning |. It must be in the sources
+with this text, at this level and from exactly these operations, and every record of the sources must have its row.
+Only of "+" and "-", which nearly every operation logs, the operations are not compared.
 """
 
+import collections
 import pathlib
 import re
 import sys
 
-LEVELS = {"WARNING": 8, "ERROR": 9, "TRACE": 11, "VALUE": 29, "XPATH": 31}
-GATE = re.compile(r'KX_(WARNING|ERROR|TRACE|VALUE|XPATH)(?:_AS|_OF)?\(\s*(?:"?\w+"?,\s*)?((?:"(?:[^"\\]|\\.)*"\s*)+)')
+Macro = collections.namedtuple("Macro", "level tag text")  # the level; the positions of the parameters, or None
+
 STRING = re.compile(r'"((?:[^"\\]|\\.)*)"')
-ROW = re.compile(r'^\| `"(.*)"` \| (\d+) \|', re.M)
+DEFINITION = re.compile(r"^#define (KX_\w+)\(([^)]*)\)((?:.*\\\n)*.*)", re.M)
+LEVEL = re.compile(r"\b(LogLevel\w+) = (\d+)")
+FUNCTION = re.compile(r"^(?!using|namespace|class|struct|enum|extern \"C\"\s*\{)[A-Za-z][^;{}(]*?([\w:]*~?\w+)\((?:[^;{}]*)\n\{", re.M)
+ROW = re.compile(r'^\| `"(.*)"` \| (\d+) \| (.*?) \|', re.M)
+TRACE = {"+", "-"}  # logged by nearly every operation
 
 
-def messages_of(sources):
-    for source in sorted(sources.rglob("*.cpp")) + sorted(sources.rglob("*.h")):
-        for kind, strings in GATE.findall(source.read_text()):
-            yield "".join(STRING.findall(strings)), LEVELS[kind]
+class Unclear(Exception):
+    """A record of which text, tag or operation cannot be seen in the source."""
 
 
-logged = set(messages_of(pathlib.Path(sys.argv[1])))
-told = {(text, int(level)) for text, level in ROW.findall(pathlib.Path(sys.argv[2]).read_text())}
-for text, level in sorted(logged - told):
-    print(f'not told: "{text}" at level {level}')
-for text, level in sorted(told - logged):
-    print(f'never logged: "{text}" at level {level}')
-print(f"{len(logged)} messages")
-sys.exit(0 if logged == told else 1)
+def macros_of(log_header):
+    """The log macros, whatever they are called: those that name a level, given away by their parameters."""
+    levels = {name: int(number) for name, number in LEVEL.findall(log_header)}
+    for name, parameters, body in DEFINITION.findall(log_header):
+        named = [number for level, number in levels.items() if re.search(rf"\b{level}\b", body)]
+        parameters = [parameter.strip() for parameter in parameters.split(",")]
+        text = next((parameters.index(word) for word in ("text", "format") if word in parameters), None)
+        if len(named) == 1 and text is not None and "level" not in parameters:
+            yield name, Macro(named[0], parameters.index("tag") if "tag" in parameters else None, text)
+
+
+def without_comments(text):
+    return re.sub(r"//[^\n]*|/\*.*?\*/", lambda comment: re.sub(r"[^\n]", " ", comment[0]), text, flags=re.S)
+
+
+def arguments_at(text, start):
+    """The arguments of the call whose parenthesis opens before start."""
+    found, depth, at = [""], 0, start
+    while depth >= 0:
+        string = STRING.match(text, at)
+        piece = string[0] if string else text[at]
+        depth += (piece == "(") - (piece == ")")
+        if piece == "," and depth == 0:
+            found.append("")
+        elif depth >= 0:
+            found[-1] += piece
+        at += len(piece)
+    return [argument.strip() for argument in found]
+
+
+def calls_of(name, text):
+    """Where a function or macro is called, and with which arguments."""
+    for call in re.finditer(rf"(?<![\w:~]){name}\(", text):
+        yield call.start(), arguments_at(text, call.end())
+
+
+class Sources:
+    def __init__(self, folder, headers):
+        self.texts = {path: without_comments(path.read_text()) for path in sorted(folder.rglob("*.*"))
+                      if path.suffix in (".h", ".cpp") and path.name != "Log.h"}
+        self.macros = dict(macros_of((folder / "diag/Log.h").read_text()))
+        self.classes = {path.stem: without_comments(path.read_text()) for path in headers.glob("C*.h")}
+
+    def function_around(self, text, at):
+        """The definition that a place lies in, or None for one inside a class."""
+        found = [function for function in FUNCTION.finditer(text, 0, at) if text.find("\n}", function.end()) > at]
+        return found[-1] if found else None
+
+    def tags_of(self, argument, path, at):
+        """The tags that an argument can be: a literal, the function's name, or what callers pass for a parameter."""
+        if STRING.fullmatch(argument):
+            return [argument[1:-1]]
+        text = self.texts[path]
+        function = self.function_around(text, at)
+        if function is None:
+            raise Unclear(f"the tag {argument} is used inside a class")
+        if argument == "__FUNCTION__":
+            return [function[1].split("::")[-1]]
+        constant = re.search(rf'\b{argument} = "(\w+)"', text[function.end():at])
+        return [constant[1]] if constant else self.tags_passed(argument, path, function)
+
+    def tags_passed(self, parameter, path, function):
+        _, parameters = next(calls_of(function[1], function[0]))
+        position = next(i for i, declared in enumerate(parameters) if declared.endswith(parameter))
+        for caller, text in self.texts.items():
+            for at, arguments in calls_of(function[1], text):
+                if caller != path or not function.start() <= at < function.end():
+                    yield from self.tags_of(arguments[position], caller, at)
+
+    def operation(self, tag, path, at):
+        """The operation of a public class that a tag names, by its class."""
+        function = self.function_around(self.texts[path], at)
+        name = function[1].split("::")[0] if function else ""
+        owners = [name] if name in self.classes else [
+            owner for owner, text in self.classes.items() if re.search(rf"(?<![\w~:>]){tag}\(", text)]
+        if len(owners) != 1:
+            raise Unclear(f"{tag} is an operation of {owners or 'no public class'}")
+        return owners[0] + "::" + tag
+
+    def records(self):
+        for path, text in self.texts.items():
+            for name, macro in self.macros.items():
+                for at, arguments in calls_of(name, text):
+                    try:
+                        yield from self.records_at(path, at, macro, arguments)
+                    except Unclear as reason:
+                        raise SystemExit(f"{path}:{text.count(chr(10), 0, at) + 1}: {reason}") from None
+
+    def records_at(self, path, at, macro, arguments):
+        record = "".join(STRING.findall(arguments[macro.text]))
+        if not record:
+            raise Unclear("the text is not a literal")
+        if record in TRACE:
+            yield record, macro.level, None
+            return
+        for tag in self.tags_of("__FUNCTION__" if macro.tag is None else arguments[macro.tag], path, at):
+            yield record, macro.level, self.operation(tag, path, at)
+
+
+def listed(page):
+    for text, level, operations in ROW.findall(page.read_text()):
+        for operation in [None] if text in TRACE else re.findall(r"`([\w:~]+)`", operations):
+            yield text, int(level), operation
+
+
+def main():
+    source, headers, page = map(pathlib.Path, sys.argv[1:])
+    logged, told = set(Sources(source, headers).records()), set(listed(page))
+    logged |= {(text, 11, None) for text in TRACE}
+    for text, level, operation in sorted(logged - told, key=str):
+        print(f'{page}: missing: "{text}" at level {level} from {operation}')
+    for text, level, operation in sorted(told - logged, key=str):
+        print(f'{page}: not in the sources: "{text}" at level {level} from {operation}')
+    print(f"{len(logged)} records, by text, level and operation")
+    return 0 if logged == told else 1
+
+
+sys.exit(main())
