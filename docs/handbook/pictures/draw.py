@@ -50,7 +50,7 @@ def update(parent, key):
     sought = first
     for box in parent.below:
         name, _, condition = sought.partition("@")
-        box.note = f"compared with {sought}" if sought else "compared with nothing"
+        box.note = f"compared with {sought}" if sought else "compared with an empty name"
         if name == box.tag and condition and not holds(condition, box):
             box.note, box.state = f"not {sought}: left out", "out"
             for inner in box.all():
