@@ -409,8 +409,7 @@ TEST_F(KxconfigCheck, TellsThatSavingChangesAFileIfTheLibraryDoesChangeIt)
 TEST_F(KxconfigCheck, NeedsNoPlaceForTemporaryFiles)
 {
     Write("<cfg><a>1</a></cfg>");
-    const Outcome outcome =
-        Tool({"check", m_file}, {"TMPDIR=" + m_folder.Path("missing"), "KX_LOG_MASK="});
+    const Outcome outcome = Tool({"check", m_file}, {"TMPDIR=" + m_folder.Path("missing")});
     EXPECT_EQ(0, outcome.status) << outcome.err;
     EXPECT_EQ("", outcome.out + outcome.err);
 }

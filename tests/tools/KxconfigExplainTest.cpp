@@ -321,7 +321,7 @@ TEST_F(KxconfigExplain, SaysWhyAFileCannotBeRead)
 
 TEST_F(KxconfigExplain, ShowsTheRecordsOfTheLibrarysOwnRunOnly)
 {
-    const Outcome outcome = Tool({"explain", "--log-mask", "value", m_file, "cfg.name"});
+    const Outcome outcome = ToolProcess({"explain", "--log-mask", "value", m_file, "cfg.name"});
     EXPECT_EQ(4, std::count(outcome.err.begin(), outcome.err.end(), '\n')) << outcome.err;
     EXPECT_THAT(outcome.out, Not(HasSubstr("Key is")));
 }

@@ -150,7 +150,7 @@ TEST_F(KxconfigGet, SaysThatAFileMustNotBeRead)
 TEST_F(KxconfigGet, BadMaskOfTheEnvironmentAsksForNothing)
 {
     const std::string bad = m_folder.Write("bad.xml", "<cfg>");
-    const Outcome outcome = Tool({"get", bad, "a.b"}, {"KX_LOG_MASK=loud"});
+    const Outcome outcome = ToolProcess({"get", bad, "a.b"}, {"KX_LOG_MASK=loud"});
     EXPECT_EQ(2, std::count(outcome.err.begin(), outcome.err.end(), '\n')) << outcome.err;
 }
 
@@ -159,16 +159,16 @@ TEST_F(KxconfigGet, AsksForNoRecordsUnlessTheUserDoes)
     const std::string bad = m_folder.Write("bad.xml", "<cfg>");
     const auto lines = [](const Outcome& outcome)
     { return std::count(outcome.err.begin(), outcome.err.end(), '\n'); };
-    EXPECT_EQ(1, lines(Tool({"get", bad, "a.b"})));
-    EXPECT_EQ(2, lines(Tool({"get", bad, "a.b", "--log-mask", "error"})));
-    EXPECT_EQ(2, lines(Tool({"--log-mask=0x200", "get", bad, "a.b"})));
-    EXPECT_EQ(2, lines(Tool({"get", bad, "a.b"}, {"KX_LOG_MASK=512"})));
-    EXPECT_EQ(1, lines(Tool({"get", bad, "a.b", "--log-mask", "0"}, {"KX_LOG_MASK=512"})));
+    EXPECT_EQ(1, lines(ToolProcess({"get", bad, "a.b"})));
+    EXPECT_EQ(2, lines(ToolProcess({"get", bad, "a.b", "--log-mask", "error"})));
+    EXPECT_EQ(2, lines(ToolProcess({"--log-mask=0x200", "get", bad, "a.b"})));
+    EXPECT_EQ(2, lines(ToolProcess({"get", bad, "a.b"}, {"KX_LOG_MASK=512"})));
+    EXPECT_EQ(1, lines(ToolProcess({"get", bad, "a.b", "--log-mask", "0"}, {"KX_LOG_MASK=512"})));
 }
 
 TEST_F(KxconfigGet, ShowsTheLibrarysRecords)
 {
-    const Outcome outcome = Tool({"--log-mask", "value", "get", kGateway, "gateway.name"});
+    const Outcome outcome = ToolProcess({"--log-mask", "value", "get", kGateway, "gateway.name"});
     EXPECT_EQ("line-3-gateway\n", outcome.out);
     EXPECT_THAT(outcome.err,
                 AllOf(HasSubstr(" value GetValue:"), HasSubstr(" Key is gateway.name\n"),

@@ -78,13 +78,13 @@ TEST_F(KxconfigUsage, ColoursAreForTerminals)
     EXPECT_THAT(OnTerminal(arguments, {"TERM=xterm", "NO_COLOR=1"}), Not(HasSubstr("\x1B")));
     EXPECT_THAT(OnTerminal(arguments, {"TERM=dumb"}), Not(HasSubstr("\x1B")));
     EXPECT_THAT(OnTerminal("--json " + arguments, {"TERM=xterm"}), Not(HasSubstr("\x1B")));
-    EXPECT_THAT(Tool({"explain", m_plain, "cfg.net.ip"}, {"TERM=xterm"}).out,
+    EXPECT_THAT(ToolProcess({"explain", m_plain, "cfg.net.ip"}, {"TERM=xterm"}).out,
                 Not(HasSubstr("\x1B")));
 }
 
 TEST_F(KxconfigUsage, TraceShowsTheLibrarysRecordsBesideTheResult)
 {
-    const Outcome outcome = Tool({"--trace", "get", kGateway, "gateway.name"});
+    const Outcome outcome = ToolProcess({"--trace", "get", kGateway, "gateway.name"});
     EXPECT_EQ("line-3-gateway\n", outcome.out);
     EXPECT_THAT(outcome.err, HasSubstr(" trace GetValue:"));
     EXPECT_THAT(outcome.err, HasSubstr(" Key is gateway.name\n"));

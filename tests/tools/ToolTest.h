@@ -1,6 +1,9 @@
 #ifndef KX_TESTS_TOOLS_TOOLTEST_H
 #define KX_TESTS_TOOLS_TOOLTEST_H
 
+#include "cli/Run.h"
+
+#include "Environment.h"
 #include "support/Files.h"
 #include "support/Program.h"
 
@@ -14,12 +17,25 @@
 #include <stdlib.h>
 #include <unistd.h>
 
-/** Runs kxconfig as a user would. */
+/** Runs kxconfig. */
 class ToolTest : public testing::Test
 {
 protected:
+    /** Runs it in this process, where the library's log records are not printed. */
     static kxtest::Outcome Tool(const std::vector<std::string>& arguments,
-                                const std::vector<std::string>& environment = {"KX_LOG_MASK="})
+                                const std::vector<std::string>& environment = {})
+    {
+        const kxtest::Environment changed(environment);
+        std::istringstream in;
+        std::ostringstream out;
+        std::ostringstream err;
+        const int status = ::Run(arguments, in, out, err);
+        return {status, out.str(), err.str()};
+    }
+
+    /** Runs the program as a user would. */
+    static kxtest::Outcome ToolProcess(const std::vector<std::string>& arguments,
+                                       const std::vector<std::string>& environment = {})
     {
         std::vector<std::string> command = {KX_CONFIG_TOOL};
         command.insert(command.end(), arguments.begin(), arguments.end());
