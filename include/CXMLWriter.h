@@ -77,7 +77,8 @@ public:
     virtual int SaveData();
 
     /// Sets the path that SaveData() writes to. Returns 0, or 7 if path is empty; the path is then
-    /// unchanged. When it saves, the engine decodes escapes such as "%20" in the path.
+    /// unchanged. When it saves, the engine decodes escapes such as "%20" in the path: see
+    /// docs/handbook/limits.md.
     virtual int SetPath(const std::string& path);
 
     /// Adopts document (an xmlDocPtr), or none if it is null. Does NOT free the document that was

@@ -54,7 +54,8 @@ public:
     /// Releases the document, if one is held, and forgets the recorded path and root.
     void ClearDocument();
 
-    /// Releases the document held, records path and loads the file at path. Returns
+    /// Loads the file at path. Before that, whether or not the load succeeds, it releases the
+    /// document held and records path. Returns
     /// - 0 if the file was loaded; short of memory, the document can lack its root element,
     /// - 7 if it cannot be opened for reading; no document is held,
     /// - 22 if it is not well-formed; no document is held, and the engine prints its diagnosis to
@@ -62,24 +63,24 @@ public:
     int ParseXml(std::string path);
 
     /// Saves the document to path, or to the recorded path if path is empty; indented, in UTF-8.
-    /// Never creates a file: the target must exist. (The exception are names with escapes such as
-    /// "%20": see docs/handbook/limits.md.) The recorded path does not change. Returns
+    /// Never creates a file: the target must exist. (Names with escapes such as "%20" are an
+    /// exception: see docs/handbook/limits.md.) The recorded path does not change. Returns
     /// - 0 if the file was written,
     /// - 22 if there is no document,
     /// - 7 if the target cannot be opened for reading,
     /// - -2 if the engine could not write it; its old content can be lost.
     int SaveXml(std::string path);
 
-    /// Releases the document held and creates one with an empty root element. It has no recorded
-    /// path. Returns
+    /// Creates a document with an empty root element. Before that, whether or not the call
+    /// succeeds, it releases the document held and forgets the recorded path. Returns
     /// - 0 if the document was created,
     /// - 7 if rootName is empty; no document is held,
     /// - 22 if the engine runs out of memory; no document is held, or one without a root element.
     int CreateNewXmlDoc(std::string rootName);
 
-    /// Returns the root element as it was recorded when the document was loaded or created, or a
-    /// null handle if there was none. Does not look at the document: after the root element was
-    /// removed the handle dangles. `FindNode("/*", CXmlNode())` returns the present root element.
+    /// Returns the root element that was recorded when the document was loaded or created, or a
+    /// null handle if there was none. After that element was removed the handle dangles, and a root
+    /// element that was added later is not found: `FindNode("/*", CXmlNode())` finds it.
     CXmlNode GetRootNode();
 
     /// Returns whether the file at path can be opened for reading, as a directory can.
