@@ -19,7 +19,7 @@ bool Change(const char* file, const std::string& value)
     {
         return false;
     }
-    // A file that cannot be parsed gives a writer without document, which answers 7.
+    // For a file that cannot be parsed the writer has no document, and SetValue() returns 7.
     const bool changed = writer->SetValue(kKey, value) == 0 && writer->SaveData() == 0;
     delete writer;
     return changed;

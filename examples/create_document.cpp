@@ -1,4 +1,4 @@
-// Makes a document from nothing and saves it: create_document FILE
+// Creates a document and saves it: create_document FILE
 
 #include "CXmlParser.h"
 
@@ -20,11 +20,11 @@ int main(int argc, char** argv)
         return 1;
     }
     CXmlNode root = parser.GetRootNode();
-    root.AddChildNode("name", "inside &amp; outside"); // content is given as it stands in a file
+    root.AddChildNode("name", "inside &amp; outside"); // content is XML text
     CXmlNode port = root.AddChildNode("port", "80");
-    port.AddNewAttribute("id", "1"); // an attribute's value is given plain
+    port.AddNewAttribute("id", "1"); // an attribute's value is plain text
 
-    // Only a file that exists is saved over, so make an empty one first.
+    // Saving only overwrites an existing file, so create an empty one first.
     std::ofstream(argv[1], std::ios::app).close();
     const int status = parser.SaveXml(argv[1]);
     if (status != 0)

@@ -31,7 +31,7 @@ int main(int argc, char** argv)
         std::cout << item->m_strName << "=" << item->m_strValue << "\n";
     }
 
-    // One attribute by its name; the string keeps its value if there is none.
+    // One attribute by its name. The string is unchanged if there is none.
     std::string protocol = "any";
     node.GetAttributeValue("protocol", protocol);
     std::cout << "protocol is " << protocol << "\n";

@@ -1,6 +1,6 @@
 // Prints the content of every node that an expression selects: query_xpath FILE XPATH
 //
-// This is the way to any number of nodes; FindAllNodes() is good for 255 at most.
+// Works for any number of nodes; FindAllNodes() is valid for at most 255.
 
 #include "CXmlParser.h"
 
@@ -41,6 +41,6 @@ int main(int argc, char** argv)
         return 1;
     }
     Print(result->nodesetval);
-    xmlXPathFreeObject(result); // the result is the caller's; the nodes stay the document's
+    xmlXPathFreeObject(result); // the caller owns the result, the document its nodes
     return 0;
 }

@@ -24,6 +24,6 @@ int main(int argc, char** argv)
     {
         std::cout << values << '\n'; // several values are separated by "\n"
     }
-    delete reader; // frees the document too
+    delete reader; // also frees the document
     return 0;
 }

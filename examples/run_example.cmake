@@ -1,4 +1,4 @@
-# Runs an example in a fresh copy of the data and compares what it prints.
+# Runs an example in a fresh copy of the data and compares its output.
 file(REMOVE_RECURSE ${WORK})
 file(COPY ${DATA}/ DESTINATION ${WORK})
 list(REMOVE_ITEM COMMAND "")

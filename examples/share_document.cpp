@@ -1,6 +1,6 @@
-// Changes the document that a reader holds, in place, through a writer: share_document FILE
+// Changes the document of a reader through a writer: share_document FILE
 //
-// Both free the document that they hold, so the writer is detached before either is destroyed.
+// Both destructors free the document, so the writer is detached before either object is destroyed.
 
 #include "CXMLReader.h"
 #include "CXMLWriter.h"
@@ -21,7 +21,7 @@ int main(int argc, char** argv)
         std::cout << "the reader sees: " << reader->GetValue("gateway.name") << '\n';
         std::cout << (writer->SaveData() == 0 ? "saved" : "not saved") << '\n';
 
-        writer->SetDataPtr(0); // detached: the reader alone frees the document
+        writer->SetDataPtr(0); // detached: only the reader frees the document
     }
     delete writer;
     delete reader;

@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# Prints how large the library is for ARM, as the presets armhf and armel build it (-Os), and fails if its text has
-# outgrown what it has reached, or if the test of a log gate has become a call.
+# Prints the size of the library for ARM, as built by the presets armhf and armel (-Os). Fails if its text exceeds the
+# limit, or if the test of a log gate is compiled to a call.
 # usage: arm_size.sh
 set -euo pipefail
 cd "$(dirname "$0")/.."
@@ -16,7 +16,7 @@ print_size() {
         { echo "the test of a log gate is a function, and each gate calls it" >&2; exit 1; }
 }
 
-# With the target's kind of standard library the aim is 24 KiB. The newer one has longer names in each signature:
-# just above what it is, so that growth is seen.
+# The target is 24 KiB with the target's kind of standard library. The newer one has longer mangled names: its limit is
+# just above the present size, to detect growth.
 print_size armel arm-linux-gnueabi $((24 * 1024))
 print_size armhf arm-linux-gnueabihf $((25 * 1024 + 512))

@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
 # Unpacks the engine for an ARM architecture of Debian into build/sysroot/ARCHITECTURE, where the toolchain files of
-# cmake/toolchains look for it. Downloads once; remove the folder to have it made anew.
+# cmake/toolchains expect it. Downloads once; remove the directory to repeat it.
 # usage: arm_sysroot.sh armhf|armel
 set -euo pipefail
 cd "$(dirname "$0")/.."

@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# Measures this library side by side with what one would pick instead, and writes docs/performance.md from the
-# results. Takes about twenty minutes; a quiet machine makes for quiet figures.
+# Measures this library and others, and writes docs/performance.md from the results. Takes about twenty minutes; other
+# load on the machine distorts the figures.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 . scripts/packages.sh
@@ -16,8 +16,8 @@ mkdir -p $results
 echo "== allocations"
 $programs/kx_bench_allocations >$results/allocations.json
 
-# Where code and documents happen to lie in memory makes more of a difference than one would like, and lasts as
-# long as the process: each workload has processes of its own, in several rounds, the median of which counts.
+# The placement of code and documents in memory affects the times and is fixed for a process. So each workload runs in
+# several processes, one in each round, and the median of the rounds counts.
 mapfile -t workloads < <($programs/kx_bench --benchmark_list_tests | sed 's,/[^/]*$,,' | awk '!seen[$0]++')
 rm -f $results/time-*.json
 rounds=9
@@ -34,7 +34,7 @@ done
 echo "== instructions"
 scripts/count_instructions.sh $programs/kx_bench_instructions >$results/instructions.txt
 
-echo "== what log gates and the walks' observer cost"
+echo "== cost of the log gates and of the walks' observer"
 mapfile -t names < <(cut -f2 $results/instructions.txt | grep '/this library' | grep -vE '^load|0000/')
 for variant in as_it_is no_gates no_watch; do
     LD_LIBRARY_PATH=$programs/variants/$variant scripts/count_instructions.sh $programs/kx_bench_guard "${names[@]}" \

@@ -1,9 +1,9 @@
 #!/usr/bin/env bash
-# Guards against getting slower: counts the instructions of some key operations and compares them with the counts
-# in bench/instructions.txt, which hold for Debian 12 on x86-64, and with those of a library in which the walks of
-# reader and writer have no observer.
+# Detects regressions of speed: counts the instructions of some key operations and compares them with the counts in
+# bench/instructions.txt, which are valid for Debian 12 on x86-64, and with those of a library without the observer of
+# the walks.
 # usage: check_speed.sh [--accept]
-#   --accept  writes the counts of now into the file, for a change that is meant
+#   --accept  writes the present counts to the file, for an intended change
 set -euo pipefail
 cd "$(dirname "$0")/.."
 . scripts/packages.sh
@@ -19,7 +19,7 @@ mkdir -p build
 { cmake --preset bench && cmake --build --preset bench --target kx_bench_guard kx_as_it_is kx_no_watch; } >"$log" 2>&1 ||
     { cat "$log" >&2; exit 1; }
 
-# What the counts depend on besides this project.
+# Versions outside this project that affect the counts.
 versions() {
     dpkg-query -W -f '${Package} ${Version}\n' g++-12 libc6 libstdc++6 libxml2 valgrind 2>/dev/null |
         sort -u | paste -sd, | sed 's/,/, /g'
@@ -27,7 +27,7 @@ versions() {
 
 mapfile -t operations < <(grep -v '^#' $file | cut -f2)
 
-# count VARIANT — prints what the operations take with that build of the library.
+# count VARIANT — prints the instructions of the operations with that build of the library.
 count() {
     LD_LIBRARY_PATH=build/bench/bench/variants/$1 \
         scripts/count_instructions.sh build/bench/bench/kx_bench_guard "${operations[@]}"
@@ -44,7 +44,7 @@ if [ "${1:-}" = --accept ]; then
     exit 0
 fi
 
-# compare MARGIN BEFORE AFTER — prints how counts differ, and fails if one is higher by more than the margin.
+# compare MARGIN BEFORE AFTER — prints the differences, and fails if a count is higher by more than the margin.
 compare() {
     awk -F'\t' -v margin="$1" '
         /^#/ { next }
@@ -68,7 +68,7 @@ if ! compare $margin $file <(echo "$counted"); then
     cat >&2 <<MESSAGE
 
 An operation takes more than $margin % more instructions than $file says.
-If the change is not meant: callgrind_annotate shows where they went, see docs/performance.md.
+If the change is not intended: callgrind_annotate shows where the instructions are spent, see docs/performance.md.
 If it is meant: scripts/check_speed.sh --accept writes the new counts; commit them, and say why in the message.
 MESSAGE
     accepted_versions=$(sed -n 's/^# with //p' $file)

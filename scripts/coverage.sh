@@ -1,7 +1,6 @@
 #!/usr/bin/env bash
-# Runs the tests with lines and branches of the library counted, writes build/coverage/report/index.html,
-# and fails unless all of them are covered. Clang counts the branches of the source: what the compiler adds
-# for exceptions is none of them.
+# Runs the tests with coverage of lines and branches of the library, writes build/coverage/report/index.html, and fails
+# unless all are covered. Clang counts branches of the source, not those that the compiler adds for exceptions.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 . scripts/packages.sh

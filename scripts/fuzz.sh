@@ -1,7 +1,8 @@
 #!/usr/bin/env bash
-# fuzz.sh [TARGET [SECONDS]] — fuzzes a target of fuzz/, or all of them side by side, and fails if
-# one finds something. Findings go to build/fuzz/findings; each becomes a test before it is mended.
-# A run goes on where the last one ended: what it found worth keeping is in build/fuzz/corpus.
+# Fuzzes a target of fuzz/, or all of them in parallel, and fails on a finding. Findings are written to
+# build/fuzz/findings; write a test for each before you fix it. A run continues with the corpus of the last one, in
+# build/fuzz/corpus.
+# usage: fuzz.sh [TARGET [SECONDS]]
 set -euo pipefail
 cd "$(dirname "$0")/.."
 . scripts/packages.sh

@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# Builds the newest libxml2 that Debian has as a source package into build/libxml2, as build/libxml2/newest.
-# Asks for the newest version each time, and builds only one that is not there yet.
+# Builds the newest libxml2 that Debian has as a source package, into build/libxml2/newest. Queries the newest version
+# each time, and builds it if it is missing.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 . scripts/private_apt.sh
@@ -18,7 +18,7 @@ echo "libxml2 $version"
 rm -rf "$folder/source" "$folder/build" "${folder:?}/$version"
 mkdir -p "$folder/source"
 cd "$folder/source"
-# As a client of the library would have it: no programs, no bindings, gzip as elsewhere.
+# As clients use it: no programs, no bindings, gzip as in Debian's package.
 {
     apt-get source -qq "libxml2=$version" &&
         cmake -G Ninja -S libxml2-*/ -B "$folder/build" -DCMAKE_BUILD_TYPE=RelWithDebInfo \

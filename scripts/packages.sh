@@ -1,6 +1,6 @@
-# Sourced by the other scripts: installs Debian packages that are missing, and only those.
+# Installs missing Debian packages. Sourced by the other scripts.
 
-# need PACKAGE... — silent when all of them are there.
+# need PACKAGE... — installs those that are missing; prints nothing if there are none.
 need() {
     local missing=()
     local package
@@ -37,14 +37,14 @@ need() {
 
 build_packages=(g++ cmake ninja-build libxml2-dev libcli11-dev nlohmann-json3-dev)
 
-# For the tests of any build; the last line: packages whose files the tests read.
+# For the tests of any build. The tests read files of the packages in the last line.
 test_packages=(clang git python3 libgtest-dev libgmock-dev pkg-config groff-base bsdutils
     fontconfig-config shared-mime-info xkb-data)
 
-# For the benchmarks: what measures, what the library is compared with, what draws the plots.
+# For the benchmarks: measuring, the compared libraries, the plots.
 bench_packages=(libbenchmark-dev valgrind python3-matplotlib pkg-config
     libpoco-dev libboost-dev libpugixml-dev libtinyxml2-dev libxml++2.6-dev
     fontconfig-config shared-mime-info xkb-data)
 
-# For making the Debian packages, and for their tests.
+# For building the Debian packages, and for their tests.
 packaging_packages=(dpkg-dev file fakeroot lintian man-db pkg-config)

@@ -1,7 +1,7 @@
-# Sourced by the scripts that need packages which are not for this machine: those of another architecture or of
-# another release. apt runs on lists and a cache of its own, so that the machine's stay as they are.
+# Provides a private apt configuration for packages of another architecture or release. It has its own lists and
+# cache, so those of the machine are unchanged. Sourced by other scripts.
 
-# debian_mirror — where this machine gets Debian from, as far as apt has read its lists.
+# debian_mirror — prints the URI of this machine's Debian mirror; prints nothing if apt has no lists.
 debian_mirror() {
     local codename
     codename=$(. /etc/os-release && echo "$VERSION_CODENAME")
@@ -9,9 +9,9 @@ debian_mirror() {
         awk -v release="$codename" '$1 == release { print $2; exit }'
 }
 
-# private_apt FOLDER ARCHITECTURE SOURCE... — makes FOLDER/apt.conf, for use as APT_CONFIG, and reads the lists of
-# the sources ("deb bookworm main", say). Lists may be old, as those of a mirror that is kept as it was are: what
-# they name is signed all the same, and used for tests only.
+# private_apt FOLDER ARCHITECTURE SOURCE... — writes FOLDER/apt.conf, for use as APT_CONFIG, and reads the lists of
+# the sources, such as "deb bookworm main". Expired lists are accepted, for mirrors with a fixed state: the packages
+# are still signed, and are used for tests only.
 private_apt() {
     local folder=$1 architecture=$2 mirror source
     shift 2
@@ -34,6 +34,6 @@ CONF
     for source in "$@"; do
         echo "${source%% *} [signed-by=/usr/share/keyrings/debian-archive-keyring.gpg] $mirror ${source#* }"
     done >"$folder/sources.list"
-    # Signs of trouble are warnings to apt, which goes on with what it has.
+    # By default apt reports failed downloads as warnings and continues with old lists.
     APT_CONFIG=$folder/apt.conf apt-get update -qq -o APT::Update::Error-Mode=any
 }

@@ -1,13 +1,13 @@
 #!/usr/bin/env bash
-# From a bare Debian 12 to values read out of a configuration file: installs what is missing, builds the
-# library and its command-line client, and shows both at work, with the commands that it runs.
+# Installs what is missing on a bare Debian 12, builds the library and its command-line client, and demonstrates both
+# on a sample configuration. Prints each command that it runs.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 . scripts/packages.sh
 
 need "${build_packages[@]}"
 
-# show COMMAND... — prints the command as one would type it, then runs it.
+# show COMMAND... — prints the command as typed in a shell, then runs it.
 show() {
     printf '\n$'
     local word
@@ -21,7 +21,7 @@ show() {
     "$@"
 }
 
-# quietly COMMAND... — for building, of which only what goes wrong is worth reading.
+# quietly COMMAND... — prints the output of the command only if it fails.
 quietly() {
     local log=build/quickstart.log
     mkdir -p build
@@ -40,14 +40,14 @@ show "$kxconfig" get "$file" gateway.network.interface.address
 show "$kxconfig" get "$file" gateway.network.interface@name=eth1.address
 show "$kxconfig" get "$file" 'gateway.channels.channel@id=1|id=2.limit@level=alarm'
 
-# The sample itself stays as it is: changes go into a copy.
+# Changes go to a copy of the sample.
 copy=build/gateway.xml
 show cp "$file" "$copy"
 show "$kxconfig" set "$copy" gateway.log.level debug
 show "$kxconfig" get "$copy" gateway.log.level
 show "$kxconfig" --log-mask value get "$file" gateway.time.zone
 
-# A key that gives nothing, and why.
+# A key that finds nothing, and the reason.
 show "$kxconfig" get "$file" gateway.log.target || true
 show "$kxconfig" explain "$file" gateway.log.target || true
 

@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
-# Records docs/handbook/first-steps.txt: what a new user types and sees, from a clean clone to a key that gives nothing and why.
-# The clone is of the last commit of this one, in an empty folder.
-# usage: record_first_steps.sh [--check]   --check writes nothing and fails if the recording is not up to date
+# Records docs/handbook/first-steps.txt, the session of a new user from a clean clone to a key that finds nothing. The
+# clone is of the last commit, in an empty directory.
+# usage: record_first_steps.sh [--check]   --check writes nothing, and fails if the recording is out of date
 # shellcheck disable=SC2016,SC2034  # commands are typed in as they stand
 set -euo pipefail
 cd "$(dirname "$0")/.."
@@ -17,7 +17,7 @@ say() {
     printf '# %s\n' "$@"
 }
 
-# type_in COMMAND — shows the command as it is typed, runs it in this shell, and shows what it prints.
+# type_in COMMAND — prints the command as typed, runs it in this shell, and prints its output.
 type_in() {
     printf '\n$ %s\n' "${1//$'\n'/$'\n'> }"
     local status=0
@@ -78,7 +78,7 @@ END'
     fi
 }
 
-# What changes from run to run, or with every edit of a source: the times and source lines of log records.
+# Replaces what changes with each run or each edit of a source: times and source lines of log records, directories.
 steady() {
     sed -E -e 's/^[0-9]{4}-[0-9-]{5}T[0-9:.]{12} /2026-01-01T12:00:00.000 /' -e 's/^(2026-01-01T12:00:00.000 [a-z]+ [~A-Za-z]+):[0-9]+ /\1:1 /' \
         -e '/^warning: source repository is shallow/d' -e 's/ +$//' -e 's/\$last_status/$?/' -e "s#$empty#/home/me#g"

@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Installs what is missing and builds the reference, build/reference/html/index.html; fails on any warning.
+# Installs what is missing and builds the reference, build/reference/html/index.html. Fails on any warning.
 set -euo pipefail
 cd "$(dirname "$0")/.."
 . scripts/packages.sh

@@ -2,21 +2,21 @@
 # Installs what is missing, builds and tests.
 # usage: test.sh [STAGE...]
 #
-#   fast     everything as built for daily work, and under the sanitizers; an outside project uses what is installed
-#   package  the Debian packages: installed into a scratch root, used from there, removed
-#   abi98    everything with the target's kind of standard library (shared strings, a linear list::size)
-#   engine   everything with the newest libxml2 that Debian has as a source package
-#   arm      everything for ARMv7-A, in both calling conventions, under qemu-arm; the library's size
-#   proof    every line and branch of the library covered; Valgrind; threads; a short run of each fuzz target
-#   speed    the instructions of key operations, against those that were accepted
-#   docs     the reference, built by Doxygen without a warning; the recording of a new user's first steps
-#   host     fast and package; what runs if no stage is named
-#   all      all of them; what CI runs
+#   fast     all tests, also under the sanitizers; an outside project builds against the installed library
+#   package  the Debian packages: installs them into a scratch root, uses and removes them
+#   abi98    all tests with the target's kind of standard library (shared strings, a linear list::size)
+#   engine   all tests with the newest libxml2 that Debian has as a source package
+#   arm      all tests for ARMv7-A, in both calling conventions, under qemu-arm; the library's size
+#   proof    full coverage of lines and branches; Valgrind; ThreadSanitizer; a short run of each fuzz target
+#   speed    the instructions of key operations, compared with the accepted counts
+#   docs     the reference, without a warning of Doxygen; the recording of a new user's first steps
+#   host     fast and package; the default
+#   all      all stages; CI runs this
 set -euo pipefail
 cd "$(dirname "$0")/.."
 . scripts/packages.sh
 
-# run_preset NAME — configures, builds and tests by the preset; quiet until something fails.
+# run_preset NAME — configures, builds and tests with the preset; prints details only of failures.
 run_preset() {
     local log=build/$1.log
     mkdir -p build

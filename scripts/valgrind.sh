@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Runs the suites, the fuzz corpora and kxconfig under Valgrind. Any error fails, and any leak that is not in
+# Runs the suites, the fuzz corpora and kxconfig under Valgrind. Fails on errors, and on leaks that are not in
 # tests/valgrind.supp.
 set -euo pipefail
 cd "$(dirname "$0")/.."
@@ -12,9 +12,8 @@ logs=build/valgrind
 mkdir -p $logs
 { cmake --preset dev && cmake --build --preset dev; } >$logs/build.log 2>&1 || { tail -n 40 $logs/build.log >&2; exit 1; }
 
-# check STATUS COMMAND... — under Valgrind, ends as it should. The tests count what passes through their own
-# operator new: Valgrind must not put its own in its place. A program that hangs fails; the slowest takes about a
-# minute.
+# check STATUS COMMAND... — runs the command under Valgrind, and fails unless it ends with STATUS. The tests count
+# calls of their own operator new, so Valgrind must not replace it. The slowest program takes about a minute.
 check() {
     local expected=$1 log status=0
     shift
@@ -32,7 +31,7 @@ check() {
     echo "valgrind: ${1##*/}${2:+ $2} clean"
 }
 
-# start STATUS COMMAND... — checks beside what runs already, as soon as there is a processor for it.
+# start STATUS COMMAND... — runs check in parallel, as soon as a processor is free.
 start() {
     [ $running -lt "$(nproc)" ] || await_one
     check "$@" &
@@ -54,7 +53,7 @@ for target in keypath document loader; do
     start 0 $build/fuzz/replay_$target fuzz/corpus/$target
 done
 
-# The client as a person runs it. What it answers is tested elsewhere; it warns of the sample.
+# The client as in a shell. Its output is tested elsewhere; check reports warnings for the sample.
 sample=examples/data/gateway.xml
 for arguments in "get $sample gateway.name" "keys $sample" "find $sample //@*" "explain $sample gateway.log.level" \
     "explain --set $sample gateway.name" "set --dry-run $sample gateway.name crate" \
