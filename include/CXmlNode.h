@@ -171,8 +171,8 @@ public:
     /// memory.
     CXmlNode AddSiblingNode(std::string name, std::string content);
 
-    /// Frees FindChildNode(name) with its subtree. Returns 0, or 22 if there is no such child or
-    /// this is a null handle.
+    /// Frees FindChildNode(name) with its subtree. Returns 0, or 22 if there is no such child, this
+    /// is a null handle or the kind of the child is refused.
     int RemoveChildNode(std::string name);
     /// @}
 

@@ -21,7 +21,7 @@
 typedef char
     MaskWordOffsetIsPublished[offsetof(LumLogParams, xmlConfigParserMask) == 0x2F14 ? 1 : -1];
 
-// Warnings and errors are on until somebody says otherwise.
+// Warnings and errors are enabled by default.
 LumLogParams g_LumLogParams = {{0}, (1u << 8) | (1u << 9), {0}};
 
 namespace
@@ -51,7 +51,7 @@ public:
         pthread_sigmask(SIG_SETMASK, &m_before, 0);
     }
 
-    /** Call after a write that failed with EPIPE: the signal that it raised is taken back. */
+    /** Called after a write that failed with EPIPE: the destructor discards its signal. */
     void Broken() { m_broken = true; }
 
 private:
@@ -64,7 +64,7 @@ private:
     bool m_broken;
 };
 
-/** Writes to standard error; what cannot be written is dropped. */
+/** Writes to standard error, and drops what cannot be written. */
 void WriteToStandardError(const char* data, size_t size)
 {
     BrokenPipeGuard guard;
@@ -146,8 +146,8 @@ void WriteRecord(int line, int level, const char* tag, const std::string& text)
     WriteToStandardError(record.data(), record.size());
 }
 
-// Clients test their mask word without calling the platform, so the environment has to be heeded
-// before the first of them runs: when the library is loaded.
+// Clients test their mask word without calling the platform, so the environment is read when this
+// library is loaded.
 __attribute__((constructor)) void TakeMaskFromEnvironment()
 {
     const char* const text = getenv("KX_LOG_MASK");
@@ -164,7 +164,7 @@ __attribute__((constructor)) void TakeMaskFromEnvironment()
     }
     catch (const std::exception&)
     {
-        // Out of memory: the mask stays as it was, unexplained.
+        // Out of memory: the mask stays as it was, without a message.
     }
 }
 

@@ -7,20 +7,19 @@
  * @file Log.h
  * The log gate: every record of the library passes through one of the macros below.
  *
- * A gate tests the level's bit in the library's log mask word and calls KxLog() only if it is set.
- * With the bit clear it costs a load, a test and a branch that is not taken: no call is made and no
- * argument is evaluated. The word is read anew at each gate, since the platform may change it at
- * any time.
+ * A gate calls KxLog() only if the level's bit is set in the library's log mask word. Otherwise it
+ * costs a load, a test and a branch that is not taken, and evaluates no argument. Each gate reads
+ * the word again, because the platform can change it at any time.
  *
- * The operation's bare name is the record's tag. A gate takes it from the function that it stands
- * in; a function that works on behalf of another operation uses the _AS form, which is given the
- * tag. The _OF form takes the one argument that its format asks for.
+ * The tag of a record is the bare name of the operation. A gate uses the name of the function that
+ * contains it; the _AS form takes the tag as an argument, for functions that work on behalf of an
+ * operation. The _OF form takes the single argument of its format.
  *
- * An operation that traces logs KX_TRACE("+") first and KX_TRACE("-") last on each return path. "-"
- * is written out instead of left to a destructor because a call that an exception leaves logs none,
- * and because it precedes the destruction of the operation's own locals.
+ * An operation that traces begins with KX_TRACE("+") and ends with KX_TRACE("-") on each return
+ * path. No destructor logs the "-": it is missing after an exception, and it precedes the
+ * destruction of the operation's locals.
  *
- * Text that comes from outside (a key, a path, a value) is always an argument, never the format.
+ * Text from outside (a key, a path, a value) is always an argument, never the format.
  */
 
 namespace kx
@@ -31,8 +30,8 @@ enum LogLevel
 {
     LogLevelWarning = 8, ///< a feature that is not available on this platform
     LogLevelError = 9,   ///< a missing document, root or node; a failed parse, save or creation
-    LogLevelTrace = 11,  ///< "+" on entry and "-" on return, and the lines that stand in for them
-    LogLevelValue = 29,  ///< keys requested and values parsed
+    LogLevelTrace = 11,  ///< "+" on entry and "-" on return, and the records in place of them
+    LogLevelValue = 29,  ///< keys to look up and values found
     LogLevelXPath = 31   ///< XPath and node-set diagnostics of the document queries
 };
 
@@ -41,14 +40,15 @@ enum LogLevel
 const unsigned int kLogMaskOffset = 0x2F14;
 
 /**
- * Where the library's log mask word is, however the platform declares the object.
+ * The address of the library's log mask word, which does not depend on how the platform declares
+ * the object.
  *
- * For ARM, where an instruction cannot reach so far into the object: with the address, which the
- * loader computes once, a gate there is a load, a test and a branch as well.
+ * For ARM, where the offset is too large for one instruction: the loader computes the address once,
+ * and a gate is a load, a test and a branch there too.
  */
 extern const unsigned int* const kLogMaskWord __attribute__((visibility("hidden")));
 
-// The gate is inline in the smallest of builds as well, where the compiler would rather call it.
+// Always inline: a compiler that optimizes for size would call the gate.
 
 /** The library's log mask word. */
 __attribute__((always_inline)) inline unsigned int LogMask()
@@ -61,23 +61,21 @@ __attribute__((always_inline)) inline unsigned int LogMask()
 #endif
 }
 
-/** @return whether records of @p level are wanted; the mask is unsigned, so that 31 is a level. */
+/** @return whether records of @p level are enabled; the mask is unsigned because of level 31. */
 __attribute__((always_inline)) inline bool LogEnabled(LogLevel level)
 {
     return __builtin_expect((LogMask() & (1u << level)) != 0, false);
 }
 
-/** @return whether records of either level are wanted; a single test, as that of one level. */
+/** @return whether records of either level are enabled, in a single test. */
 __attribute__((always_inline)) inline bool LogEnabled(LogLevel one, LogLevel other)
 {
     return __builtin_expect((LogMask() & ((1u << one) | (1u << other))) != 0, false);
 }
 
 /**
- * The two records of nearly every operation.
- *
- * Out of line, as the part of a gate that is rarely run: a gate then passes two arguments instead
- * of four, of which text and level would be the same everywhere.
+ * The records of nearly every operation. Out of line, because they are rarely enabled: a gate then
+ * passes two arguments instead of four.
  */
 __attribute__((noinline)) inline void LogEntry(int line, const char* tag)
 {
@@ -89,7 +87,7 @@ __attribute__((noinline)) inline void LogReturn(int line, const char* tag)
     KxLog(line, LogLevelTrace, tag, "-");
 }
 
-/** Both records of an operation that has nothing to tell in between; the first one is wanted. */
+/** Both records of an operation without other records in between; the first one is enabled. */
 __attribute__((noinline)) inline void LogEntryAndReturn(int line, const char* tag)
 {
     KxLog(line, LogLevelTrace, tag, "+");
@@ -101,7 +99,7 @@ __attribute__((noinline)) inline void LogEntryAndReturn(int line, const char* ta
 
 } // namespace kx
 
-/** Logs @p text, which is a literal, as is @p level: only one of the calls is compiled. */
+/** Logs @p text. It and @p level are constants, so that only one of the calls is compiled. */
 #define KX_LOG_TEXT(level, tag, text)                                                              \
     ((level) != kx::LogLevelTrace       ? static_cast<void>(KxLog(__LINE__, level, tag, text))     \
      : __builtin_strcmp(text, "+") == 0 ? kx::LogEntry(__LINE__, tag)                              \
@@ -126,10 +124,10 @@ __attribute__((noinline)) inline void LogEntryAndReturn(int line, const char* ta
         }                                                                                          \
     } while (false)
 
-/** Stands before a block of gates of two levels: with both bits clear they cost one test in all. */
+/** Precedes a block of gates of two levels: with both bits clear the block costs one test. */
 #define KX_LOG_EITHER(one, other) if (kx::LogEnabled(one, other))
 
-/** "+" and "-" of an operation whose work nobody can see in between: one test for both. */
+/** "+" and "-" of an operation without visible work in between: one test for both. */
 #define KX_TRACE_BOTH()                                                                            \
     do                                                                                             \
     {                                                                                              \

@@ -7,14 +7,14 @@ namespace kx
 /**
  * The status codes that the library's operations return.
  *
- * 7 and 22 share their numbers with errno values of the platform; they are returned and never
- * stored in errno. Clients compare with the plain numbers.
+ * 7 and 22 share their numbers with errno values of the platform, but are never stored in errno.
+ * Clients compare with the plain numbers.
  */
 enum Status
 {
-    /** Success; also the answer for a key path that starts with another name than the root's. */
+    /** Success; also for a key path that starts with another name than the root's. */
     StatusOk = 0,
-    /** Bad argument or unmet precondition: a key path without ".", an empty path or name. */
+    /** A bad argument or an unmet precondition: a key path without ".", an empty path or name. */
     StatusBadArgument = 7,
     /** A missing object (document, root, node, attribute) or an engine call that failed. */
     StatusMissing = 22,

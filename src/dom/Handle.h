@@ -6,7 +6,7 @@
 namespace kx
 {
 
-/** Sets @p handle, a null handle so far, on @p node; without a node it stays null. */
+/** Sets @p handle, which is null, to @p node; a null @p node leaves it null. */
 inline void Designate(CXmlNode& handle, _xmlNode* node)
 {
     if (node != 0)
@@ -16,9 +16,9 @@ inline void Designate(CXmlNode& handle, _xmlNode* node)
 }
 
 /**
- * How an operation that only finds a node ends: the handle is made, and "-" logged under @p tag.
+ * Ends an operation that only finds a node: creates the handle and logs "-" under @p tag.
  *
- * @return a handle on @p node; a null handle without one.
+ * @return a handle on @p node, which may be null.
  */
 CXmlNode HandleOn(const char* tag, _xmlNode* node);
 
