@@ -1,0 +1,123 @@
+#include "cli/Options.h"
+
+#include "cli/LogMaskChoice.h"
+
+#include "LogMask.h"
+
+#include <CLI/CLI.hpp>
+
+namespace
+{
+
+/** To the engine "-" is standard input or output; a user who writes it here means something else.
+ */
+std::string StandardStreamError(const std::string& file)
+{
+    return file == "-" ? "\"-\" is no file; name one" : std::string();
+}
+
+/** An empty name would stand for the file that was loaded, and overwrite it. */
+std::string NewFileError(const std::string& file)
+{
+    return file.empty() ? "\"\" is no file; name one" : StandardStreamError(file);
+}
+
+/** A command with the argument FILE, which @p run carries out. */
+template <class Arguments>
+CLI::App* AddCommand(CLI::App& app, const char* name, const char* description,
+                     ExitStatus (*run)(const Arguments&, Report&), Arguments& arguments,
+                     Request& request)
+{
+    CLI::App* const command = app.add_subcommand(name, description);
+    command->add_option("FILE", arguments.file, "an XML file")
+        ->required()
+        ->check(CLI::Validator(StandardStreamError, ""));
+    command->callback(
+        [run, &arguments, &request]
+        {
+            request.file = arguments.file;
+            request.command = [run, &arguments](Report& report) { return run(arguments, report); };
+        });
+    return command;
+}
+
+void AddKey(CLI::App& command, std::string& key)
+{
+    command.add_option("KEY", key, "a key path: root.element@attribute=value.element")->required();
+}
+
+void AddGet(CLI::App& app, Request& request)
+{
+    CLI::App* const get = AddCommand(app, "get", "print the value or values under a key path", Get,
+                                     request.get, request);
+    AddKey(*get, request.get.key);
+}
+
+void AddSet(CLI::App& app, Request& request)
+{
+    SetArguments& arguments = request.set;
+    CLI::App* const set =
+        AddCommand(app, "set", "replace the text under a key path, print what changed, and save",
+                   Set, arguments, request);
+    AddKey(*set, arguments.key);
+    set->add_option("VALUE", arguments.value, "the new text, as XML: write & as &amp;")->required();
+    set->add_flag("--dry-run", arguments.dryRun, "show what would change and save nothing");
+    set->add_option("--output", arguments.output, "save to this file instead")
+        ->type_name("FILE")
+        ->check(CLI::Validator(NewFileError, ""));
+}
+
+void AddExplain(CLI::App& app, Request& request)
+{
+    CLI::App* const explain =
+        AddCommand(app, "explain", "tell level by level why a key path gives what it gives",
+                   Explain, request.explain, request);
+    AddKey(*explain, request.explain.key);
+    explain->add_flag("--set", request.explain.isUpdate,
+                      "tell what an update would reach; changes nothing");
+}
+
+void AddCheck(CLI::App& app, Request& request)
+{
+    AddCommand(app, "check", "warn of what will surprise somebody who looks values up", Check,
+               request.check, request)
+        ->add_option("KEY", request.check.keys, "key paths to check instead of the file's own");
+}
+
+void AddKeys(CLI::App& app, Request& request)
+{
+    AddCommand(app, "keys", "print every key path under which the file holds a value", Keys,
+               request.keys, request);
+}
+
+void AddFind(CLI::App& app, Request& request)
+{
+    AddCommand(app, "find", "print the nodes that an XPath expression selects, or its value", Find,
+               request.find, request)
+        ->add_option("XPATH", request.find.expression, "an XPath 1.0 expression")
+        ->required();
+}
+
+void AddGeneralOptions(CLI::App& app, Request& request)
+{
+    app.set_version_flag("--version", "kxconfig " KX_VERSION);
+    app.add_flag("--json", "answer with one JSON object");
+    CLI::Option* const mask =
+        app.add_option("--log-mask", request.logMask, std::string("log mask: ") + g_LogMaskHelp)
+            ->type_name("MASK")
+            ->check(CLI::Validator(LogMaskError, ""));
+    app.add_flag("--trace", request.trace, "show all log records: --log-mask all")->excludes(mask);
+}
+
+} // namespace
+
+void AddOptions(CLI::App& app, Request& request)
+{
+    AddGeneralOptions(app, request);
+    AddGet(app, request);
+    AddSet(app, request);
+    AddExplain(app, request);
+    AddCheck(app, request);
+    AddKeys(app, request);
+    AddFind(app, request);
+}
