@@ -112,7 +112,7 @@ int CXmlNode::ClearNode()
 {
     KX_TRACE("+");
     int status = StatusMissing;
-    if (OwnsItsContent(m_pXmlNode))
+    if (CanBeCleared(m_pXmlNode))
     {
         RemoveChildren(m_pXmlNode);
         RemoveAttributes(m_pXmlNode);

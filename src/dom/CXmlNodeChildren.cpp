@@ -115,7 +115,7 @@ int CXmlNode::SetContent(std::string text)
 {
     KX_TRACE("+");
     int status = StatusMissing;
-    if (OwnsItsContent(m_pXmlNode))
+    if (CanTakeContent(m_pXmlNode))
     {
         ReplaceContent(m_pXmlNode, text);
         status = StatusOk;
@@ -218,7 +218,7 @@ int CXmlNode::RemoveChildNode(std::string name)
     KX_TRACE("+");
     int status = StatusMissing;
     CXmlNode child = FindChildNode(name);
-    if (child.m_pXmlNode != 0)
+    if (CanBeRemoved(child.m_pXmlNode))
     {
         FreeFromTree(child.m_pXmlNode);
         status = StatusOk;

@@ -9,23 +9,28 @@ namespace kx
 namespace
 {
 
-/** Whether @p node is a full node record whose children are its own. */
-bool IsPlainNode(const xmlNode* node)
+/** Whether @p node is of a kind whose content the engine replaces, with all that lies below. */
+bool HasContent(const xmlNode* node)
 {
     switch (node->type)
     {
     case XML_ELEMENT_NODE:
+    case XML_ATTRIBUTE_NODE:
     case XML_TEXT_NODE:
     case XML_CDATA_SECTION_NODE:
     case XML_PI_NODE:
     case XML_COMMENT_NODE:
     case XML_DOCUMENT_FRAG_NODE:
-    case XML_XINCLUDE_START:
-    case XML_XINCLUDE_END:
         return true;
     default:
         return false;
     }
+}
+
+/** Whether @p node is freed with what lies below, and nothing else points to either. */
+bool OwnsWhatItHolds(const xmlNode* node)
+{
+    return HasContent(node) || node->type == XML_XINCLUDE_START || node->type == XML_XINCLUDE_END;
 }
 
 bool IsDocument(const xmlNode* node)
@@ -35,7 +40,41 @@ bool IsDocument(const xmlNode* node)
 
 bool IsAttribute(const xmlNode* node)
 {
-    return node != 0 && node->type == XML_ATTRIBUTE_NODE;
+    return node->type == XML_ATTRIBUTE_NODE;
+}
+
+/** Whether @p node is a reference whose child is the declaration of its entity. */
+bool RefersToDeclaration(const xmlNode* node)
+{
+    return node->type == XML_ENTITY_REF_NODE && node->children != 0;
+}
+
+/** Whether @p node is in the tables of its DTD, too. */
+bool IsDeclaration(const xmlNode* node)
+{
+    return node->type == XML_ELEMENT_DECL || node->type == XML_ATTRIBUTE_DECL ||
+           node->type == XML_ENTITY_DECL;
+}
+
+/** Whether @p node declares an entity that references in the document may point to. */
+bool IsGeneralEntity(const xmlNode* node)
+{
+    if (node->type != XML_ENTITY_DECL)
+    {
+        return false;
+    }
+    const xmlEntityType type = reinterpret_cast<const xmlEntity*>(node)->etype;
+    return type != XML_INTERNAL_PARAMETER_ENTITY && type != XML_EXTERNAL_PARAMETER_ENTITY;
+}
+
+bool HasChild(const xmlNode* node, bool (*isWanted)(const xmlNode*))
+{
+    const xmlNode* child = node->children;
+    while (child != 0 && !isWanted(child))
+    {
+        child = child->next;
+    }
+    return child != 0;
 }
 
 #if LIBXML_VERSION < 21400
@@ -79,12 +118,11 @@ void RemoveFromTable(xmlAttr* attribute)
 #endif
 
 /**
- * Makes @p attribute an ordinary one if it is an ID.
+ * Takes @p attribute out of the table of IDs if it is there.
  *
- * The engine would leave an attribute in its table of IDs, to look at it again after it is freed,
- * if it does not find it there. Up to 2.13 it looks for a copy of the value that it makes out of
- * the attribute: it finds none that has changed, nor one with blanks to strip or with a reference
- * to an entity, nor any when memory is short.
+ * Up to 2.13 the engine finds it by a copy of the value that it makes out of the attribute. It
+ * finds none that has changed, nor one with blanks to strip or with a reference to an entity, nor
+ * any when memory is short; it would then look at the attribute again after that is freed.
  */
 void ForgetId(xmlAttr* attribute)
 {
@@ -101,43 +139,55 @@ void ForgetId(xmlAttr* attribute)
 #endif
 }
 
-/** The same of the attribute that @p node is, or is a piece of; there may be none. */
-void ForgetIdOf(xmlNode* node)
+/** @return the first node that is freed with @p node: an attribute, else a child; or null. */
+xmlNode* FirstWithin(xmlNode* node)
 {
-    xmlNode* const owner = IsAttribute(node) ? node : LinkOf(node, &xmlNode::parent);
-    if (IsAttribute(owner))
+    if (AttributesOf(node) != 0)
     {
-        ForgetId(reinterpret_cast<xmlAttr*>(owner));
+        return reinterpret_cast<xmlNode*>(AttributesOf(node));
     }
+    // A reference's child is the declaration of its entity.
+    return node->type != XML_ENTITY_REF_NODE ? node->children : 0;
 }
 
-/** @return what follows @p node in document order among what @p top holds, or null. */
+/** @return what follows @p node among all that is freed with @p top, or null. */
 xmlNode* NextWithin(const xmlNode* top, xmlNode* node)
 {
-    // A reference's children are those of the entity's declaration.
-    if (node->children != 0 && node->type != XML_ENTITY_REF_NODE)
+    xmlNode* next = FirstWithin(node);
+    while (next == 0 && node != top)
     {
-        return node->children;
+        next = node->next;
+        if (next == 0)
+        {
+            // An element's children come after its attributes.
+            next = IsAttribute(node) ? node->parent->children : 0;
+            node = node->parent;
+        }
     }
-    while (node != top && node->next == 0)
-    {
-        node = node->parent;
-    }
-    return node != top ? node->next : 0;
+    return next;
 }
 
-/** The same of every attribute that is freed with @p top. */
+/** Takes every attribute that is freed with @p top out of the table of IDs. */
 void ForgetIdsWithin(xmlNode* top)
 {
-    ForgetIdOf(top);
     xmlNode* node = top->doc != 0 && top->doc->ids != 0 ? top : 0;
     while (node != 0)
     {
-        for (xmlAttr* attribute = AttributesOf(node); attribute != 0; attribute = attribute->next)
+        if (IsAttribute(node))
         {
-            ForgetId(attribute);
+            ForgetId(reinterpret_cast<xmlAttr*>(node));
         }
         node = NextWithin(top, node);
+    }
+}
+
+/** Empties the table of IDs, before a DTD is freed to whose entities their values may refer. */
+void ForgetAllIds(xmlDoc* document)
+{
+    if (document != 0 && document->ids != 0)
+    {
+        xmlFreeIDTable(static_cast<xmlIDTable*>(document->ids));
+        document->ids = 0;
     }
 }
 
@@ -166,8 +216,7 @@ xmlAttr* AttributesOf(const xmlNode* node)
 
 bool CanHoldChildren(const xmlNode* node)
 {
-    return node != 0 && (IsPlainNode(node) || IsAttribute(node) || IsDocument(node) ||
-                         node->type == XML_DTD_NODE);
+    return node != 0 && (OwnsWhatItHolds(node) || IsDocument(node) || node->type == XML_DTD_NODE);
 }
 
 bool CanHaveSiblings(const xmlNode* node)
@@ -176,15 +225,48 @@ bool CanHaveSiblings(const xmlNode* node)
     return node != 0 && !IsAttribute(node);
 }
 
-bool OwnsItsContent(const xmlNode* node)
+bool CanTakeContent(const xmlNode* node)
 {
-    return node != 0 && (IsPlainNode(node) || IsAttribute(node));
+    return node != 0 && !RefersToDeclaration(node);
+}
+
+bool CanBeCleared(const xmlNode* node)
+{
+    if (node == 0)
+    {
+        return false;
+    }
+    switch (node->type)
+    {
+    case XML_DOCUMENT_NODE:
+    case XML_HTML_DOCUMENT_NODE:
+    case XML_ELEMENT_DECL:
+    case XML_ATTRIBUTE_DECL:
+        return true;
+    case XML_ENTITY_REF_NODE:
+        return !RefersToDeclaration(node);
+    case XML_DTD_NODE:
+        return !HasChild(node, IsDeclaration);
+    default:
+        return OwnsWhatItHolds(node);
+    }
 }
 
 bool CanBeRemoved(const xmlNode* node)
 {
-    // A reference shares its child with the entity's declaration, but nothing points to it.
-    return OwnsItsContent(node) || node->type == XML_ENTITY_REF_NODE;
+    if (node == 0)
+    {
+        return false;
+    }
+    switch (node->type)
+    {
+    case XML_ENTITY_REF_NODE: // nothing points to it, whatever its child
+        return true;
+    case XML_DTD_NODE:
+        return !HasChild(node, IsGeneralEntity);
+    default:
+        return OwnsWhatItHolds(node);
+    }
 }
 
 xmlNode* WholeElement(xmlNode* element)
@@ -202,7 +284,7 @@ bool AddAttribute(xmlNode* node, const std::string& name, const std::string& val
     xmlAttr* const attribute = xmlNewNsProp(node, 0, ToEngine(name), ToEngine(value));
     if (attribute != 0 && !IsWhole(attribute, value))
     {
-        ForgetId(attribute);
+        ForgetIdsWithin(reinterpret_cast<xmlNode*>(attribute));
         xmlRemoveProp(attribute);
         return false;
     }
@@ -211,16 +293,26 @@ bool AddAttribute(xmlNode* node, const std::string& name, const std::string& val
 
 void ReplaceContent(xmlNode* node, const std::string& text)
 {
-    ForgetIdOf(node);
-    for (xmlNode* child = node->children; child != 0; child = child->next)
+    if (HasContent(node))
     {
-        ForgetIdsWithin(child);
+        for (xmlNode* child = node->children; child != 0; child = child->next)
+        {
+            ForgetIdsWithin(child);
+        }
     }
-    xmlNodeSetContent(node, ToEngine(text));
+    // Some engines take this kind, which no document has, for a text.
+    if (node->type != XML_ENTITY_NODE)
+    {
+        xmlNodeSetContent(node, ToEngine(text));
+    }
 }
 
 void RemoveChildren(xmlNode* node)
 {
+    if (IsDocument(node))
+    {
+        ForgetAllIds(node->doc);
+    }
     while (node->children != 0)
     {
         FreeFromTree(node->children);
@@ -233,13 +325,17 @@ void RemoveAttributes(xmlNode* node)
     bool removed = true;
     while (removed && AttributesOf(node) != 0)
     {
-        ForgetId(AttributesOf(node));
+        ForgetIdsWithin(reinterpret_cast<xmlNode*>(AttributesOf(node)));
         removed = xmlRemoveProp(AttributesOf(node)) == 0;
     }
 }
 
 void FreeFromTree(xmlNode* node)
 {
+    if (node->type == XML_DTD_NODE)
+    {
+        ForgetAllIds(node->doc);
+    }
     ForgetIdsWithin(node);
     xmlUnlinkNode(node);
     xmlFreeNode(node);

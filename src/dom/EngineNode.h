@@ -86,13 +86,16 @@ bool CanHoldChildren(const xmlNode* node);
 /** @return whether an element can be linked beside @p node, which may be null. */
 bool CanHaveSiblings(const xmlNode* node);
 
-/**
- * @return whether what lies below @p node, which may be null, is its own to free: not what a
- *         document, a DTD or a declaration holds, nor what an entity reference refers to.
- */
-bool OwnsItsContent(const xmlNode* node);
+// What an operation would do to @p node, which may be null: it is refused where that would leave a
+// pointer to freed memory behind.
 
-/** @return whether @p node can be freed without others pointing to it. */
+/** @return whether content can be set; not if it would be that of an entity's declaration. */
+bool CanTakeContent(const xmlNode* node);
+
+/** @return whether the children can be freed; a declaration is in the tables of its DTD, too. */
+bool CanBeCleared(const xmlNode* node);
+
+/** @return whether it can be freed; references point to the entities that a DTD declares. */
 bool CanBeRemoved(const xmlNode* node);
 
 /**
@@ -104,16 +107,16 @@ xmlNode* WholeElement(xmlNode* element);
 /** Adds an attribute to @p node. @return whether the engine made it, name and value and all. */
 bool AddAttribute(xmlNode* node, const std::string& name, const std::string& value);
 
-/** Replaces the content of @p node, which owns it. */
+/** Replaces the content of @p node, which can take it; of a kind without content it has none. */
 void ReplaceContent(xmlNode* node, const std::string& text);
 
-/** Removes every child of @p node, which owns them. */
+/** Removes every child of @p node, which can be cleared. */
 void RemoveChildren(xmlNode* node);
 
 /** Removes every attribute of @p node. */
 void RemoveAttributes(xmlNode* node);
 
-/** Takes @p node out of its tree and frees it with all that it holds. */
+/** Takes @p node, which can be removed, out of its tree and frees it with all that it holds. */
 void FreeFromTree(xmlNode* node);
 
 } // namespace kx

@@ -1,6 +1,8 @@
 #include "DomTest.h"
 
+#include <libxml/hash.h>
 #include <libxml/parser.h>
+#include <libxml/valid.h>
 #include <libxml/xpath.h>
 
 namespace kxtest
@@ -14,7 +16,51 @@ const char* const kDocument =
     "<net id=\"1\" mode=\"on\"><port>1</port><port>2</port><Port>3</Port><empty/></net>"
     "<?target data?><last/></cfg>";
 
+/** Whether @p node is @p first, a sibling behind it, or hangs below one of them. */
+bool IsAmong(xmlNodePtr first, const void* node)
+{
+    for (xmlNodePtr here = first; here != nullptr; here = here->next)
+    {
+        const bool isElement = here->type == XML_ELEMENT_NODE;
+        const bool isReference = here->type == XML_ENTITY_REF_NODE;
+        if (here == node ||
+            (isElement && IsAmong(reinterpret_cast<xmlNodePtr>(here->properties), node)) ||
+            (!isReference && IsAmong(here->children, node)))
+        {
+            return true;
+        }
+    }
+    return false;
+}
+
+// Called by the engine, whose older headers have the value writable.
+template <class Char>
+void AppendId(void* id, void* attributes, Char* /*value*/)
+{
+    static_cast<std::vector<const void*>*>(attributes)->push_back(static_cast<xmlIDPtr>(id)->attr);
+}
+
 } // namespace
+
+bool IsIn(xmlDocPtr document, const void* node)
+{
+    return document == node || IsAmong(document->children, node);
+}
+
+std::vector<const void*> IdsOf(xmlDocPtr document)
+{
+    std::vector<const void*> attributes;
+    xmlHashScan(static_cast<xmlHashTablePtr>(document->ids), AppendId, &attributes);
+    return attributes;
+}
+
+void ExpectSoundIds(xmlDocPtr document)
+{
+    for (const void* const attribute : IdsOf(document))
+    {
+        EXPECT_TRUE(IsIn(document, attribute)) << "the table of IDs has a freed attribute";
+    }
+}
 
 std::vector<std::string> Names(std::list<CXmlNode> nodes)
 {

@@ -37,6 +37,18 @@ std::vector<std::string> Names(std::list<CXmlNode> nodes);
 /** @return a document with a root element named @p root and without a dictionary, which grows. */
 xmlDocPtr NewDocument(const char* root);
 
+/**
+ * @return whether @p node is @p document or a node or attribute in it, wherever it hangs. Only the
+ *         pointer is looked at: the node may have been freed.
+ */
+bool IsIn(xmlDocPtr document, const void* node);
+
+/** @return the attributes that the engine's table of IDs points to. */
+std::vector<const void*> IdsOf(xmlDocPtr document);
+
+/** Every attribute in the table of IDs is in the document. */
+void ExpectSoundIds(xmlDocPtr document);
+
 /** One document that the suite talks about, and helpers to look at it past the library. */
 class DomTest : public testing::Test
 {

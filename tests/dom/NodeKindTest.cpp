@@ -7,6 +7,7 @@
 #include <libxml/parser.h>
 #include <libxml/xpath.h>
 
+#include <algorithm>
 #include <map>
 #include <memory>
 #include <optional>
@@ -22,21 +23,18 @@ const char* const kXml = "<!DOCTYPE a [\n"
                          "<!ATTLIST a id ID #IMPLIED d CDATA \"dflt\">\n"
                          "<!ENTITY e \"words\">\n"
                          "<!ENTITY m \"<x>one</x>\">\n"
+                         "<!ENTITY % p \"\">\n"
                          "]>\n"
                          "<a id=\"i1\" q=\"v &e; w\" xmlns:p=\"urn:p\" "
                          "p:r=\"s\"><b>text</b>piece<!--comment--><?pi data?>"
                          "<![CDATA[cdata]]>&m;<c/></a>\n";
 
-/** What the operations answer that depend on the kind of node. */
-struct Answers
+/** How a kind of node reads. */
+struct Kind
 {
+    const char* title;
     int type;
     const char* name;
-    int setContent = 0;
-    int clear = 0;
-    int remove = 0;
-    bool addsChild = true;
-    bool addsSibling = false;
     bool hasAttributes = false;
     const char* parent = "";
     const char* firstChild = "";
@@ -45,10 +43,282 @@ struct Answers
     const char* content = "";
 };
 
-struct Kind
+const Kind kKinds[] = {
+    {"Element", 1, "a", true, "", "b"},
+    {"InnerElement", 1, "b", false, "a", "", "c", "", "text"},
+    {"Attribute", 2, "r", false, "a", "", "", "", "s"},
+    {"IdAttribute", 2, "id", false, "a", "", "", "", "i1"},
+    {"AttributeText", 3, "text"},
+    {"IdAttributeText", 3, "text"},
+    {"AttributeEntityReference", 5, "e"},
+    {"Text", 3, "text", false, "a", "", "c", "b"},
+    {"Cdata", 4, "", false, "a", "", "c", "b"},
+    {"EntityReference", 5, "m", false, "a", "", "c", "b"},
+    {"UndeclaredReference", 5, "u", false, "b"},
+    {"ProcessingInstruction", 7, "pi", false, "a", "", "c", "b"},
+    {"Comment", 8, "comment", false, "a", "", "c", "b"},
+    {"Document", 9, "", false, "", "a"},
+    {"DocumentWithoutEntities", 9, "", false, "", "a"},
+    {"HtmlDocument", 13, "", false, "", "html"},
+    {"Fragment", 11, "", false, "", "f"},
+    {"Dtd", 14, "a", false, "", "", "a"},
+    {"DtdWithElement", 14, "a", false, "", "", "a"},
+    {"DtdWithAttribute", 14, "a", false, "", "", "a"},
+    {"DtdWithParameterEntities", 14, "a", false, "", "", "a"},
+    {"DtdWithComment", 14, "a", false, "", "", "a"},
+    {"EmptyDtd", 14, "a", false, "", "", "a"},
+    {"CommentInDtd", 8, "comment"},
+    {"ElementDeclaration", 15, "a"},
+    {"AttributeDeclaration", 16, "id"},
+    {"EntityDeclaration", 17, "m", false, "", "x"},
+    {"ParameterEntityDeclaration", 17, "p"},
+    {"EntityContent", 1, "x", false, "", "", "", "", "one"},
+    {"Namespace", 18, ""},
+    {"XIncludeStart", 19, "include", false, "b"},
+    {"XIncludeEnd", 20, "include", false, "b"},
+    // No document has these; a client may have made one by hand.
+    {"EntityNode", 6, "hand", false, "b"},
+    {"DocumentTypeNode", 10, "hand", false, "b"},
+    {"NotationNode", 12, "hand", false, "b"},
+    {"UnknownNode", 0, "hand", false, "b"},
+};
+
+enum Effect
 {
-    const char* title;
-    Answers answers;
+    Unchanged, ///< the document is saved as before
+    Replaced,  ///< its content is the text that was set
+    Emptied,   ///< neither children nor attributes are left
+    Extended,  ///< the document is saved with one element more, or holds one that is not saved
+    Gone       ///< the node was freed
+};
+
+/** What an operation answers on a kind of node, and what it does. */
+struct Outcome
+{
+    const char* operation;
+    const char* kind;
+    const char* answer;
+    Effect effect;
+};
+
+// A refusal answers 22 or a null handle. The reasons are those of CXmlNode.h.
+const Outcome kOutcomes[] = {
+    {"SetContent", "Element", "0", Replaced},
+    {"SetContent", "InnerElement", "0", Replaced},
+    {"SetContent", "Attribute", "0", Replaced},
+    {"SetContent", "IdAttribute", "0", Replaced},
+    {"SetContent", "AttributeText", "0", Replaced},
+    {"SetContent", "IdAttributeText", "0", Replaced},
+    {"SetContent", "AttributeEntityReference", "22", Unchanged},
+    {"SetContent", "Text", "0", Replaced},
+    {"SetContent", "Cdata", "0", Replaced},
+    {"SetContent", "EntityReference", "22", Unchanged},
+    {"SetContent", "UndeclaredReference", "0", Unchanged},
+    {"SetContent", "ProcessingInstruction", "0", Replaced},
+    {"SetContent", "Comment", "0", Replaced},
+    {"SetContent", "Document", "0", Unchanged},
+    {"SetContent", "DocumentWithoutEntities", "0", Unchanged},
+    {"SetContent", "HtmlDocument", "0", Unchanged},
+    {"SetContent", "Fragment", "0", Replaced},
+    {"SetContent", "Dtd", "0", Unchanged},
+    {"SetContent", "DtdWithElement", "0", Unchanged},
+    {"SetContent", "DtdWithAttribute", "0", Unchanged},
+    {"SetContent", "DtdWithParameterEntities", "0", Unchanged},
+    {"SetContent", "DtdWithComment", "0", Unchanged},
+    {"SetContent", "EmptyDtd", "0", Unchanged},
+    {"SetContent", "CommentInDtd", "0", Replaced},
+    {"SetContent", "ElementDeclaration", "0", Unchanged},
+    {"SetContent", "AttributeDeclaration", "0", Unchanged},
+    {"SetContent", "EntityDeclaration", "0", Unchanged},
+    {"SetContent", "ParameterEntityDeclaration", "0", Unchanged},
+    {"SetContent", "EntityContent", "0", Replaced},
+    {"SetContent", "Namespace", "0", Unchanged},
+    {"SetContent", "XIncludeStart", "0", Unchanged},
+    {"SetContent", "XIncludeEnd", "0", Unchanged},
+    {"SetContent", "EntityNode", "0", Unchanged},
+    {"SetContent", "DocumentTypeNode", "0", Unchanged},
+    {"SetContent", "NotationNode", "0", Unchanged},
+    {"SetContent", "UnknownNode", "0", Unchanged},
+    {"ClearNode", "Element", "0", Emptied},
+    {"ClearNode", "InnerElement", "0", Emptied},
+    {"ClearNode", "Attribute", "0", Emptied},
+    {"ClearNode", "IdAttribute", "0", Emptied},
+    {"ClearNode", "AttributeText", "0", Unchanged},
+    {"ClearNode", "IdAttributeText", "0", Unchanged},
+    {"ClearNode", "AttributeEntityReference", "22", Unchanged},
+    {"ClearNode", "Text", "0", Unchanged},
+    {"ClearNode", "Cdata", "0", Unchanged},
+    {"ClearNode", "EntityReference", "22", Unchanged},
+    {"ClearNode", "UndeclaredReference", "0", Unchanged},
+    {"ClearNode", "ProcessingInstruction", "0", Unchanged},
+    {"ClearNode", "Comment", "0", Unchanged},
+    {"ClearNode", "Document", "0", Emptied},
+    {"ClearNode", "DocumentWithoutEntities", "0", Emptied},
+    {"ClearNode", "HtmlDocument", "0", Emptied},
+    {"ClearNode", "Fragment", "0", Emptied},
+    {"ClearNode", "Dtd", "22", Unchanged},
+    {"ClearNode", "DtdWithElement", "22", Unchanged},
+    {"ClearNode", "DtdWithAttribute", "22", Unchanged},
+    {"ClearNode", "DtdWithParameterEntities", "22", Unchanged},
+    {"ClearNode", "DtdWithComment", "0", Emptied},
+    {"ClearNode", "EmptyDtd", "0", Unchanged},
+    {"ClearNode", "CommentInDtd", "0", Unchanged},
+    {"ClearNode", "ElementDeclaration", "0", Unchanged},
+    {"ClearNode", "AttributeDeclaration", "0", Unchanged},
+    {"ClearNode", "EntityDeclaration", "22", Unchanged},
+    {"ClearNode", "ParameterEntityDeclaration", "22", Unchanged},
+    {"ClearNode", "EntityContent", "0", Emptied},
+    {"ClearNode", "Namespace", "22", Unchanged},
+    {"ClearNode", "XIncludeStart", "0", Unchanged},
+    {"ClearNode", "XIncludeEnd", "0", Unchanged},
+    {"ClearNode", "EntityNode", "22", Unchanged},
+    {"ClearNode", "DocumentTypeNode", "22", Unchanged},
+    {"ClearNode", "NotationNode", "22", Unchanged},
+    {"ClearNode", "UnknownNode", "22", Unchanged},
+    {"RemoveNode", "Element", "0", Gone},
+    {"RemoveNode", "InnerElement", "0", Gone},
+    {"RemoveNode", "Attribute", "0", Gone},
+    {"RemoveNode", "IdAttribute", "0", Gone},
+    {"RemoveNode", "AttributeText", "0", Gone},
+    {"RemoveNode", "IdAttributeText", "0", Gone},
+    {"RemoveNode", "AttributeEntityReference", "0", Gone},
+    {"RemoveNode", "Text", "0", Gone},
+    {"RemoveNode", "Cdata", "0", Gone},
+    {"RemoveNode", "EntityReference", "0", Gone},
+    {"RemoveNode", "UndeclaredReference", "0", Gone},
+    {"RemoveNode", "ProcessingInstruction", "0", Gone},
+    {"RemoveNode", "Comment", "0", Gone},
+    {"RemoveNode", "Document", "22", Unchanged},
+    {"RemoveNode", "DocumentWithoutEntities", "22", Unchanged},
+    {"RemoveNode", "HtmlDocument", "22", Unchanged},
+    {"RemoveNode", "Fragment", "0", Gone},
+    {"RemoveNode", "Dtd", "22", Unchanged},
+    {"RemoveNode", "DtdWithElement", "0", Gone},
+    {"RemoveNode", "DtdWithAttribute", "0", Gone},
+    {"RemoveNode", "DtdWithParameterEntities", "0", Gone},
+    {"RemoveNode", "DtdWithComment", "0", Gone},
+    {"RemoveNode", "EmptyDtd", "0", Gone},
+    {"RemoveNode", "CommentInDtd", "0", Gone},
+    {"RemoveNode", "ElementDeclaration", "22", Unchanged},
+    {"RemoveNode", "AttributeDeclaration", "22", Unchanged},
+    {"RemoveNode", "EntityDeclaration", "22", Unchanged},
+    {"RemoveNode", "ParameterEntityDeclaration", "22", Unchanged},
+    {"RemoveNode", "EntityContent", "0", Gone},
+    {"RemoveNode", "Namespace", "22", Unchanged},
+    {"RemoveNode", "XIncludeStart", "0", Gone},
+    {"RemoveNode", "XIncludeEnd", "0", Gone},
+    {"RemoveNode", "EntityNode", "22", Unchanged},
+    {"RemoveNode", "DocumentTypeNode", "22", Unchanged},
+    {"RemoveNode", "NotationNode", "22", Unchanged},
+    {"RemoveNode", "UnknownNode", "22", Unchanged},
+    {"RemoveChildNode", "Element", "22", Unchanged},
+    {"RemoveChildNode", "InnerElement", "0", Gone},
+    {"RemoveChildNode", "Attribute", "22", Unchanged},
+    {"RemoveChildNode", "IdAttribute", "22", Unchanged},
+    {"RemoveChildNode", "AttributeText", "22", Unchanged},
+    {"RemoveChildNode", "IdAttributeText", "22", Unchanged},
+    {"RemoveChildNode", "AttributeEntityReference", "22", Unchanged},
+    {"RemoveChildNode", "Text", "0", Gone},
+    {"RemoveChildNode", "Cdata", "22", Unchanged},
+    {"RemoveChildNode", "EntityReference", "0", Gone},
+    {"RemoveChildNode", "UndeclaredReference", "0", Gone},
+    {"RemoveChildNode", "ProcessingInstruction", "0", Gone},
+    {"RemoveChildNode", "Comment", "0", Gone},
+    {"RemoveChildNode", "Document", "22", Unchanged},
+    {"RemoveChildNode", "DocumentWithoutEntities", "22", Unchanged},
+    {"RemoveChildNode", "HtmlDocument", "22", Unchanged},
+    {"RemoveChildNode", "Fragment", "22", Unchanged},
+    {"RemoveChildNode", "Dtd", "22", Unchanged},
+    {"RemoveChildNode", "DtdWithElement", "22", Unchanged},
+    {"RemoveChildNode", "DtdWithAttribute", "22", Unchanged},
+    {"RemoveChildNode", "DtdWithParameterEntities", "22", Unchanged},
+    {"RemoveChildNode", "DtdWithComment", "22", Unchanged},
+    {"RemoveChildNode", "EmptyDtd", "22", Unchanged},
+    {"RemoveChildNode", "CommentInDtd", "22", Unchanged},
+    {"RemoveChildNode", "ElementDeclaration", "22", Unchanged},
+    {"RemoveChildNode", "AttributeDeclaration", "22", Unchanged},
+    {"RemoveChildNode", "EntityDeclaration", "22", Unchanged},
+    {"RemoveChildNode", "ParameterEntityDeclaration", "22", Unchanged},
+    {"RemoveChildNode", "EntityContent", "22", Unchanged},
+    {"RemoveChildNode", "Namespace", "22", Unchanged},
+    {"RemoveChildNode", "XIncludeStart", "0", Gone},
+    {"RemoveChildNode", "XIncludeEnd", "0", Gone},
+    {"RemoveChildNode", "EntityNode", "22", Unchanged},
+    {"RemoveChildNode", "DocumentTypeNode", "22", Unchanged},
+    {"RemoveChildNode", "NotationNode", "22", Unchanged},
+    {"RemoveChildNode", "UnknownNode", "22", Unchanged},
+    {"AddChildNode", "Element", "handle", Extended},
+    {"AddChildNode", "InnerElement", "handle", Extended},
+    {"AddChildNode", "Attribute", "handle", Extended},
+    {"AddChildNode", "IdAttribute", "handle", Extended},
+    {"AddChildNode", "AttributeText", "handle", Extended},
+    {"AddChildNode", "IdAttributeText", "handle", Extended},
+    {"AddChildNode", "AttributeEntityReference", "null", Unchanged},
+    {"AddChildNode", "Text", "handle", Extended},
+    {"AddChildNode", "Cdata", "handle", Extended},
+    {"AddChildNode", "EntityReference", "null", Unchanged},
+    {"AddChildNode", "UndeclaredReference", "null", Unchanged},
+    {"AddChildNode", "ProcessingInstruction", "handle", Extended},
+    {"AddChildNode", "Comment", "handle", Extended},
+    {"AddChildNode", "Document", "handle", Extended},
+    {"AddChildNode", "DocumentWithoutEntities", "handle", Extended},
+    {"AddChildNode", "HtmlDocument", "handle", Extended},
+    {"AddChildNode", "Fragment", "handle", Extended},
+    {"AddChildNode", "Dtd", "handle", Extended},
+    {"AddChildNode", "DtdWithElement", "handle", Extended},
+    {"AddChildNode", "DtdWithAttribute", "handle", Extended},
+    {"AddChildNode", "DtdWithParameterEntities", "handle", Extended},
+    {"AddChildNode", "DtdWithComment", "handle", Extended},
+    {"AddChildNode", "EmptyDtd", "handle", Extended},
+    {"AddChildNode", "CommentInDtd", "handle", Extended},
+    {"AddChildNode", "ElementDeclaration", "null", Unchanged},
+    {"AddChildNode", "AttributeDeclaration", "null", Unchanged},
+    {"AddChildNode", "EntityDeclaration", "null", Unchanged},
+    {"AddChildNode", "ParameterEntityDeclaration", "null", Unchanged},
+    {"AddChildNode", "EntityContent", "handle", Extended},
+    {"AddChildNode", "Namespace", "null", Unchanged},
+    {"AddChildNode", "XIncludeStart", "handle", Extended},
+    {"AddChildNode", "XIncludeEnd", "handle", Extended},
+    {"AddChildNode", "EntityNode", "null", Unchanged},
+    {"AddChildNode", "DocumentTypeNode", "null", Unchanged},
+    {"AddChildNode", "NotationNode", "null", Unchanged},
+    {"AddChildNode", "UnknownNode", "null", Unchanged},
+    {"AddSiblingNode", "Element", "null", Unchanged},
+    {"AddSiblingNode", "InnerElement", "handle", Extended},
+    {"AddSiblingNode", "Attribute", "null", Unchanged},
+    {"AddSiblingNode", "IdAttribute", "null", Unchanged},
+    {"AddSiblingNode", "AttributeText", "null", Unchanged},
+    {"AddSiblingNode", "IdAttributeText", "null", Unchanged},
+    {"AddSiblingNode", "AttributeEntityReference", "null", Unchanged},
+    {"AddSiblingNode", "Text", "handle", Extended},
+    {"AddSiblingNode", "Cdata", "handle", Extended},
+    {"AddSiblingNode", "EntityReference", "handle", Extended},
+    {"AddSiblingNode", "UndeclaredReference", "handle", Extended},
+    {"AddSiblingNode", "ProcessingInstruction", "handle", Extended},
+    {"AddSiblingNode", "Comment", "handle", Extended},
+    {"AddSiblingNode", "Document", "null", Unchanged},
+    {"AddSiblingNode", "DocumentWithoutEntities", "null", Unchanged},
+    {"AddSiblingNode", "HtmlDocument", "null", Unchanged},
+    {"AddSiblingNode", "Fragment", "null", Unchanged},
+    {"AddSiblingNode", "Dtd", "null", Unchanged},
+    {"AddSiblingNode", "DtdWithElement", "null", Unchanged},
+    {"AddSiblingNode", "DtdWithAttribute", "null", Unchanged},
+    {"AddSiblingNode", "DtdWithParameterEntities", "null", Unchanged},
+    {"AddSiblingNode", "DtdWithComment", "null", Unchanged},
+    {"AddSiblingNode", "EmptyDtd", "null", Unchanged},
+    {"AddSiblingNode", "CommentInDtd", "null", Unchanged},
+    {"AddSiblingNode", "ElementDeclaration", "null", Unchanged},
+    {"AddSiblingNode", "AttributeDeclaration", "null", Unchanged},
+    {"AddSiblingNode", "EntityDeclaration", "null", Unchanged},
+    {"AddSiblingNode", "ParameterEntityDeclaration", "null", Unchanged},
+    {"AddSiblingNode", "EntityContent", "null", Unchanged},
+    {"AddSiblingNode", "Namespace", "null", Unchanged},
+    {"AddSiblingNode", "XIncludeStart", "handle", Extended},
+    {"AddSiblingNode", "XIncludeEnd", "handle", Extended},
+    {"AddSiblingNode", "EntityNode", "handle", Extended},
+    {"AddSiblingNode", "DocumentTypeNode", "handle", Extended},
+    {"AddSiblingNode", "NotationNode", "handle", Extended},
+    {"AddSiblingNode", "UnknownNode", "handle", Extended},
 };
 
 std::ostream& operator<<(std::ostream& out, const Kind& kind)
@@ -56,37 +326,33 @@ std::ostream& operator<<(std::ostream& out, const Kind& kind)
     return out << kind.title;
 }
 
-const int kRefused = 22;
+std::ostream& operator<<(std::ostream& out, const Outcome& outcome)
+{
+    return out << outcome.operation << " on " << outcome.kind;
+}
 
-const Kind kKinds[] = {
-    {"Element", {1, "a", 0, 0, 0, true, false, true, "", "b"}},
-    {"InnerElement", {1, "b", 0, 0, 0, true, true, false, "a", "", "c", "", "text"}},
-    {"Attribute", {2, "r", 0, 0, 0, true, false, false, "a", "", "", "", "s"}},
-    {"IdAttribute", {2, "id", 0, 0, 0, true, false, false, "a", "", "", "", "i1"}},
-    {"AttributeText", {3, "text", 0, 0, 0, true, false}},
-    {"IdAttributeText", {3, "text", 0, 0, 0, true, false}},
-    {"AttributeEntityReference", {5, "e", kRefused, kRefused, 0, false, false}},
-    {"Text", {3, "text", 0, 0, 0, true, true, false, "a", "", "c", "b"}},
-    {"Cdata", {4, "", 0, 0, 0, true, true, false, "a", "", "c", "b"}},
-    {"EntityReference", {5, "m", kRefused, kRefused, 0, false, true, false, "a", "", "c", "b"}},
-    {"ProcessingInstruction", {7, "pi", 0, 0, 0, true, true, false, "a", "", "c", "b"}},
-    {"Comment", {8, "comment", 0, 0, 0, true, true, false, "a", "", "c", "b"}},
-    {"Document", {9, "", kRefused, kRefused, kRefused, true, false, false, "", "a"}},
-    {"DocumentWithoutEntities", {9, "", kRefused, kRefused, kRefused, true, false, false, "", "a"}},
-    {"HtmlDocument", {13, "", kRefused, kRefused, kRefused, true, false, false, "", "html"}},
-    {"Fragment", {11, "", 0, 0, 0, true, false, false, "", "f"}},
-    {"Dtd", {14, "a", kRefused, kRefused, kRefused, true, false, false, "", "", "a"}},
-    {"DtdWithoutEntities",
-     {14, "a", kRefused, kRefused, kRefused, true, false, false, "", "", "a"}},
-    {"EmptyDtd", {14, "a", kRefused, kRefused, kRefused, true, false, false, "", "", "a"}},
-    {"CommentInDtd", {8, "comment", 0, 0, 0, true, false}},
-    {"ElementDeclaration", {15, "a", kRefused, kRefused, kRefused, false, false}},
-    {"AttributeDeclaration", {16, "id", kRefused, kRefused, kRefused, false, false}},
-    {"EntityDeclaration", {17, "m", kRefused, kRefused, kRefused, false, false, false, "", "x"}},
-    {"EntityContent", {1, "x", 0, 0, 0, true, false, false, "", "", "", "", "one"}},
-    {"Namespace", {18, "", kRefused, kRefused, kRefused, false, false}},
-    {"XIncludeStart", {19, "include", 0, 0, 0, true, true, false, "b"}},
-    {"XIncludeEnd", {20, "include", 0, 0, 0, true, true, false, "b"}},
+std::string Answer(int status)
+{
+    return std::to_string(status);
+}
+
+std::string Answer(CXmlNode handle)
+{
+    return handle.IsNull() ? "null" : "handle";
+}
+
+const char* const kContent = "new &amp; text";
+
+/** What can be done with a node, and what it answers. */
+const std::map<std::string, std::function<std::string(CXmlNode)>> kOperations = {
+    {"SetContent", [](CXmlNode node) { return Answer(node.SetContent(kContent)); }},
+    {"ClearNode", [](CXmlNode node) { return Answer(node.ClearNode()); }},
+    {"RemoveNode", [](CXmlNode node) { return Answer(CXmlParser().RemoveNode(node)); }},
+    {"RemoveChildNode",
+     [](CXmlNode node) { return Answer(node.Parent().RemoveChildNode(node.Name())); }},
+    {"AddChildNode", [](CXmlNode node) { return Answer(node.AddChildNode("child", "text")); }},
+    {"AddSiblingNode",
+     [](CXmlNode node) { return Answer(node.AddSiblingNode("sibling", "text")); }},
 };
 
 /** A document and one node of it; all is freed with the object, as a client's document would be. */
@@ -95,18 +361,21 @@ class Subject
 public:
     explicit Subject(const std::string& title)
     {
+        const std::map<std::string, std::string> dtds = {
+            {"DocumentWithoutEntities", "[<!ELEMENT a ANY>]"},
+            {"DtdWithElement", "[<!ELEMENT a ANY>]"},
+            {"DtdWithAttribute", "[<!ATTLIST a id ID #IMPLIED>]"},
+            {"DtdWithParameterEntities", "[<!ENTITY % p 'q'><!ENTITY % s SYSTEM 's'>]"},
+            {"DtdWithComment", "[<!--c--><?p?>]"},
+            {"EmptyDtd", "SYSTEM 'a.dtd'"}};
         if (title == "HtmlDocument")
         {
             m_document = htmlNewDocNoDtD(nullptr, nullptr);
             xmlDocSetRootElement(m_document, xmlNewNode(nullptr, Name("html")));
         }
-        else if (title == "DtdWithoutEntities" || title == "DocumentWithoutEntities")
+        else if (dtds.count(title) != 0)
         {
-            m_document = ParseText("<!DOCTYPE a [<!ELEMENT a ANY>]><a/>");
-        }
-        else if (title == "EmptyDtd")
-        {
-            m_document = ParseText("<!DOCTYPE a SYSTEM 'a.dtd'><a/>");
+            m_document = ParseText("<!DOCTYPE a " + dtds.at(title) + "><a id='i1'/>");
         }
         else
         {
@@ -126,15 +395,30 @@ public:
     Subject& operator=(const Subject&) = delete;
 
     xmlDocPtr Document() const { return m_document; }
-    xmlNodePtr Node() const { return m_node; }
 
-    /** To be called when the node was freed. */
-    void NodeIsGone()
+    /** @return the node; null once it was freed. */
+    xmlNodePtr Node() const
     {
-        if (m_node == m_fragment)
+        const bool isInDocument = m_node != m_fragment && m_namespaces == nullptr;
+        return isInDocument && !IsIn(m_document, m_node) ? nullptr : m_node;
+    }
+
+    /** Frees the content that older engines attach to a reference and never free. */
+    void FreeLostContent()
+    {
+        const xmlNodePtr node = Node();
+        if (node != nullptr && node->type == XML_ENTITY_REF_NODE && node->children == nullptr)
         {
-            m_fragment = nullptr;
+            xmlFree(node->content);
+            node->content = nullptr;
         }
+    }
+
+    /** To be called when RemoveNode() was done. */
+    void NodeWasRemoved()
+    {
+        m_node = nullptr;
+        m_fragment = nullptr;
     }
 
 private:
@@ -175,11 +459,18 @@ private:
         return reinterpret_cast<xmlNodePtr>(xmlGetDocEntity(m_document, Name("m")));
     }
 
-    xmlNodePtr XInclude(xmlElementType type) const
+    xmlNodePtr Below(const char* xpath, xmlNodePtr node) const
     {
-        const xmlNodePtr mark = xmlNewDocNode(m_document, nullptr, Name("include"), nullptr);
-        mark->type = type;
-        return xmlAddChild(First("/a/b"), mark);
+        return xmlAddChild(First(xpath), node);
+    }
+
+    /** @return a record of a full node of any type, below an element. */
+    xmlNodePtr Made(const char* name, int type) const
+    {
+        const xmlNodePtr node =
+            Below("/a/b", xmlNewDocNode(m_document, nullptr, Name(name), nullptr));
+        node->type = static_cast<xmlElementType>(type);
+        return node;
     }
 
     xmlNodePtr Fragment()
@@ -209,6 +500,8 @@ private:
             {"Text", [&] { return Child(Root(), XML_TEXT_NODE); }},
             {"Cdata", [&] { return Child(Root(), XML_CDATA_SECTION_NODE); }},
             {"EntityReference", [&] { return Child(Root(), XML_ENTITY_REF_NODE); }},
+            {"UndeclaredReference",
+             [&] { return Below("/a/b", xmlNewReference(m_document, Name("u"))); }},
             {"ProcessingInstruction", [&] { return Child(Root(), XML_PI_NODE); }},
             {"Comment", [&] { return Child(Root(), XML_COMMENT_NODE); }},
             {"Document", [&] { return First("/"); }},
@@ -216,16 +509,24 @@ private:
             {"HtmlDocument", [&] { return reinterpret_cast<xmlNodePtr>(m_document); }},
             {"Fragment", [&] { return Fragment(); }},
             {"Dtd", [&] { return Dtd(); }},
-            {"DtdWithoutEntities", [&] { return Dtd(); }},
+            {"DtdWithElement", [&] { return Dtd(); }},
+            {"DtdWithAttribute", [&] { return Dtd(); }},
+            {"DtdWithParameterEntities", [&] { return Dtd(); }},
+            {"DtdWithComment", [&] { return Dtd(); }},
             {"EmptyDtd", [&] { return Dtd(); }},
             {"CommentInDtd", [&] { return Child(Dtd(), XML_COMMENT_NODE); }},
             {"ElementDeclaration", [&] { return Child(Dtd(), XML_ELEMENT_DECL); }},
             {"AttributeDeclaration", [&] { return Child(Dtd(), XML_ATTRIBUTE_DECL); }},
             {"EntityDeclaration", [&] { return Entity(); }},
+            {"ParameterEntityDeclaration", [&] { return Dtd()->last; }},
             {"EntityContent", [&] { return Entity()->children; }},
             {"Namespace", [&] { return Namespace(); }},
-            {"XIncludeStart", [&] { return XInclude(XML_XINCLUDE_START); }},
-            {"XIncludeEnd", [&] { return XInclude(XML_XINCLUDE_END); }},
+            {"XIncludeStart", [&] { return Made("include", XML_XINCLUDE_START); }},
+            {"XIncludeEnd", [&] { return Made("include", XML_XINCLUDE_END); }},
+            {"EntityNode", [&] { return Made("hand", XML_ENTITY_NODE); }},
+            {"DocumentTypeNode", [&] { return Made("hand", XML_DOCUMENT_TYPE_NODE); }},
+            {"NotationNode", [&] { return Made("hand", XML_NOTATION_NODE); }},
+            {"UnknownNode", [&] { return Made("hand", 30); }},
         };
         return finders.at(title)();
     }
@@ -236,10 +537,17 @@ private:
     xmlXPathObjectPtr m_namespaces = nullptr;
 };
 
-class NodeKindTest : public testing::TestWithParam<Kind>
+template <class Record>
+xmlNodePtr AsNode(Record* record)
+{
+    return reinterpret_cast<xmlNodePtr>(record);
+}
+
+/** The document of a kind, and whether all of it is freed. */
+class KindTest
 {
 protected:
-    NodeKindTest() : m_answers(GetParam().answers)
+    explicit KindTest(const std::string& title) : m_title(title)
     {
         // What the engine sets up once is not in the balance.
         m_subject = Renew();
@@ -249,19 +557,30 @@ protected:
         m_subject = Renew();
     }
 
-    ~NodeKindTest() override
+    virtual ~KindTest()
     {
         ExpectSound();
         m_subject.reset();
         EXPECT_EQ(m_kept, m_memory->Live()) << "every node is freed with its document";
     }
 
-    std::unique_ptr<Subject> Renew() { return std::make_unique<Subject>(GetParam().title); }
+    std::unique_ptr<Subject> Renew() const { return std::make_unique<Subject>(m_title); }
 
-    CXmlNode Handle() { return CXmlNode(m_subject->Node()); }
+    CXmlNode Handle() const { return CXmlNode(m_subject->Node()); }
+
+    /** Does @p operation on the subject. @return what it answered. */
+    std::string Do(const std::string& operation)
+    {
+        const std::string answer = kOperations.at(operation)(Handle());
+        if (operation == "RemoveNode" && answer == "0")
+        {
+            m_subject->NodeWasRemoved();
+        }
+        return answer;
+    }
 
     /** The document can be saved and walked from end to end, whatever was done to it. */
-    void ExpectSound()
+    void ExpectSound() const
     {
         Serialized(m_subject->Document());
         const xmlXPathContextPtr context = xmlXPathNewContext(m_subject->Document());
@@ -272,39 +591,136 @@ protected:
                 xmlXPathEvalExpression(reinterpret_cast<const xmlChar*>(xpath), context));
         }
         xmlXPathFreeContext(context);
+        ExpectSoundIds(m_subject->Document());
     }
 
-    void ExpectUnchanged()
+    void ExpectUnchanged() const
     {
         const std::string now = Serialized(m_subject->Document());
         EXPECT_EQ(Serialized(Renew()->Document()), now);
     }
 
+    const std::string m_title;
     std::optional<EngineMemory> m_memory;
-    const Answers m_answers;
     std::unique_ptr<Subject> m_subject;
+    long m_kept = 0; ///< buffers that stay allocated by contract
+};
+
+class OutcomeTest : public KindTest, public testing::TestWithParam<Outcome>
+{
+protected:
+    OutcomeTest() : KindTest(GetParam().kind) {}
+
+    void Expect(Effect effect)
+    {
+        switch (effect)
+        {
+        case Unchanged:
+            ExpectUnchanged();
+            break;
+        case Replaced:
+            EXPECT_EQ(IsElementLike() ? "new & text" : kContent, Content());
+            break;
+        case Emptied:
+            EXPECT_EQ(nullptr, m_subject->Node()->children);
+            EXPECT_EQ(nullptr, m_subject->Node()->last);
+            EXPECT_TRUE(Handle().GetAttributeItems().empty());
+            break;
+        case Extended:
+            EXPECT_TRUE(Handle().LastChild().Name() == "child" ||
+                        Handle().Parent().LastChild().Name() == "sibling");
+            break;
+        case Gone:
+            EXPECT_EQ(nullptr, m_subject->Node());
+            break;
+        }
+    }
+
+private:
+    /** Elements, attributes and fragments have content below them, others their own. */
+    bool IsElementLike() const
+    {
+        const int type = Handle().Type();
+        return type == NODE_ELEMENT || type == NODE_ATTRIBUTE || type == NODE_DOCUMENT_FRAG;
+    }
+
+    std::string Content() const
+    {
+        xmlChar* const content = xmlNodeGetContent(m_subject->Node());
+        const std::string text(reinterpret_cast<const char*>(content));
+        xmlFree(content);
+        return text;
+    }
+};
+
+class NodeKindTest : public KindTest, public testing::TestWithParam<Kind>
+{
+protected:
+    NodeKindTest() : KindTest(GetParam().title) {}
+
+    /** Whatever reads, on a node that may have gone, but GetContent, whose text would stay. */
+    static void Read(CXmlNode node)
+    {
+        node.Name();
+        node.Parent();
+        node.FirstChild();
+        node.LastChild();
+        node.NextSibling();
+        node.PrevSibling();
+        node.Children();
+        node.FindAllChildNodes("b");
+        node.GetAttributeItems();
+    }
+
     CXmlParser m_parser;
-    long m_kept = 0; ///< buffers that GetContent leaves behind by contract
 };
 
 } // namespace
+
+TEST_P(OutcomeTest, IsThatOfTheTable)
+{
+    const std::string operation = GetParam().operation;
+    LogRecorder log(kMaskAll & ~kMaskTrace);
+    EXPECT_EQ(GetParam().answer, Do(operation));
+    EXPECT_EQ(Records(), log.Take());
+    Expect(GetParam().effect);
+    if (m_subject->Node() != nullptr && operation != "RemoveChildNode")
+    {
+        EXPECT_EQ(GetParam().answer, Do(operation)) << "the second time";
+    }
+    const bool isLost = operation == "SetContent" && m_title == "UndeclaredReference";
+    m_kept = isLost && LIBXML_VERSION < 21400 ? 1 : 0; // see leaks.supp
+}
+
+TEST_P(NodeKindTest, IsInTheTableOnceForEachOperation)
+{
+    for (const auto& operation : kOperations)
+    {
+        EXPECT_EQ(1, std::count_if(std::begin(kOutcomes), std::end(kOutcomes),
+                                   [&](const Outcome& outcome) {
+                                       return outcome.operation == operation.first &&
+                                              outcome.kind == m_title;
+                                   }))
+            << operation.first;
+    }
+}
 
 TEST_P(NodeKindTest, IsToldByTypeAndName)
 {
     ASSERT_NE(nullptr, m_subject->Node());
     EXPECT_FALSE(Handle().IsNull());
-    EXPECT_EQ(m_answers.type, Handle().Type());
-    EXPECT_EQ(m_answers.name, Handle().Name());
+    EXPECT_EQ(GetParam().type, Handle().Type());
+    EXPECT_EQ(GetParam().name, Handle().Name());
 }
 
 TEST_P(NodeKindTest, IsNavigatedFrom)
 {
-    EXPECT_EQ(m_answers.parent, Handle().Parent().Name());
-    EXPECT_EQ(m_answers.firstChild, Handle().FirstChild().Name());
-    EXPECT_EQ(m_answers.next, Handle().NextSibling().Name());
-    EXPECT_EQ(m_answers.previous, Handle().PrevSibling().Name());
-    EXPECT_EQ(*m_answers.firstChild == '\0', Handle().LastChild().IsNull());
-    EXPECT_EQ(*m_answers.firstChild == '\0', Handle().Children().empty());
+    EXPECT_EQ(GetParam().parent, Handle().Parent().Name());
+    EXPECT_EQ(GetParam().firstChild, Handle().FirstChild().Name());
+    EXPECT_EQ(GetParam().next, Handle().NextSibling().Name());
+    EXPECT_EQ(GetParam().previous, Handle().PrevSibling().Name());
+    EXPECT_EQ(*GetParam().firstChild == '\0', Handle().LastChild().IsNull());
+    EXPECT_EQ(*GetParam().firstChild == '\0', Handle().Children().empty());
 }
 
 TEST_P(NodeKindTest, IsSearchedForChildrenByName)
@@ -324,112 +740,22 @@ TEST_P(NodeKindTest, IsSearchedForChildrenByName)
 
 TEST_P(NodeKindTest, IsReadForContent)
 {
-    EXPECT_EQ(m_answers.content, Handle().GetContent());
-    m_kept = *m_answers.content == '\0' ? 0 : 1;
+    EXPECT_EQ(GetParam().content, Handle().GetContent());
+    m_kept = *GetParam().content == '\0' ? 0 : 1;
 }
 
-TEST_P(NodeKindTest, TakesContentOrRefusesIt)
-{
-    EXPECT_EQ(m_answers.setContent, Handle().SetContent("new &amp; text"));
-    if (m_answers.setContent != 0)
-    {
-        ExpectUnchanged();
-    }
-}
-
-TEST_P(NodeKindTest, TakesEmptyContentAndNewContentAgain)
-{
-    Handle().SetContent("");
-    EXPECT_EQ(m_answers.setContent, Handle().SetContent("x"));
-    Handle().ClearNode();
-}
-
-TEST_P(NodeKindTest, IsClearedOrRefusesIt)
-{
-    EXPECT_EQ(m_answers.clear, Handle().ClearNode());
-    if (m_answers.clear != 0)
-    {
-        ExpectUnchanged();
-    }
-    else
-    {
-        EXPECT_TRUE(Handle().FirstChild().IsNull());
-        EXPECT_TRUE(Handle().GetAttributeItems().empty());
-    }
-    EXPECT_EQ(m_answers.clear, Handle().ClearNode());
-}
-
-TEST_P(NodeKindTest, IsAddedAChildOrRefusesIt)
+TEST_P(NodeKindTest, HoldsAndGivesUpAnAddedChild)
 {
     for (const char* const content : {"", "text"})
     {
-        CXmlNode child = Handle().AddChildNode("child", content);
-        ASSERT_EQ(m_answers.addsChild, !child.IsNull());
-        if (m_answers.addsChild)
+        CXmlNode child = m_parser.AddNewNode(Handle(), "child", content);
+        if (!child.IsNull())
         {
-            EXPECT_EQ("child", Handle().LastChild().Name());
             EXPECT_EQ(content, std::string(content).empty() ? child.GetContent() : "text");
             child.AddChildNode("below", "").AddSiblingNode("beside", "");
         }
-        else
-        {
-            ExpectUnchanged();
-        }
-    }
-}
-
-TEST_P(NodeKindTest, GivesUpAnAddedChild)
-{
-    CXmlNode child = m_parser.AddNewNode(Handle(), "child", "text");
-    ASSERT_EQ(m_answers.addsChild, !child.IsNull());
-    EXPECT_EQ(m_answers.addsChild ? 0 : 22, m_parser.RemoveNode(child));
-    ExpectUnchanged();
-}
-
-TEST_P(NodeKindTest, IsGoneWithItsAddedChildren)
-{
-    Handle().AddChildNode("child", "text");
-    EXPECT_EQ(m_answers.remove, m_parser.RemoveNode(Handle()));
-    if (m_answers.remove == 0)
-    {
-        m_subject->NodeIsGone();
-    }
-}
-
-TEST_P(NodeKindTest, IsAddedASiblingOrRefusesIt)
-{
-    CXmlNode sibling = Handle().AddSiblingNode("sibling", "text");
-    ASSERT_EQ(m_answers.addsSibling, !sibling.IsNull());
-    if (m_answers.addsSibling)
-    {
-        EXPECT_EQ("sibling", Handle().Parent().LastChild().Name());
-    }
-    else
-    {
+        EXPECT_EQ(child.IsNull() ? 22 : 0, m_parser.RemoveNode(child));
         ExpectUnchanged();
-    }
-}
-
-TEST_P(NodeKindTest, IsRemovedOrRefusesIt)
-{
-    EXPECT_EQ(m_answers.remove, m_parser.RemoveNode(Handle()));
-    if (m_answers.remove != 0)
-    {
-        ExpectUnchanged();
-    }
-    else
-    {
-        m_subject->NodeIsGone();
-    }
-}
-
-TEST_P(NodeKindTest, IsRemovedAfterItsContentWasReplaced)
-{
-    Handle().SetContent("other");
-    EXPECT_EQ(m_answers.remove, m_parser.RemoveNode(Handle()));
-    if (m_answers.remove == 0)
-    {
-        m_subject->NodeIsGone();
     }
 }
 
@@ -447,8 +773,8 @@ TEST_P(NodeKindTest, HasAttributesOnlyIfItIsAnElement)
 {
     std::string value = "before";
     const bool isElement = Handle().Type() == NODE_ELEMENT;
-    EXPECT_EQ(m_answers.hasAttributes, !Handle().GetAttributeItems().empty());
-    EXPECT_EQ(m_answers.hasAttributes ? 0 : 22, Handle().GetAttributeValue("id", value));
+    EXPECT_EQ(GetParam().hasAttributes, !Handle().GetAttributeItems().empty());
+    EXPECT_EQ(GetParam().hasAttributes ? 0 : 22, Handle().GetAttributeValue("id", value));
     EXPECT_EQ(isElement ? 0 : 22, Handle().AddNewAttribute("new", "1"));
     EXPECT_EQ(isElement ? 0 : 22, Handle().GetAttributeValue("new", value));
     EXPECT_EQ(0, Handle().RemoveAttribute("new"));
@@ -479,30 +805,42 @@ TEST_P(NodeKindTest, IsAContextForQueries)
     m_subject = Renew();
 }
 
-TEST_P(NodeKindTest, RefusesQuietly)
+TEST_P(NodeKindTest, StaysSafeAfterAnyTwoChanges)
 {
-    LogRecorder log(kMaskAll & ~kMaskTrace);
-    if (m_answers.setContent != 0)
+    const std::map<std::string, std::function<void(CXmlNode)>> others = {
+        {"SetContent of nothing", [](CXmlNode node) { node.SetContent(""); }},
+        {"SetContent of references", [](CXmlNode node) { node.SetContent("a&e;&u;b"); }},
+        {"RemoveChildNode of its own", [](CXmlNode node) { node.RemoveChildNode("b"); }},
+        {"AddNewAttribute", [](CXmlNode node) { node.AddNewAttribute("id", "x"); }},
+        {"ClearNode of the document",
+         [&](CXmlNode) { CXmlNode(AsNode(m_subject->Document())).ClearNode(); }},
+        {"RemoveNode of the DTD", [&](CXmlNode)
+         { m_parser.RemoveNode(CXmlNode(AsNode(m_subject->Document()->intSubset))); }},
+    };
+    std::vector<std::pair<std::string, std::function<void()>>> changes;
+    for (const auto& operation : kOperations)
     {
-        Handle().SetContent("x");
+        changes.emplace_back(operation.first, [&] { Do(operation.first); });
     }
-    if (m_answers.clear != 0)
+    for (const auto& other : others)
     {
-        Handle().ClearNode();
+        changes.emplace_back(other.first, [&] { other.second(Handle()); });
     }
-    if (m_answers.remove != 0)
+    for (const auto& first : changes)
     {
-        m_parser.RemoveNode(Handle());
+        for (const auto& second : changes)
+        {
+            SCOPED_TRACE(first.first + ", " + second.first);
+            m_subject = Renew();
+            first.second();
+            m_subject->FreeLostContent();
+            second.second();
+            m_subject->FreeLostContent();
+            Read(Handle());
+            Serialized(m_subject->Document());
+            ExpectSoundIds(m_subject->Document());
+        }
     }
-    if (!m_answers.addsChild)
-    {
-        Handle().AddChildNode("child", "");
-    }
-    if (!m_answers.addsSibling)
-    {
-        Handle().AddSiblingNode("sibling", "");
-    }
-    EXPECT_EQ(Records(), log.Take());
 }
 
 // --- What the kind alone does not tell
@@ -524,6 +862,47 @@ TEST_F(NodeTest, EntityWhoseContentLiesInTheDocumentIsNotCleared)
     EXPECT_EQ(22, CXmlNode(reinterpret_cast<xmlNodePtr>(entity)).ClearNode());
     EXPECT_EQ(before, Serialized(document));
     entity->children = entity->last = own;
+}
+
+TEST_F(NodeTest, DeclarationThatWasMovedBelowAnElementIsNotRemovedByName)
+{
+    const xmlDocPtr document = Parse("<!DOCTYPE a [<!ELEMENT b ANY>]><a/>");
+    const xmlNodePtr declaration = document->intSubset->children;
+    xmlUnlinkNode(declaration);
+    xmlAddChild(xmlDocGetRootElement(document), declaration);
+    CXmlNode root(xmlDocGetRootElement(document));
+    EXPECT_EQ("b", root.FindChildNode("b").Name());
+    EXPECT_EQ(22, root.RemoveChildNode("b"));
+    EXPECT_EQ(declaration, xmlDocGetRootElement(document)->children);
+    xmlUnlinkNode(declaration);
+}
+
+TEST_F(NodeTest, ClearedDocumentTakesANewRoot)
+{
+    const xmlDocPtr document = Parse(kXml);
+    CXmlNode handle(reinterpret_cast<xmlNodePtr>(document));
+    EXPECT_EQ(0, handle.ClearNode());
+    EXPECT_EQ("<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n", Serialized(document));
+    EXPECT_FALSE(handle.AddChildNode("root", "").IsNull());
+    EXPECT_EQ("<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<root/>\n", Serialized(document));
+}
+
+TEST_F(NodeTest, RemovedDtdIsNoLongerSaved)
+{
+    const xmlDocPtr document = Parse("<!DOCTYPE a [<!ELEMENT a ANY><!ENTITY % p ''>]><a/>");
+    EXPECT_EQ(0, m_parser.RemoveNode(CXmlNode(AsNode(document->intSubset))));
+    EXPECT_EQ(nullptr, document->intSubset);
+    EXPECT_EQ("<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n<a/>\n", Serialized(document));
+}
+
+TEST_F(NodeTest, ExternalSubsetOfADocumentIsRemovedToo)
+{
+    const xmlDocPtr document = Parse("<a/>");
+    const auto name = reinterpret_cast<const xmlChar*>("a");
+    CXmlNode dtd(AsNode(xmlNewDtd(document, name, nullptr, name)));
+    ASSERT_NE(nullptr, document->extSubset);
+    EXPECT_EQ(0, m_parser.RemoveNode(dtd));
+    EXPECT_EQ(nullptr, document->extSubset);
 }
 
 TEST_F(NodeTest, AttributeThatTheEngineDoesNotRemoveEndsTheClearing)
@@ -561,3 +940,8 @@ TEST_F(NodeTest, ChildOfAnAttributeTakesItsNamespace)
 INSTANTIATE_TEST_SUITE_P(All, NodeKindTest, testing::ValuesIn(kKinds),
                          [](const testing::TestParamInfo<Kind>& kind)
                          { return std::string(kind.param.title); });
+
+INSTANTIATE_TEST_SUITE_P(All, OutcomeTest, testing::ValuesIn(kOutcomes),
+                         [](const testing::TestParamInfo<Outcome>& outcome) {
+                             return std::string(outcome.param.operation) + "_" + outcome.param.kind;
+                         });

@@ -323,6 +323,11 @@ extern "C" SetContentResult xmlNodeSetContent(xmlNodePtr node, const xmlChar* co
     return Forward<&xmlNodeSetContent>("xmlNodeSetContent", node, content);
 }
 
+extern "C" void xmlFreeIDTable(xmlIDTablePtr table)
+{
+    Forward<&xmlFreeIDTable>("xmlFreeIDTable", table);
+}
+
 extern "C" int xmlRemoveID(xmlDocPtr document, xmlAttrPtr attribute)
 {
     return Forward<&xmlRemoveID>("xmlRemoveID", document, attribute);
