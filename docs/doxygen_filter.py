@@ -31,7 +31,8 @@ def quotation(text):
 
 
 def filtered(page):
-    in_block, first = False, True
+    in_block = False
+    stem = pathlib.Path(page).stem.lower()
     for line in pathlib.Path(page).read_text().splitlines():
         if line.lstrip().startswith("```"):
             in_block = not in_block
@@ -39,7 +40,7 @@ def filtered(page):
             heading = re.match(r"(##+) (.*)", line)
             if heading:
                 line += f" {{#{name_of(page, heading.group(2))}}}"
-            line = re.sub(r"\]\(#([\w-]+)\)", lambda link: f"](#{pathlib.Path(page).stem.lower()}-{link.group(1)})", line)
+            line = re.sub(r"\]\(#([\w-]+)\)", lambda link: f"](#{stem}-{link.group(1)})", line)
             line = re.sub(r"\]\(([\w-]+)\.md#([\w-]+)\)", r"](#\1-\2)", line)
             line = line.replace("](README.md)", "](index.html)").replace("](../../include)", "](files.html)")
             line = re.sub(r"`([^`]+)`", lambda quoted: quotation(quoted.group(1)), line)
@@ -47,7 +48,8 @@ def filtered(page):
 
 
 def linked(header):
-    return re.sub(r"docs/handbook/([\w-]+)\.md", lambda page: f"[{page[0]}](@ref md_docs_handbook_{page[1].replace('-', '_')})",
+    return re.sub(r"docs/handbook/([\w-]+)\.md",
+                  lambda page: f"[{page[0]}](@ref md_docs_handbook_{page[1].replace('-', '_')})",
                   pathlib.Path(header).read_text())
 
 

@@ -2,8 +2,7 @@
 # Prints the size of the library for ARM, as built by the presets armhf and armel (-Os). Fails if its text exceeds the
 # limit, or if the test of a log gate is compiled to a call.
 # usage: arm_size.sh
-set -euo pipefail
-cd "$(dirname "$0")/.."
+. "$(dirname "$0")/common.sh"
 
 # print_size PRESET TRIPLET LIMIT
 print_size() {

@@ -2,8 +2,7 @@
 # Unpacks the engine for an ARM architecture of Debian into build/sysroot/ARCHITECTURE, where the toolchain files of
 # cmake/toolchains expect it. Downloads once; remove the directory to repeat it.
 # usage: arm_sysroot.sh armhf|armel
-set -euo pipefail
-cd "$(dirname "$0")/.."
+. "$(dirname "$0")/common.sh"
 . scripts/private_apt.sh
 
 architecture=${1:-}

@@ -1,9 +1,7 @@
 #!/usr/bin/env bash
 # Measures this library and others, and writes docs/performance.md from the results. Takes about twenty minutes; other
 # load on the machine distorts the figures.
-set -euo pipefail
-cd "$(dirname "$0")/.."
-. scripts/packages.sh
+. "$(dirname "$0")/common.sh"
 
 need "${build_packages[@]}" "${bench_packages[@]}"
 
@@ -11,7 +9,7 @@ results=build/bench/results
 programs=build/bench/bench
 rm -rf $results
 mkdir -p $results
-{ cmake --preset bench && cmake --build --preset bench; } >build/bench.log 2>&1 || { cat build/bench.log >&2; exit 1; }
+build_preset bench
 
 echo "== allocations"
 $programs/kx_bench_allocations >$results/allocations.json
@@ -23,10 +21,11 @@ rm -f $results/time-*.json
 rounds=9
 for round in $(seq $rounds); do
     echo "== time, round $round of $rounds"
+    # shellcheck disable=SC2001  # a regular expression
     for i in "${!workloads[@]}"; do
         $programs/kx_bench --benchmark_filter="^$(sed 's/[(|)]/\\&/g' <<<"${workloads[i]}")/" \
             --benchmark_repetitions=3 --benchmark_min_time=0.05 --benchmark_enable_random_interleaving=true \
-            --benchmark_out="$(printf '%s/time-%d-%03d.json' $results $round "$i")" --benchmark_out_format=json \
+            --benchmark_out="$(printf '%s/time-%d-%03d.json' $results "$round" "$i")" --benchmark_out_format=json \
             >$results/time.txt 2>&1 || { cat $results/time.txt >&2; exit 1; }
     done
 done

@@ -4,9 +4,7 @@
 # the walks.
 # usage: check_speed.sh [--accept]
 #   --accept  writes the present counts to the file, for an intended change
-set -euo pipefail
-cd "$(dirname "$0")/.."
-. scripts/packages.sh
+. "$(dirname "$0")/common.sh"
 
 margin=3          # percent
 observer_margin=1 # percent: the compiler may choose other registers
@@ -14,10 +12,7 @@ file=bench/instructions.txt
 
 need "${build_packages[@]}" valgrind
 
-log=build/speed.log
-mkdir -p build
-{ cmake --preset bench && cmake --build --preset bench --target kx_bench_guard kx_as_it_is kx_no_watch; } >"$log" 2>&1 ||
-    { cat "$log" >&2; exit 1; }
+build_preset bench --target kx_bench_guard kx_as_it_is kx_no_watch
 
 # Versions outside this project that affect the counts.
 versions() {

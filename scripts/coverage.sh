@@ -1,16 +1,13 @@
 #!/usr/bin/env bash
 # Runs the tests with coverage of lines and branches of the library, writes build/coverage/report/index.html, and fails
 # unless all are covered. Clang counts branches of the source, not those that the compiler adds for exceptions.
-set -euo pipefail
-cd "$(dirname "$0")/.."
-. scripts/packages.sh
+. "$(dirname "$0")/common.sh"
 
 need "${build_packages[@]}" "${test_packages[@]}" llvm libclang-rt-dev
 
 build=build/coverage
-log=$build/coverage.log
-mkdir -p $build
-{ cmake --preset coverage && cmake --build --preset coverage; } >$log 2>&1 || { tail -n 40 $log >&2; exit 1; }
+log=build/coverage.log
+build_preset coverage
 
 rm -rf $build/raw
 if ! LLVM_PROFILE_FILE=$PWD/$build/raw/%4m.profraw ctest --preset coverage >$log 2>&1; then

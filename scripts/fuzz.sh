@@ -3,9 +3,7 @@
 # build/fuzz/findings; write a test for each before you fix it. A run continues with the corpus of the last one, in
 # build/fuzz/corpus.
 # usage: fuzz.sh [TARGET [SECONDS]]
-set -euo pipefail
-cd "$(dirname "$0")/.."
-. scripts/packages.sh
+. "$(dirname "$0")/common.sh"
 
 targets=(keypath document loader)
 seconds=${2:-20}
@@ -17,7 +15,7 @@ need "${build_packages[@]}" "${test_packages[@]}" libclang-rt-dev
 
 build=build/fuzz
 mkdir -p $build/findings
-{ cmake --preset fuzz && cmake --build --preset fuzz; } >$build/build.log 2>&1 || { tail -n 40 $build/build.log >&2; exit 1; }
+build_preset fuzz
 
 # fuzz TARGET
 fuzz() {

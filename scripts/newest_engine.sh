@@ -1,8 +1,7 @@
 #!/usr/bin/env bash
 # Builds the newest libxml2 that Debian has as a source package, into build/libxml2/newest. Queries the newest version
 # each time, and builds it if it is missing.
-set -euo pipefail
-cd "$(dirname "$0")/.."
+. "$(dirname "$0")/common.sh"
 . scripts/private_apt.sh
 
 folder=$PWD/build/libxml2
@@ -19,14 +18,15 @@ rm -rf "$folder/source" "$folder/build" "${folder:?}/$version"
 mkdir -p "$folder/source"
 cd "$folder/source"
 # As clients use it: no programs, no bindings, gzip as in Debian's package.
-{
+build_engine() {
     apt-get source -qq "libxml2=$version" &&
         cmake -G Ninja -S libxml2-*/ -B "$folder/build" -DCMAKE_BUILD_TYPE=RelWithDebInfo \
             -DCMAKE_INSTALL_PREFIX="$folder/$version" -DCMAKE_INSTALL_LIBDIR=lib \
             -DLIBXML2_WITH_PROGRAMS=OFF -DLIBXML2_WITH_TESTS=OFF -DLIBXML2_WITH_PYTHON=OFF \
             -DLIBXML2_WITH_ZLIB=ON &&
         cmake --build "$folder/build" && cmake --install "$folder/build"
-} >"$folder/log" 2>&1 || { cat "$folder/log" >&2; exit 1; }
+}
+quietly "$folder/log" build_engine
 rm -rf "$folder/source" "$folder/build"
 touch "$folder/$version/complete"
 ln -sfn "$version" "$folder/newest"

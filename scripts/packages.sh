@@ -1,3 +1,5 @@
+# shellcheck shell=bash
+# shellcheck disable=SC2034  # the scripts that source this use the lists
 # Installs missing Debian packages. Sourced by the other scripts.
 
 # need PACKAGE... — installs those that are missing; prints nothing if there are none.
@@ -48,3 +50,6 @@ bench_packages=(libbenchmark-dev valgrind python3-matplotlib pkg-config
 
 # For building the Debian packages, and for their tests.
 packaging_packages=(dpkg-dev file fakeroot lintian man-db pkg-config)
+
+# For scripts/style.sh.
+style_packages=(clang-format clang-tidy git pyflakes3 python3-editorconfig shellcheck)

@@ -1,3 +1,4 @@
+# shellcheck shell=bash
 # Provides a private apt configuration for packages of another architecture or release. It has its own lists and
 # cache, so those of the machine are unchanged. Sourced by other scripts.
 

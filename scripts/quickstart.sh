@@ -1,9 +1,7 @@
 #!/usr/bin/env bash
 # Installs what is missing on a bare Debian 12, builds the library and its command-line client, and demonstrates both
 # on a sample configuration. Prints each command that it runs.
-set -euo pipefail
-cd "$(dirname "$0")/.."
-. scripts/packages.sh
+. "$(dirname "$0")/common.sh"
 
 need "${build_packages[@]}"
 
@@ -21,19 +19,17 @@ show() {
     "$@"
 }
 
-# quietly COMMAND... — prints the output of the command only if it fails.
-quietly() {
-    local log=build/quickstart.log
-    mkdir -p build
+# show_quietly COMMAND... — the same, but prints the output of the command only if it fails.
+show_quietly() {
     printf '\n$ %s\n' "$*"
-    "$@" >"$log" 2>&1 || { cat "$log" >&2; exit 1; }
+    quietly build/quickstart.log "$@"
 }
 
 kxconfig=build/release/tools/kxconfig
 file=examples/data/gateway.xml
 
-quietly cmake --preset release
-quietly cmake --build --preset release
+show_quietly cmake --preset release
+show_quietly cmake --build --preset release
 
 show "$kxconfig" get "$file" gateway.name
 show "$kxconfig" get "$file" gateway.network.interface.address

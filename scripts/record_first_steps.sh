@@ -3,8 +3,7 @@
 # clone is of the last commit, in an empty directory.
 # usage: record_first_steps.sh [--check]   --check writes nothing, and fails if the recording is out of date
 # shellcheck disable=SC2016,SC2034  # commands are typed in as they stand
-set -euo pipefail
-cd "$(dirname "$0")/.."
+. "$(dirname "$0")/common.sh"
 
 recording=docs/handbook/first-steps.txt
 PROJECT=$PWD
@@ -80,13 +79,15 @@ END'
 
 # Replaces what changes with each run or each edit of a source: times and source lines of log records, directories.
 steady() {
-    sed -E -e 's/^[0-9]{4}-[0-9-]{5}T[0-9:.]{12} /2026-01-01T12:00:00.000 /' -e 's/^(2026-01-01T12:00:00.000 [a-z]+ [~A-Za-z]+):[0-9]+ /\1:1 /' \
+    sed -E -e 's/^[0-9]{4}-[0-9-]{5}T[0-9:.]{12} /2026-01-01T12:00:00.000 /' \
+        -e 's/^(2026-01-01T12:00:00.000 [a-z]+ [~A-Za-z]+):[0-9]+ /\1:1 /' \
         -e '/^warning: source repository is shallow/d' -e 's/ +$//' -e 's/\$last_status/$?/' -e "s#$empty#/home/me#g"
 }
 
 (cd "$empty" && unset KX_LOG_MASK && session) 2>&1 | steady >"$new"
 if [ "${1:-}" = --check ]; then
-    diff -u "$recording" "$new" || { echo "$recording is not up to date: run scripts/record_first_steps.sh" >&2; exit 1; }
+    diff -u "$recording" "$new" ||
+        { echo "$recording is not up to date: run scripts/record_first_steps.sh" >&2; exit 1; }
     echo "$recording is up to date"
 else
     cp "$new" "$recording"

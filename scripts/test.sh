@@ -2,7 +2,9 @@
 # Installs what is missing, builds and tests.
 # usage: test.sh [STAGE...]
 #
-#   fast     all tests, also under the sanitizers; an outside project builds against the installed library
+#   fast     all tests; an outside project builds against the installed library
+#   style    layout and common mistakes: .editorconfig, clang-format, clang-tidy, shellcheck, pyflakes
+#   sanitize all tests under AddressSanitizer and UndefinedBehaviorSanitizer
 #   package  the Debian packages: installs them into a scratch root, uses and removes them
 #   abi98    all tests with the target's kind of standard library (shared strings, a linear list::size)
 #   engine   all tests with the newest libxml2 that Debian has as a source package
@@ -12,15 +14,12 @@
 #   docs     the reference, without a warning of Doxygen; the recording of a new user's first steps
 #   host     fast and package; the default
 #   all      all stages; CI runs this
-set -euo pipefail
-cd "$(dirname "$0")/.."
-. scripts/packages.sh
+. "$(dirname "$0")/common.sh"
 
 # run_preset NAME — configures, builds and tests with the preset; prints details only of failures.
 run_preset() {
     local log=build/$1.log
-    mkdir -p build
-    { cmake --preset "$1" && cmake --build --preset "$1"; } >"$log" 2>&1 || { cat "$log" >&2; exit 1; }
+    build_preset "$1"
     echo "== $1"
     if ! ctest --preset "$1" >"$log" 2>&1; then
         grep -vE ' Passed |^ +Start ' "$log"
@@ -32,6 +31,18 @@ run_preset() {
 stage_fast() {
     need "${build_packages[@]}" "${test_packages[@]}"
     run_preset dev
+}
+
+stage_style() {
+    if git rev-parse --verify --quiet HEAD >/dev/null; then
+        scripts/style.sh
+    else
+        echo "not a clone: the style is not checked"
+    fi
+}
+
+stage_sanitize() {
+    need "${build_packages[@]}" "${test_packages[@]}"
     run_preset asan
 }
 
@@ -89,6 +100,8 @@ stage_host() {
 
 stage_all() {
     stage_host
+    stage_style
+    stage_sanitize
     stage_docs
     stage_speed
     stage_proof
@@ -100,7 +113,11 @@ stage_all() {
 [ $# -gt 0 ] || set -- host
 for stage in "$@"; do
     declare -F "stage_$stage" >/dev/null ||
-        { echo "$0: no stage \"$stage\"; there are fast, package, abi98, engine, arm, proof, speed, docs, host, all" >&2; exit 2; }
+        {
+            echo "$0: no stage \"$stage\"; there are fast, style, sanitize, package, abi98, engine, arm, proof," \
+                "speed, docs, host, all" >&2
+            exit 2
+        }
 done
 for stage in "$@"; do
     "stage_$stage"

@@ -1,16 +1,14 @@
 #!/usr/bin/env bash
 # Runs the suites, the fuzz corpora and kxconfig under Valgrind. Fails on errors, and on leaks that are not in
 # tests/valgrind.supp.
-set -euo pipefail
-cd "$(dirname "$0")/.."
-. scripts/packages.sh
+. "$(dirname "$0")/common.sh"
 
 need "${build_packages[@]}" "${test_packages[@]}" valgrind libc6-dbg
 
 build=build/dev
 logs=build/valgrind
 mkdir -p $logs
-{ cmake --preset dev && cmake --build --preset dev; } >$logs/build.log 2>&1 || { tail -n 40 $logs/build.log >&2; exit 1; }
+build_preset dev
 
 # check STATUS COMMAND... — runs the command under Valgrind, and fails unless it ends with STATUS. The tests count
 # calls of their own operator new, so Valgrind must not replace it. The slowest program takes about a minute.

@@ -95,4 +95,5 @@ FetchContent) quietly by_fetched_sources && quietly run_by_cmake ;;
 pkg-config) quietly by_pkg_config && run_by_pkg_config ;;
 *) echo "unknown road: $road" >&2; exit 2 ;;
 esac
-echo "$(ls "$source"/clients/*.cpp | wc -l) clients by $road"
+clients=("$source"/clients/*.cpp)
+echo "${#clients[@]} clients by $road"

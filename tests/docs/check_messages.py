@@ -18,7 +18,8 @@ Macro = collections.namedtuple("Macro", "level tag text")  # the level; the posi
 STRING = re.compile(r'"((?:[^"\\]|\\.)*)"')
 DEFINITION = re.compile(r"^#define (KX_\w+)\(([^)]*)\)((?:.*\\\n)*.*)", re.M)
 LEVEL = re.compile(r"\b(LogLevel\w+) = (\d+)")
-FUNCTION = re.compile(r"^(?!using|namespace|class|struct|enum|extern \"C\"\s*\{)[A-Za-z][^;{}(]*?([\w:]*~?\w+)\((?:[^;{}]*)\n\{", re.M)
+FUNCTION = re.compile(r"^(?!using|namespace|class|struct|enum|extern \"C\"\s*\{)"
+                      r"[A-Za-z][^;{}(]*?([\w:]*~?\w+)\((?:[^;{}]*)\n\{", re.M)
 ROW = re.compile(r'^\| `"(.*)"` \| (\d+) \| (.*?) \|', re.M)
 TRACE = {"+", "-"}  # logged by nearly every operation
 

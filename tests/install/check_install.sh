@@ -24,7 +24,7 @@ expected() {
     for header in "$source"/platform/include/*.h; do echo "include/KX_Platform/$(basename "$header")"; done
     printf "$libdir/cmake/KX_XMLConfigParser/KX_XMLConfigParser%s.cmake\n" \
         Config ConfigVersion Targets "Targets-CONFIGURATION"
-    printf "$libdir/lib%s\n" KX_Platform.so{,.1,.1.0.0} KX_XMLConfigParser.so{,.${version%%.*},."$version"}
+    printf "$libdir/lib%s\n" KX_Platform.so{,.1,.1.0.0} KX_XMLConfigParser.so{,."${version%%.*}",."$version"}
     echo "$libdir/pkgconfig/KX_XMLConfigParser.pc"
     echo share/bash-completion/completions/kxconfig
     echo share/doc/KX_XMLConfigParser/CHANGELOG.md

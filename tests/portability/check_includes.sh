@@ -11,6 +11,7 @@ posix='fcntl pthread strings sys/stat sys/time sys/types unistd'
 cxx='algorithm bitset complex deque exception fstream functional iomanip ios iosfwd istream iterator limits list
     locale map memory new numeric ostream queue set sstream stack stdexcept streambuf string typeinfo utility
     valarray vector'
+# shellcheck disable=SC2086  # words
 allowed=$(printf '%s.h\n' $c $posix && printf '%s\n' $cxx)
 
 # FILE:LINE:HEADER of every header of the system.

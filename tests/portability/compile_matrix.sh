@@ -23,7 +23,8 @@ sources="$headers -I$root/src -I$root/platform/host -isystem $engine -DU_SHOW_CP
 platform=$(mktemp -d)
 trap 'rm -rf "$platform"' EXIT
 sed 's/unsigned int xmlConfigParserMask;/unsigned int words[1];/' "$root/platform/include/KxLog.h" >"$platform/KxLog.h"
-! cmp -s "$root/platform/include/KxLog.h" "$platform/KxLog.h" || { echo "KxLog.h has no xmlConfigParserMask" >&2; exit 1; }
+! cmp -s "$root/platform/include/KxLog.h" "$platform/KxLog.h" ||
+    { echo "KxLog.h has no xmlConfigParserMask" >&2; exit 1; }
 
 commands() {
     for compiler in "${compilers[@]}"; do

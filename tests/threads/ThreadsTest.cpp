@@ -1,5 +1,5 @@
-// Several threads at once, each with objects of its own: what docs/handbook/threads.md allows. The tests
-// mean most under ThreadSanitizer.
+// Several threads at once, each with objects of its own: what docs/handbook/threads.md allows. The
+// tests mean most under ThreadSanitizer.
 
 #include "CXMLReader.h"
 #include "CXMLWriter.h"

@@ -9,9 +9,7 @@ tool=$2
 warnings=$(LC_ALL=C groff -man -Tascii -ww -z "$page" 2>&1)
 [ -z "$warnings" ] || { echo "$warnings"; exit 1; }
 
-# The page on one line, where it is of no matter how its lines are filled.
 text=$(groff -man -Tascii -P -cbou "$page")
-told=$(tr -s '[:space:]' ' ' <<<"$text")
 help=$("$tool" --help)
 # "  -h,--help   ..." and, below "Subcommands:", "  get   ...".
 options=$(grep -oE '^ +(-[a-z],)?--[a-z-]+' <<<"$help" | grep -oE -- '--[a-z-]+')
@@ -42,4 +40,5 @@ for command in $commands; do
             { echo "the man page does not tell of $command: $argument"; exit 1; }
     done <<<"$arguments"
 done
+# shellcheck disable=SC2086  # words
 echo "tells of" $options $commands

@@ -19,8 +19,8 @@ from pathlib import Path
 
 SECONDS = 60
 
-# What the shell does is told by files, so that neither prompt nor echo has to be understood: the key ^T writes the line,
-# and kxconfig its arguments. Only the completion calls it from a subshell, and gets the program.
+# What the shell does is told by files, so that neither prompt nor echo has to be understood: the key ^T writes the
+# line, and kxconfig its arguments. Only the completion calls it from a subshell, and gets the program.
 SETUP = """
 bind 'set bell-style none'
 bind 'set enable-bracketed-paste off'

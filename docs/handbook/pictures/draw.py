@@ -128,7 +128,8 @@ def main(arguments):
     kxconfig, page = arguments[-2:]
     text = pathlib.Path(page).read_text()
     files, failed = {}, False
-    for match in re.finditer(r"<!-- file: (\S+) -->\s*```xml\n(.*?)```|<!-- picture: (\S+) (\S+) (\S+) (\S+) -->", text, re.S):
+    mark = r"<!-- file: (\S+) -->\s*```xml\n(.*?)```|<!-- picture: (\S+) (\S+) (\S+) (\S+) -->"
+    for match in re.finditer(mark, text, re.S):
         if match.group(1):
             files[match.group(1)] = match.group(2)
             continue
