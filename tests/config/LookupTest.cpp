@@ -1,6 +1,7 @@
 #include "CXMLReader.h"
 
 #include "support/Engine.h"
+#include "support/Expect.h"
 #include "support/Files.h"
 #include "support/Log.h"
 #include "support/Memory.h"
@@ -645,15 +646,7 @@ TEST_F(LookupTest, OneArgumentFormLogsTheKeyAndTheResultAndNothingOfItsDescent)
 {
     const Records all = {Trace("GetValue", "Key cfg.net.ip"),
                          Value("GetValue", "Parsed Value :: 10.0.0.1\n10.0.0.2")};
-    for (const unsigned mask :
-         {kMaskNone, kMaskError, kMaskTrace, kMaskValue, kMaskXPath, kMaskAll})
-    {
-        LogRecorder log(mask);
-        const unsigned long calls = LogRecorder::Calls();
-        m_reader->GetValue("cfg.net.ip");
-        EXPECT_EQ(Under(mask, all), log.Take()) << mask;
-        EXPECT_EQ(Under(mask, all).size(), LogRecorder::Calls() - calls);
-    }
+    ExpectRecords(all, [&] { m_reader->GetValue("cfg.net.ip"); });
 }
 
 TEST_F(LookupTest, TwoArgumentFormLogsEachLevelInItsPlace)
@@ -671,16 +664,12 @@ TEST_F(LookupTest, TwoArgumentFormLogsEachLevelInItsPlace)
                          Trace("XMLGetValue", "-"),
                          Value("GetValue", "Parsed Value :: old\n10.0.0.1\n10.0.0.2"),
                          Trace("GetValue", "-")};
-    for (const unsigned mask :
-         {kMaskNone, kMaskError, kMaskTrace, kMaskValue, kMaskXPath, kMaskAll})
-    {
-        LogRecorder log(mask);
-        const unsigned long calls = LogRecorder::Calls();
-        std::string value = "old";
-        EXPECT_EQ(0, m_reader->GetValue("cfg.net.ip", value));
-        EXPECT_EQ(Under(mask, all), log.Take()) << mask;
-        EXPECT_EQ(Under(mask, all).size(), LogRecorder::Calls() - calls);
-    }
+    ExpectRecords(all,
+                  [&]
+                  {
+                      std::string value = "old";
+                      EXPECT_EQ(0, m_reader->GetValue("cfg.net.ip", value));
+                  });
 }
 
 TEST_F(LookupTest, ErrorsAndXPathBitsAloneLetNothingThrough)

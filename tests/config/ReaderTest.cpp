@@ -1,6 +1,7 @@
 #include "CXMLReader.h"
 
 #include "support/Engine.h"
+#include "support/Expect.h"
 #include "support/Files.h"
 #include "support/Log.h"
 #include "support/Memory.h"
@@ -118,19 +119,12 @@ TEST_F(ReaderTest, RecordsFollowTheMask)
                          Error("ParseFile", kNoDocument),
                          Trace("ParseFile", "-"),
                          Trace("~CXMLReader", "Destructor")};
-    for (const unsigned mask :
-         {kMaskNone, kMaskError, kMaskTrace, kMaskValue, kMaskXPath, kMaskAll})
-    {
-        SCOPED_TRACE(mask);
-        LogRecorder log(mask);
-        const unsigned long calls = LogRecorder::Calls();
-        {
-            CXMLReader reader(m_missing);
-            reader.ParseFile(m_missing);
-        }
-        EXPECT_EQ(Under(mask, all), log.Take());
-        EXPECT_EQ(Under(mask, all).size(), LogRecorder::Calls() - calls);
-    }
+    ExpectRecords(all,
+                  [&]
+                  {
+                      CXMLReader reader(m_missing);
+                      reader.ParseFile(m_missing);
+                  });
 }
 
 // --- ParseFile

@@ -3,6 +3,7 @@
 #include "CXMLReader.h"
 
 #include "support/Engine.h"
+#include "support/Expect.h"
 #include "support/Files.h"
 #include "support/Log.h"
 #include "support/Memory.h"
@@ -555,24 +556,17 @@ TEST_F(WriterTest, RecordsFollowTheMask)
                          Value("XMLSetValue", "Key :: name"),
                          Trace("SaveData", "+"),
                          Trace("~CXMLWriter", "Destructor")};
-    for (const unsigned mask :
-         {kMaskNone, kMaskError, kMaskTrace, kMaskValue, kMaskXPath, kMaskAll})
-    {
-        SCOPED_TRACE(mask);
-        LogRecorder log(mask);
-        const unsigned long calls = LogRecorder::Calls();
-        {
-            CXMLWriter writer;
-            writer.ParseFile(m_missing);
-            writer.SetDataPtr(nullptr);
-            writer.SetValue("cfg.name", "x");
-            writer.ParseFile(m_file);
-            writer.SetValue("cfg.name", "x");
-            writer.SaveData();
-        }
-        EXPECT_EQ(Under(mask, all), log.Take());
-        EXPECT_EQ(Under(mask, all).size(), LogRecorder::Calls() - calls);
-    }
+    ExpectRecords(all,
+                  [&]
+                  {
+                      CXMLWriter writer;
+                      writer.ParseFile(m_missing);
+                      writer.SetDataPtr(nullptr);
+                      writer.SetValue("cfg.name", "x");
+                      writer.ParseFile(m_file);
+                      writer.SetValue("cfg.name", "x");
+                      writer.SaveData();
+                  });
 }
 
 TEST_F(WriterTest, RecordsSurroundTheEnginesWork)

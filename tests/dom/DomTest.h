@@ -4,6 +4,7 @@
 #include "CXmlNode.h"
 
 #include "support/Engine.h"
+#include "support/Expect.h"
 #include "support/Files.h"
 #include "support/Log.h"
 #include "support/Memory.h"
@@ -12,7 +13,6 @@
 
 #include <libxml/parserInternals.h>
 
-#include <functional>
 #include <list>
 #include <string>
 #include <vector>
@@ -66,10 +66,6 @@ protected:
     /** @return the root element of the suite's document, as the engine saves it. */
     std::string Text() const { return TextOf(Node("/*")); }
     static std::string TextOf(xmlNodePtr node);
-
-    /** Runs @p operation under masks of all, no and single levels: it logs what each lets through.
-     */
-    static void ExpectRecords(const Records& all, const std::function<void()>& operation);
 
     /**
      * The root cfg with: a text piece; a comment; the element name (text "box"); a text piece; the

@@ -14,37 +14,6 @@ using namespace kxtest;
 namespace
 {
 
-/** Runs @p operation with the engine's n-th request failing. @return whether that request came. */
-template <class Operation>
-bool Failing(std::size_t n, const Operation& operation)
-{
-    EngineMemory::FailAt(n);
-    operation();
-    const bool failed = EngineMemory::Failed();
-    EngineMemory::FailAt(0);
-    return failed;
-}
-
-/**
- * Calls @p attempt(n) for n from 1 on, as long as it answers that the n-th request failed, which
- * the first @p fewest must have done.
- */
-template <class Attempt>
-void FailInTurn(const Attempt& attempt, std::size_t fewest = 1)
-{
-    const std::size_t kEnough = 5000;
-    for (std::size_t n = 1; n < kEnough; ++n)
-    {
-        SCOPED_TRACE("request " + std::to_string(n) + " fails");
-        if (!attempt(n))
-        {
-            EXPECT_LT(fewest, n);
-            return;
-        }
-    }
-    ADD_FAILURE() << "the operation never succeeds";
-}
-
 /** How a process of its own ended: with what @p operation answered, or not by itself (-1). */
 template <class Operation>
 int InAProcess(const Operation& operation)
@@ -79,7 +48,8 @@ TEST_F(OutOfMemoryTest, AddingAChildYieldsItOrSaysWhyNot)
             const EngineMemory made;
             CXmlNode child;
             LogRecorder log(kMaskError);
-            const bool failed = Failing(n, [&] { child = root.AddChildNode("c", "text"); });
+            const bool failed =
+                Failing<EngineMemory>(n, [&] { child = root.AddChildNode("c", "text"); });
             if (child.IsNull())
             {
                 EXPECT_TRUE(failed);
@@ -108,7 +78,7 @@ TEST_F(OutOfMemoryTest, ChildThatCannotBeMadeIsReportedInPlace)
     ExpectRecords(Traced("AddChildNode",
                          kMade + Records({Error("AddChildNode", "Error creating child node")})) +
                       kGone,
-                  [&] { Failing(1, [&] { root.AddChildNode("c", ""); }); });
+                  [&] { Failing<EngineMemory>(1, [&] { root.AddChildNode("c", ""); }); });
     EXPECT_EQ(before, Text());
 }
 
@@ -123,7 +93,8 @@ TEST_F(OutOfMemoryTest, AddingASiblingYieldsItOrNothing)
             const EngineMemory made;
             CXmlNode sibling;
             LogRecorder log(kMaskError);
-            const bool failed = Failing(n, [&] { sibling = first.AddSiblingNode("b", "text"); });
+            const bool failed =
+                Failing<EngineMemory>(n, [&] { sibling = first.AddSiblingNode("b", "text"); });
             EXPECT_EQ(Records(), log.Take());
             if (sibling.IsNull())
             {
@@ -152,7 +123,7 @@ TEST_F(OutOfMemoryTest, SettingContentLosesNoMemory)
             CXmlNode root(document->children);
             root.AddChildNode("c", "text");
             int status = -1;
-            const bool failed = Failing(n, [&] { status = root.SetContent("new"); });
+            const bool failed = Failing<EngineMemory>(n, [&] { status = root.SetContent("new"); });
             EXPECT_EQ(0, status);
             // Short of memory, older engines leave the element empty and newer ones as it was.
             EXPECT_TRUE(failed || TextOf(document->children) == "<r>new</r>");
@@ -170,7 +141,7 @@ TEST_F(OutOfMemoryTest, ContentIsReadOrEmpty)
         {
             const EngineMemory memory;
             std::string content;
-            const bool failed = Failing(n, [&] { content = node.GetContent(); });
+            const bool failed = Failing<EngineMemory>(n, [&] { content = node.GetContent(); });
             EXPECT_TRUE(content == "box" || (failed && content.empty())) << content;
             EXPECT_EQ(content.empty() ? 0 : 1, memory.Live());
             return failed;
@@ -185,8 +156,8 @@ TEST_F(OutOfMemoryTest, ContentOfAChildIsReadOrEmpty)
         {
             std::string value = "before";
             int status = -1;
-            const bool failed =
-                Failing(n, [&] { status = root.GetContentOfChildNode("name", value); });
+            const bool failed = Failing<EngineMemory>(
+                n, [&] { status = root.GetContentOfChildNode("name", value); });
             EXPECT_EQ(0, status);
             EXPECT_TRUE(value == "box" || (failed && value.empty())) << value;
             return failed;
@@ -204,7 +175,8 @@ TEST_F(OutOfMemoryTest, AttributeIsAddedWholeOrItIsSaidWhyNot)
             const EngineMemory made;
             int status = -1;
             LogRecorder log(kMaskError);
-            const bool failed = Failing(n, [&] { status = root.AddNewAttribute("a", "1"); });
+            const bool failed =
+                Failing<EngineMemory>(n, [&] { status = root.AddNewAttribute("a", "1"); });
             EXPECT_EQ(failed ? 22 : 0, status);
             if (failed)
             {
@@ -234,7 +206,8 @@ TEST_F(OutOfMemoryTest, AttributeIsReadOrReportedMissing)
             std::string value = "before";
             int status = -1;
             LogRecorder log(kMaskError);
-            const bool failed = Failing(n, [&] { status = net.GetAttributeValue("mode", value); });
+            const bool failed =
+                Failing<EngineMemory>(n, [&] { status = net.GetAttributeValue("mode", value); });
             EXPECT_EQ(failed ? 22 : 0, status);
             EXPECT_EQ(failed ? "before" : "on", value);
             EXPECT_EQ(failed
@@ -268,7 +241,7 @@ TEST_F(OutOfMemoryTest, FileIsLoadedOrReported)
             CXmlParser parser;
             int status = -1;
             LogRecorder log(kMaskError);
-            const bool failed = Failing(n, [&] { status = parser.ParseXml(file); });
+            const bool failed = Failing<EngineMemory>(n, [&] { status = parser.ParseXml(file); });
             if (status == 0)
             {
                 EXPECT_EQ(Records(), log.Take());
@@ -299,7 +272,7 @@ TEST_F(OutOfMemoryTest, FileIsSavedOrMinus2IsAnswered)
         {
             int status = -1;
             LogRecorder log(kMaskError);
-            const bool failed = Failing(n, [&] { status = parser.SaveXml(file); });
+            const bool failed = Failing<EngineMemory>(n, [&] { status = parser.SaveXml(file); });
             EXPECT_TRUE(status == 0 || (status == -2 && failed)) << status;
             EXPECT_EQ(Records(), log.Take());
             if (!failed)
@@ -363,7 +336,7 @@ TEST_F(OutOfMemoryTest, QueryAnswersOrSaysWhyNot)
         bool found = false;
         EngineCalls calls;
         LogRecorder log(kMaskXPath | kMaskError);
-        const bool failed = Failing(n, [&] { found = find("//b", CXmlNode()); });
+        const bool failed = Failing<EngineMemory>(n, [&] { found = find("//b", CXmlNode()); });
         const Records records = log.Take();
         const Record noResult = XPath(tag, "xmlXPathObjectPtr is NULL");
         const bool right =

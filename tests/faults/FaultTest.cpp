@@ -7,6 +7,7 @@
 #include "CXmlParser.h"
 
 #include "support/Engine.h"
+#include "support/Expect.h"
 #include "support/Files.h"
 #include "support/Log.h"
 #include "support/Memory.h"
@@ -59,18 +60,37 @@ struct Objects
     CXmlNode node;
 };
 
-using Run = std::function<std::string(Objects&)>;
+/** What is to be seen of an operation. */
+struct Answer
+{
+    int status = 0;        ///< the result, if it is a number
+    std::string text = ""; ///< the result, if it is a text, and what is written to an argument
+    bool found = false;    ///< the flag of the walks of keys
+    bool thrown = false;   ///< std::bad_alloc left the operation
+};
+
+bool operator==(const Answer& left, const Answer& right)
+{
+    return left.status == right.status && left.text == right.text && left.found == right.found &&
+           left.thrown == right.thrown;
+}
+
+std::ostream& operator<<(std::ostream& out, const Answer& answer)
+{
+    out << answer.status << " \"" << answer.text << '"';
+    return out << (answer.found ? " found" : "") << (answer.thrown ? " thrown" : "");
+}
 
 struct Operation
 {
     const char* name;
-    Run run; ///< @return what is to be seen of the operation
+    std::function<Answer(Objects&)> run;
 
     /** What it may also answer when memory runs out. */
-    std::vector<std::string> whenShort = {};
+    std::vector<Answer> whenShort = {};
 
-    /** What is to be seen when it succeeded and is called once more, if that differs. */
-    std::string again = "";
+    /** What it answers when it succeeded and is called once more, if that differs. */
+    std::vector<Answer> again = {};
 
     /** Engine buffers that stay allocated by contract. */
     long kept = 0;
@@ -81,31 +101,38 @@ std::ostream& operator<<(std::ostream& out, const Operation& operation)
     return out << operation.name;
 }
 
-std::string Of(int status)
+Answer Of(int status)
 {
-    return std::to_string(status);
+    return {status};
 }
-std::string Of(const void* pointer)
+Answer Of(const std::string& text)
 {
-    return pointer == nullptr ? "null" : "made";
+    return {0, text};
 }
-std::string Of(CXmlNode handle)
+Answer Of(const void* pointer)
 {
-    return handle.IsNull() ? "null" : handle.Name();
+    return {0, pointer == nullptr ? "null" : "made"};
 }
-std::string Of(const std::list<CXmlNode>& handles)
+Answer Of(CXmlNode handle)
 {
-    std::string names;
+    return {0, handle.IsNull() ? "null" : handle.Name()};
+}
+Answer Of(const std::list<CXmlNode>& handles)
+{
+    Answer answer;
     for (const CXmlNode& handle : handles)
     {
-        names += Of(handle) + ' ';
+        answer.text += Of(handle).text + ' ';
     }
-    return names;
+    return answer;
 }
+
+const Answer kNull = Of(static_cast<const void*>(nullptr));
+const Answer kThrown = {0, "", false, true};
 
 /** Destroys what a factory made, as its client would. */
 template <class Object>
-std::string OfMade(Object* made)
+Answer OfMade(Object* made)
 {
     const std::unique_ptr<Object> owner(made);
     return Of(static_cast<const void*>(made));
@@ -113,7 +140,7 @@ std::string OfMade(Object* made)
 
 // --- The operations
 
-std::string ParseAgain(Objects& objects)
+Answer ParseAgain(Objects& objects)
 {
     // The earlier document is not freed, by contract; it is the client's then.
     const auto earlier = static_cast<xmlDocPtr>(objects.reader.GetDataPtr());
@@ -137,7 +164,7 @@ private:
     CXMLWriter m_writer;
 };
 
-std::string Query(Objects& objects)
+Answer Query(Objects& objects)
 {
     // To name what is seen can need memory as well.
     const std::unique_ptr<xmlXPathObject, void (*)(xmlXPathObjectPtr)> result(
@@ -145,20 +172,20 @@ std::string Query(Objects& objects)
     return Of(static_cast<const void*>(result.get()));
 }
 
-std::string CreateNew(Objects& objects)
+Answer CreateNew(Objects& objects)
 {
     objects.root = objects.node = CXmlNode();
     const int status = objects.parser.CreateNewXmlDoc(kName);
     return Of(status);
 }
 
-std::string Load(Objects& objects)
+Answer Load(Objects& objects)
 {
     objects.root = objects.node = CXmlNode();
     return Of(objects.parser.ParseXml(objects.file));
 }
 
-std::string Clear(Objects& objects)
+Answer Clear(Objects& objects)
 {
     objects.root = objects.node = CXmlNode();
     objects.parser.ClearDocument();
@@ -167,7 +194,7 @@ std::string Clear(Objects& objects)
 
 // Text that the engine has no memory for is missing without a word, and an empty element is not
 // filled by a later update.
-const char* const kEmptied = "-2";
+const Answer kEmptied = {-2};
 
 // An exception that leaves FindAllNodes leaves the engine's result behind: object, set and table.
 const long kXPathResult = 3;
@@ -175,117 +202,125 @@ const long kXPathResult = 3;
 const Operation kStore[] = {
     // Short of memory the engine may also answer a document without a root, or a root without a
     // name, which is foreign to every key.
-    {"CXMLReader", [](Objects& o) { return Of(CXMLReader(o.file).GetDataPtr()); }, {"null"}},
+    {"CXMLReader", [](Objects& o) { return Of(CXMLReader(o.file).GetDataPtr()); }, {kNull}},
     {"GetCXMLReaderObject",
      [](Objects& o) { return OfMade(GetCXMLReaderObject(o.file.c_str())); },
-     {"null"}},
-    {"ReaderParseFile", ParseAgain, {"22"}},
-    {"GetValue", [](Objects& o) { return o.reader.GetValue(kKey); }, {""}},
+     {kNull}},
+    {"ReaderParseFile", ParseAgain, {{22}}},
+    {"GetValue", [](Objects& o) { return Of(o.reader.GetValue(kKey)); }, {{}}},
     {"GetValueInto",
      [](Objects& o)
      {
          std::string value = kName;
          const int status = o.reader.GetValue(kKey, value);
-         return Of(status) + value;
+         return Answer{status, value};
      },
-     {"-2" + kName}},
+     {{-2, kName}}},
     {"GetValueInPlace",
      [](Objects& o)
      {
          std::string value = kKey;
          const int status = o.reader.GetValue(value, value);
-         return Of(status) + value;
+         return Answer{status, value};
      },
-     {"-2" + kKey}},
-    {"XMLGetValue", [](Objects& o) { return o.reader.XMLGetValue(o.ReadersRoot(), kRest); }, {""}},
+     {{-2, kKey}}},
+    {"XMLGetValue",
+     [](Objects& o) { return Of(o.reader.XMLGetValue(o.ReadersRoot(), kRest)); },
+     {{}}},
     {"XMLGetValueInto",
      [](Objects& o)
      {
          std::string value;
          unsigned found = 0;
          const int status = o.reader.XMLGetValue(o.ReadersRoot(), kRest, value, found);
-         return Of(status) + value + Of(static_cast<int>(found));
+         return Answer{status, value, found != 0};
      },
-     {"-20"}},
+     {{-2}}},
     {"GetDataPtr", [](Objects& o) { return Of(o.reader.GetDataPtr()); }},
     {"CXMLWriter",
      [](Objects& o) { return Of(CXMLWriter(o.file).SetValue("cfg.b", "")); },
-     {"7", "22", "0"}},
+     {{7}, {22}, {0}}},
     {"CXMLWriterWithoutPath", [](Objects&) { return Of(CXMLWriter().SetValue("cfg.b", "")); }},
     {"GetCXMLWriterObject",
      [](Objects& o) { return OfMade(GetCXMLWriterObject(o.file.c_str())); },
-     {"null"}},
+     {kNull}},
     {"GetCXMLWriterObjectNoParam",
      [](Objects&) { return OfMade(GetCXMLWriterObjectNoParam()); },
-     {"null"}},
-    {"WriterParseFile", [](Objects& o) { return Of(o.writer.ParseFile(o.file)); }, {"22"}},
+     {kNull}},
+    {"WriterParseFile", [](Objects& o) { return Of(o.writer.ParseFile(o.file)); }, {{22}}},
     {"SetPath", [](Objects& o) { return Of(o.writer.SetPath(o.file)); }},
-    {"SetDataPtr", [](Objects& o) { return Of(Borrower(o.reader).SetValue()); }, {"-2"}, kEmptied},
-    {"SetValue", [](Objects& o) { return Of(o.writer.SetValue(kKey, kValue)); }, {"-2"}, kEmptied},
+    {"SetDataPtr",
+     [](Objects& o) { return Of(Borrower(o.reader).SetValue()); },
+     {{-2}},
+     {kEmptied}},
+    {"SetValue",
+     [](Objects& o) { return Of(o.writer.SetValue(kKey, kValue)); },
+     {{-2}},
+     {kEmptied}},
     {"XMLSetValue",
      [](Objects& o)
      {
          std::string value = kValue;
          unsigned updated = 0;
          const int status = o.writer.XMLSetValue(o.ReadersRoot(), kRest, value, updated);
-         return Of(status) + Of(static_cast<int>(updated));
+         return Answer{status, "", updated != 0};
      },
-     {"00"},
-     "00"},
+     {{0}},
+     {{0}}},
 };
 
 const Operation kToolkit[] = {
     {"CXmlParser", [](Objects&) { return Of(CXmlParser().GetRootNode()); }},
     {"ClearDocument", Clear},
-    {"ParseXml", Load, {"22"}},
-    {"CreateNewXmlDoc", CreateNew, {"22"}},
+    {"ParseXml", Load, {{22}}},
+    {"CreateNewXmlDoc", CreateNew, {{22}}},
     {"GetRootNode", [](Objects& o) { return Of(o.parser.GetRootNode()); }},
     {"IsReadable", [](Objects& o) { return Of(o.parser.IsReadable(o.file)); }},
     {"AddNewNode",
      [](Objects& o) { return Of(o.parser.AddNewNode(o.node, kName, kValue)); },
-     {"null"}},
+     {kNull}},
     {"RemoveNode", [](Objects& o) { return Of(o.parser.RemoveNode(o.root.LastChild())); }},
     {"CopiedHandle", [](Objects& o) { return Of(CXmlNode(o.node)); }},
     {"IsNull", [](Objects& o) { return Of(o.node.IsNull()); }},
     {"Type", [](Objects& o) { return Of(o.node.Type()); }},
-    {"Name", [](Objects& o) { return o.node.Name(); }},
+    {"Name", [](Objects& o) { return Of(o.node.Name()); }},
     {"Parent", [](Objects& o) { return Of(o.node.Parent()); }},
     {"FirstChild", [](Objects& o) { return Of(o.root.FirstChild()); }},
     {"LastChild", [](Objects& o) { return Of(o.root.LastChild()); }},
     {"NextSibling", [](Objects& o) { return Of(o.node.NextSibling()); }},
     {"PrevSibling", [](Objects& o) { return Of(o.node.PrevSibling()); }},
     {"ClearNode", [](Objects& o) { return Of(o.node.ClearNode()); }},
-    {"GetContent", [](Objects& o) { return o.node.GetContent(); }, {""}, "", 1},
+    {"GetContent", [](Objects& o) { return Of(o.node.GetContent()); }, {{}}, {}, 1},
     {"SetContent", [](Objects& o) { return Of(o.node.SetContent(kValue)); }},
     {"GetContentOfChildNode",
      [](Objects& o)
      {
          std::string value;
          const int status = o.root.GetContentOfChildNode(kName, value);
-         return Of(status) + value;
+         return Answer{status, value};
      },
-     {"0"},
-     "",
+     {{0}},
+     {},
      1},
     {"Children", [](Objects& o) { return Of(o.root.Children()); }},
     {"FindChildNode", [](Objects& o) { return Of(o.root.FindChildNode(kName)); }},
     {"FindAllChildNodes", [](Objects& o) { return Of(o.root.FindAllChildNodes(kName)); }},
-    {"AddChildNode", [](Objects& o) { return Of(o.node.AddChildNode(kName, kValue)); }, {"null"}},
+    {"AddChildNode", [](Objects& o) { return Of(o.node.AddChildNode(kName, kValue)); }, {kNull}},
     {"AddSiblingNode",
      [](Objects& o) { return Of(o.node.AddSiblingNode(kName, kValue)); },
-     {"null"}},
-    {"RemoveChildNode", [](Objects& o) { return Of(o.root.RemoveChildNode("b")); }, {}, "22"},
+     {kNull}},
+    {"RemoveChildNode", [](Objects& o) { return Of(o.root.RemoveChildNode("b")); }, {}, {{22}}},
     {"AddNewAttribute",
      [](Objects& o) { return Of(o.node.AddNewAttribute(kName, kValue)); },
-     {"22"}},
+     {{22}}},
     {"GetAttributeValue",
      [](Objects& o)
      {
          std::string value;
          const int status = o.node.GetAttributeValue(kName, value);
-         return Of(status) + value;
+         return Answer{status, value};
      },
-     {"22"}},
+     {{22}}},
     {"GetAttributeItems",
      [](Objects& o)
      {
@@ -294,11 +329,11 @@ const Operation kToolkit[] = {
          {
              seen += item.m_strName + item.m_strValue;
          }
-         return seen;
+         return Of(seen);
      }},
     {"RemoveAttribute", [](Objects& o) { return Of(o.node.RemoveAttribute(kName)); }},
     {"SetAttributeValue", [](Objects& o) { return Of(o.node.SetAttributeValue(kName, kValue)); }},
-    {"CXmlAttr", [](Objects&) { return CXmlAttr(kName, kValue).m_strValue; }},
+    {"CXmlAttr", [](Objects&) { return Of(CXmlAttr(kName, kValue).m_strValue); }},
 };
 
 // Short of memory the engine itself falls over them; the requests of operator new are tried.
@@ -308,13 +343,11 @@ const Operation kQueries[] = {
     {"FindAllNodes",
      [](Objects& o) { return Of(o.parser.FindAllNodes(kXPath, o.root)); },
      {},
-     "",
+     {},
      kXPathResult},
 };
 
-const char* const kThrown = "std::bad_alloc";
-
-std::string Seen(const Operation& operation, Objects& objects)
+Answer Seen(const Operation& operation, Objects& objects)
 {
     try
     {
@@ -339,14 +372,16 @@ protected:
     template <class Faults>
     void FailInTurn()
     {
-        constexpr std::size_t kEnough = 5000;
-        std::size_t n = 1;
-        while (n != kEnough && Fail<Faults>(n))
-        {
-            ++n;
-        }
-        EXPECT_NE(kEnough, n) << "it never succeeds";
-        RecordProperty("requests", static_cast<int>(n - 1));
+        std::size_t requests = 0;
+        kxtest::FailInTurn(
+            [&](std::size_t n)
+            {
+                const bool failed = Fail<Faults>(n);
+                requests += failed;
+                return failed;
+            },
+            0);
+        RecordProperty("requests", static_cast<int>(requests));
     }
 
 private:
@@ -354,16 +389,13 @@ private:
     template <class Faults>
     bool Fail(std::size_t n)
     {
-        SCOPED_TRACE("request " + std::to_string(n) + " fails");
         const EngineMemory memory;
         const NewCounter heap;
         bool failed = false;
         {
             Objects objects(m_file);
-            Faults::FailAt(n);
-            const std::string seen = Seen(GetParam(), objects);
-            failed = Faults::Failed();
-            Faults::FailAt(0);
+            Answer seen;
+            failed = Failing<Faults>(n, [&] { seen = Seen(GetParam(), objects); });
             TakeEngineErrors();
             CheckAnswer(seen, failed);
             CheckUsable(objects);
@@ -375,9 +407,9 @@ private:
         return failed;
     }
 
-    void CheckAnswer(const std::string& seen, bool failed)
+    void CheckAnswer(const Answer& seen, bool failed)
     {
-        std::vector<std::string> answers = {m_good};
+        std::vector<Answer> answers = {m_good};
         if (failed)
         {
             answers.insert(answers.end(), GetParam().whenShort.begin(), GetParam().whenShort.end());
@@ -388,13 +420,14 @@ private:
 
     void CheckUsable(Objects& objects)
     {
-        const std::string again = Seen(GetParam(), objects);
-        EXPECT_TRUE(again == m_good || again == GetParam().again) << again;
+        std::vector<Answer> answers = GetParam().again;
+        answers.push_back(m_good);
+        EXPECT_THAT(answers, testing::Contains(Seen(GetParam(), objects)));
     }
 
     const TemporaryFolder m_folder;
     const std::string m_file = m_folder.Write("cfg.xml", kXml);
-    std::string m_good;
+    Answer m_good;
 };
 
 class QueryFaultTest : public FaultTest
