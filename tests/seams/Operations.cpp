@@ -141,6 +141,24 @@ void IdElement(World& world)
 {
     world.Select("/cfg/net/a", "ids.xml");
 }
+void IdAttribute(World& world)
+{
+    world.Select("/cfg/net/a/@id", "ids.xml");
+}
+void IdDocument(World& world)
+{
+    world.Select("/", "ids.xml");
+}
+
+/** Selects the DTD of ids.xml, which XPath does not select. */
+void Dtd(World& world)
+{
+    IdDocument(world);
+    const xmlXPathObjectPtr found = world.parser->GetNodeSet("/", CXmlNode());
+    world.node.SetXmlNodePtr(found->nodesetval->nodeTab[0]->children);
+    xmlXPathFreeObject(found);
+}
+
 /** Selects the holder of an ID that the engine's table has under an earlier value. */
 void ChangedIdHolder(World& world)
 {
@@ -399,6 +417,9 @@ const std::vector<Operation> kHandle = {
     {"ClearNode, ID below", IdHolder, [](World& w) { w.node.ClearNode(); }},
     {"ClearNode, element with an ID", IdElement, [](World& w) { w.node.ClearNode(); }},
     {"ClearNode, reference to a declared entity", Reference, [](World& w) { w.node.ClearNode(); }},
+    {"ClearNode, ID attribute", IdAttribute, [](World& w) { w.node.ClearNode(); }},
+    {"ClearNode, document with an ID", IdDocument, [](World& w) { w.node.ClearNode(); }},
+    {"ClearNode, DTD with a declaration", Dtd, [](World& w) { w.node.ClearNode(); }},
     {"ClearNode, document", DocumentNode, [](World& w) { w.node.ClearNode(); }},
     {"GetContent", Name, [](World& w) { w.node.GetContent(); }},
     {"GetContent, not only text", Net, [](World& w) { w.node.GetContent(); }},
@@ -410,6 +431,8 @@ const std::vector<Operation> kHandle = {
     {"SetContent, ID below", IdHolder, [](World& w) { w.node.SetContent("new"); }},
     {"SetContent, reference to a declared entity", Reference,
      [](World& w) { w.node.SetContent("new"); }},
+    {"SetContent, ID attribute", IdAttribute, [](World& w) { w.node.SetContent("new"); }},
+    {"SetContent, DTD", Dtd, [](World& w) { w.node.SetContent("new"); }},
     {"SetContent, document", DocumentNode, [](World& w) { w.node.SetContent("new"); }},
     {"GetContentOfChildNode", Parser, [](World& w) { ReadChild(w, "name"); }},
     {"GetContentOfChildNode, no text", Parser, [](World& w) { ReadChild(w, "empty"); }},
@@ -567,6 +590,8 @@ const std::vector<Operation> kDocument = {
     {"RemoveNode, ID below", IdHolder, [](World& w) { w.parser->RemoveNode(w.node); }},
     {"RemoveNode, ID with a changed value", ChangedIdHolder,
      [](World& w) { w.parser->RemoveNode(w.node); }},
+    {"RemoveNode, ID attribute", IdAttribute, [](World& w) { w.parser->RemoveNode(w.node); }},
+    {"RemoveNode, DTD without an entity", Dtd, [](World& w) { w.parser->RemoveNode(w.node); }},
     {"RemoveNode, document", DocumentNode, [](World& w) { w.parser->RemoveNode(w.node); }},
 };
 
