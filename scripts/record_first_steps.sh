@@ -26,17 +26,17 @@ type_in() {
 
 session() {
     cat <<'END'
-First steps, recorded: from a clone in an empty folder to a key that gives nothing, and why.
+A recorded first session: from a clone in an empty directory to a key that finds nothing, and the reason.
 
-scripts/record_first_steps.sh makes this file; do not edit it. Times are not those of the recording. On a machine
-that lacks some of the packages the first script says "installing: ..." and asks for the password if need be.
+scripts/record_first_steps.sh writes this file; do not edit it. The times of log records are replaced. If packages are
+missing, the first script prints "installing: ..." and asks for the password if necessary.
 END
-    say 'Clone the project ($PROJECT is its address), and build it.'
+    say 'Clone the project from its address, $PROJECT, and build it.'
     type_in 'git clone --quiet "$PROJECT" kx'
     type_in 'cd kx'
     type_in './scripts/quickstart.sh'
 
-    say 'Install it, into a folder of my own; then a folder with a small file.'
+    say 'Install it into a directory of my own, and create a small file.'
     type_in 'cmake --install build/release --prefix ../usr >../install.log'
     type_in 'export PATH=$(realpath ../usr/bin):$PATH'
     type_in 'mkdir ../try && cd ../try'
@@ -49,32 +49,25 @@ END
 </cfg>
 END'
 
-    say 'A first value. Which keys are there?'
+    say 'Read a first value, and list all keys.'
     type_in 'kxconfig get device.xml cfg.name'
     type_in 'kxconfig keys device.xml'
     type_in 'kxconfig get device.xml cfg.net@id=2.ip'
 
-    say 'A first change: look first, then do it.'
+    say 'Make a first change, with a dry run before.'
     type_in 'kxconfig set --dry-run device.xml cfg.name crate'
     type_in 'kxconfig set device.xml cfg.name crate'
     type_in 'cat device.xml'
 
-    say 'It pays to look: this key reads one value, but would change two.'
+    say 'The dry run matters: this key reads one value, but would change two.'
     type_in 'kxconfig get device.xml cfg.net@id=1.ip'
     type_in 'kxconfig set --dry-run device.xml cfg.net@id=1.ip 10.9.9.9'
 
-    say 'A key that gives nothing.'
+    say 'A key that finds nothing.'
     type_in 'kxconfig get device.xml cfg.net.address'
     type_in 'echo $last_status'
-    if kxconfig --help | grep -q '^ *explain '; then
-        say 'Why?'
-        type_in 'kxconfig explain device.xml cfg.net.address'
-    else
-        say 'Why? The library tells each level that it entered, and the part of the key that it sought there: both' \
-            'net elements were entered for "address", and below them nothing.'
-        type_in 'kxconfig --log-mask value get device.xml cfg.net.address'
-        type_in "kxconfig find device.xml '/cfg/net/*'"
-    fi
+    say 'Why?'
+    type_in 'kxconfig explain device.xml cfg.net.address'
 }
 
 # Replaces what changes with each run or each edit of a source: times and source lines of log records, directories.

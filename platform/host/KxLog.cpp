@@ -159,7 +159,7 @@ __attribute__((constructor)) void TakeMaskFromEnvironment()
     {
         std::string complaint = "KX_LOG_MASK: \"";
         AppendOnOneLine(complaint, text);
-        complaint = complaint + "\" is not a log mask; it is " + g_LogMaskHelp + '\n';
+        complaint = complaint + "\" is not a log mask; expected " + g_LogMaskHelp + '\n';
         WriteToStandardError(complaint.data(), complaint.size());
     }
     catch (const std::exception&)

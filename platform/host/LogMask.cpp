@@ -78,7 +78,7 @@ bool ParseNames(const char* text, unsigned int& mask)
 } // namespace
 
 const char* const g_LogMaskHelp =
-    "a number (decimal, or hexadecimal after 0x) of 32 bits, or names joined by commas out of "
+    "a 32-bit number (decimal, or hexadecimal after 0x), or names joined by commas: "
     "warning, error, trace, value, xpath, all, none";
 
 const char* LogLevelName(int level)

@@ -127,9 +127,8 @@ TEST(LogMaskOfTheEnvironment, BadValueGetsOneLineAndChangesNothing)
     const Outcome outcome = RunProgram({kProbe, "mask"}, {"KX_LOG_MASK=loud"});
     EXPECT_EQ(0, outcome.status);
     EXPECT_EQ("0x00000300\n", outcome.out);
-    EXPECT_EQ(
-        "KX_LOG_MASK: \"loud\" is not a log mask; it is a number (decimal, or hexadecimal "
-        "after 0x) of 32 bits, or names joined by commas out of warning, error, trace, value, "
-        "xpath, all, none\n",
-        outcome.err);
+    EXPECT_EQ("KX_LOG_MASK: \"loud\" is not a log mask; expected a 32-bit number (decimal, or "
+              "hexadecimal after 0x), or names joined by commas: warning, error, trace, value, "
+              "xpath, all, none\n",
+              outcome.err);
 }

@@ -63,26 +63,28 @@ TEST_F(KxconfigCheck, WarnsOfAKeyThatMatchesMoreThanOneElement)
 TEST_F(KxconfigCheck, WarnsOfAConditionThatIsSuspended)
 {
     Write("<cfg>\n<z/>\n<a i=\"1\">1</a>\n<a i=\"2\">2</a></cfg>");
-    ExpectWarnings({"4: /cfg/a[1] is taken for \"a@i=2\" though it does not fulfil it: /cfg/z "
-                    "(line 3), of another name and in front of it, suspends the condition",
-                    "5: /cfg/a[2] would be taken for \"a@i=1\" if /cfg/z (line 3), of another "
-                    "name, came right before it",
-                    "5: \"cfg.a@i=2\" matches 2 elements, the first of them /cfg/a[1] (line 4)"});
+    ExpectWarnings(
+        {"4: /cfg/a[1] is accepted for \"a@i=2\" although it does not fulfill it: /cfg/z "
+         "(line 3), a preceding element of another name, suspends the condition",
+         "5: /cfg/a[2] would be accepted for \"a@i=1\" if /cfg/z (line 3), which has another name, "
+         "preceded it directly",
+         "5: \"cfg.a@i=2\" matches 2 elements, the first of them /cfg/a[1] (line 4)"});
 }
 
 TEST_F(KxconfigCheck, NamesTheElementThatSuspendsTheCondition)
 {
     // The first of another name suspends the condition only for one that fulfils it anyway.
     Write("<cfg>\n<z/>\n<a i=\"1\">1</a>\n<a i=\"2\"/>\n<y/>\n<x/>\n<a i=\"3\"/></cfg>");
-    ExpectWarnings({"8: /cfg/a[3] is taken for \"a@i=1\" though it does not fulfil it: /cfg/y "
-                    "(line 6), of another name and in front of it, suspends the condition"});
+    ExpectWarnings(
+        {"8: /cfg/a[3] is accepted for \"a@i=1\" although it does not fulfill it: /cfg/y "
+         "(line 6), a preceding element of another name, suspends the condition"});
 }
 
 TEST_F(KxconfigCheck, WarnsOncePerLevelOfConditionsThatDependOnTheOrder)
 {
     Write("<cfg>\n<a i=\"1\">1</a>\n<a i=\"2\">2</a>\n<z/></cfg>");
-    ExpectWarnings({"4: /cfg/a[2] would be taken for \"a@i=1\" if /cfg/z (line 5), of another "
-                    "name, came right before it"});
+    ExpectWarnings({"4: /cfg/a[2] would be accepted for \"a@i=1\" if /cfg/z (line 5), which has "
+                    "another name, preceded it directly"});
 }
 
 TEST_F(KxconfigCheck, WarnsOncePerLevelOfConditionsThatAreSuspended)
@@ -90,22 +92,23 @@ TEST_F(KxconfigCheck, WarnsOncePerLevelOfConditionsThatAreSuspended)
     Write("<cfg>\n<z/>\n<a i=\"1\">1</a>\n<a i=\"2\">2</a>\n<a i=\"3\">3</a></cfg>");
     const auto matchesTwo = [](const std::string& line, const std::string& key)
     { return line + ": \"" + key + "\" matches 2 elements, the first of them /cfg/a[1] (line 4)"; };
-    ExpectWarnings({"4: /cfg/a[1] is taken for \"a@i=2\" though it does not fulfil it: /cfg/z "
-                    "(line 3), of another name and in front of it, suspends the condition",
-                    "5: /cfg/a[2] would be taken for \"a@i=1\" if /cfg/z (line 3), of another "
-                    "name, came right before it",
-                    matchesTwo("5", "cfg.a@i=2"), matchesTwo("6", "cfg.a@i=3")});
+    ExpectWarnings(
+        {"4: /cfg/a[1] is accepted for \"a@i=2\" although it does not fulfill it: /cfg/z "
+         "(line 3), a preceding element of another name, suspends the condition",
+         "5: /cfg/a[2] would be accepted for \"a@i=1\" if /cfg/z (line 3), which has another name, "
+         "preceded it directly",
+         matchesTwo("5", "cfg.a@i=2"), matchesTwo("6", "cfg.a@i=3")});
 }
 
 TEST_F(KxconfigCheck, ChecksTheKeysThatItIsGiven)
 {
     Write("<cfg>\n<a i=\"1\">1</a>\n<a i=\"2\">2</a>\n<z/></cfg>");
-    ExpectWarnings({"4: \"cfg.a\" matches 2 elements, the first of them /cfg/a[1] (line 3)",
-                    "5: \"cfg.z\" has no value: it leads as far as /cfg/z; kxconfig explain tells "
-                    "why"},
-                   {"cfg.a", "cfg.z"});
-    ExpectWarnings({"3: /cfg/a[1] would be taken for \"a@i=2\" if /cfg/z (line 5), of another "
-                    "name, came right before it"},
+    ExpectWarnings(
+        {"4: \"cfg.a\" matches 2 elements, the first of them /cfg/a[1] (line 3)",
+         "5: \"cfg.z\" has no value: it leads as far as /cfg/z; kxconfig explain shows the reason"},
+        {"cfg.a", "cfg.z"});
+    ExpectWarnings({"3: /cfg/a[1] would be accepted for \"a@i=2\" if /cfg/z (line 5), which has "
+                    "another name, preceded it directly"},
                    {"cfg.a@i=2"});
 }
 
@@ -116,7 +119,8 @@ TEST_F(KxconfigCheck, GoesOnAfterAKeyWithAForeignRoot)
         {"2: \"other.a\" has no value: it starts with \"other\", but the root element is \"cfg\"",
          "2: \".a\" has no value: it starts with \"\", but the root element is \"cfg\"",
          "4: \"cfg.a\" matches 2 elements, the first of them /cfg/a[1] (line 3)",
-         "4: /cfg/b has no value though it holds \"x\": its only child is no text: CDATA section"},
+         "4: /cfg/b has no value although it contains \"x\": its only child is not text: CDATA "
+         "section"},
         {"other.a", ".a", "cfg.a"});
 }
 
@@ -124,8 +128,8 @@ TEST_F(KxconfigCheck, ChecksNothingIfAKeyIsMalformed)
 {
     Write("<cfg><a>1</a><a>2</a></cfg>");
     ExpectComplaint(Tool({"check", m_file, "cfg.a", "cfg"}), 2,
-                    "malformed key \"cfg\": it names the root element and at least one more, as in "
-                    "root.name");
+                    "malformed key \"cfg\": a key names the root element and at least one more, as "
+                    "in root.name");
 }
 
 TEST_F(KxconfigCheck, WarnsOfAGivenKeyThatHasNoValue)
@@ -135,7 +139,7 @@ TEST_F(KxconfigCheck, WarnsOfAGivenKeyThatHasNoValue)
         [](const std::string& key, const std::string& line, const std::string& location)
     {
         return line + ": \"" + key + "\" has no value: it leads as far as " + location +
-               "; kxconfig explain tells why";
+               "; kxconfig explain shows the reason";
     };
     // An element that is there and empty, the first of those that are equally deep.
     ExpectWarnings({warning("cfg.a.b", "3", "/cfg/a[1]/b")}, {"cfg.a.b"});
@@ -195,16 +199,18 @@ TEST_F(KxconfigCheck, WarnsOfValuesThatALookupCannotSee)
     Write("<cfg>\n<a><![CDATA[x]]></a>\n<b>y<!-- c -->z</b>\n<c>t<d/></c>\n<e>\n</e>\n<f/>\n"
           "<g>  <h/>  </g></cfg>");
     ExpectWarnings(
-        {"3: /cfg/a has no value though it holds \"x\": its only child is no text: CDATA section",
-         "4: /cfg/b has no value though it holds \"yz\": it has 3 children: text, comment, text",
-         "5: /cfg/c has no value though it holds \"t\": it has 2 children: text, element d"});
+        {"3: /cfg/a has no value although it contains \"x\": its only child is not text: CDATA "
+         "section",
+         "4: /cfg/b has no value although it contains \"yz\": it has 3 children: text, comment, "
+         "text",
+         "5: /cfg/c has no value although it contains \"t\": it has 2 children: text, element d"});
 }
 
 TEST_F(KxconfigCheck, WarnsOfATextInTheRoot)
 {
     Write("<cfg>text</cfg>");
     ExpectWarnings(
-        {"2: /cfg has no value though it holds \"text\": it is the root, and a key names "
+        {"2: /cfg has no value although it contains \"text\": it is the root, and a key names "
          "elements below it"});
     Write("<cfg> </cfg>");
     ExpectWarnings({});
@@ -216,8 +222,8 @@ TEST_F(KxconfigCheck, TakesAReferenceForContentWhateverItStandsFor)
         [this](const std::string& subset, const std::string& line, const std::string& name)
     {
         Write("<!DOCTYPE cfg " + subset + ">\n<cfg><a>&" + name + ";</a></cfg>");
-        ExpectWarnings({line + ": /cfg/a has no value though it holds \"&" + name +
-                        ";\": its only child is no text: entity reference &" + name + ";"});
+        ExpectWarnings({line + ": /cfg/a has no value although it contains \"&" + name +
+                        ";\": its only child is not text: entity reference &" + name + ";"});
     };
     expect("[\n<!ENTITY full \"x\">\n]", "5", "full");
     expect("[\n<!ENTITY none \"\">\n]", "5", "none");
@@ -235,7 +241,7 @@ TEST_F(KxconfigCheck, ExpandsNoReferences)
     }
     Write("<!DOCTYPE cfg [\n<!ENTITY e \"" + entity + "\">\n]>\n<cfg><a>" + references +
           "</a></cfg>");
-    ExpectWarnings({"5: /cfg/a has no value though it holds "
+    ExpectWarnings({"5: /cfg/a has no value although it contains "
                     "\"&e;&e;&e;&e;&e;&e;&e;&e;&e;&e;&e;&e;&e;&\"...: it has 200 children: entity "
                     "reference &e;, entity reference &e;, entity reference &e;, entity reference "
                     "&e;, entity reference &e;, ..."});
@@ -247,8 +253,8 @@ TEST_F(KxconfigCheck, ShowsOfALongTextTheFirstFortyBytesInWholeCharacters)
     const auto expect = [this](const std::string& held, const std::string& shown)
     {
         Write("<cfg><a><![CDATA[" + held + "]]></a></cfg>");
-        ExpectWarnings({"2: /cfg/a has no value though it holds " + shown +
-                        ": its only child is no text: CDATA section"});
+        ExpectWarnings({"2: /cfg/a has no value although it contains " + shown +
+                        ": its only child is not text: CDATA section"});
     };
     expect(text + "y", "\"" + text + "y\"");
     expect(text + "yz", "\"" + text + "y\"...");
@@ -263,7 +269,7 @@ TEST_F(KxconfigCheck, ShowsOfALongTextTheFirstFortyBytesInWholeCharacters)
 TEST_F(KxconfigCheck, WarnsOfNamesThatAKeyCannotHold)
 {
     Write("<cfg>\n<a.b>1</a.b></cfg>");
-    ExpectWarnings({"3: /cfg/a.b cannot be named by a key: its name holds a \".\", which ends a "
+    ExpectWarnings({"3: /cfg/a.b cannot be named by a key: its name contains a \".\", which ends a "
                     "segment"});
 }
 
@@ -346,7 +352,7 @@ TEST_F(KxconfigCheck, TellsWhatSavingChangesFirst)
             "encoding=\\\"ISO-8859-1\\\"?>\" becomes \"<?xml version=\\\"1.0\\\" "
             "encoding=\\\"UTF-8\\\"?>\""});
     expect("\xEF\xBB\xBF" + kDeclaration + "<cfg/>\n",
-           {"1: saving changes the byte order mark, which is lost"});
+           {"1: saving changes the byte order mark, which is removed"});
     expect(kDeclaration + "<cfg>\n<a i='1'/></cfg>\n",
            {"3: saving changes white space or quotes in a tag: \"'1'/></cfg>\" becomes "
             "\"\\\"1\\\"/></cfg>\""});
@@ -354,15 +360,16 @@ TEST_F(KxconfigCheck, TellsWhatSavingChangesFirst)
            {"3: saving changes white space or quotes in a tag: \" i=\\\"1\\\"/></cfg>\" becomes "
             "\"i=\\\"1\\\"/></cfg>\""});
     expect(kDeclaration + "<cfg>\n<a></a></cfg>\n",
-           {"3: saving changes how an empty element is written: \"></a></cfg>\" becomes "
+           {"3: saving changes the notation of an empty element: \"></a></cfg>\" becomes "
             "\"/></cfg>\""});
     expect(kDeclaration + "<cfg>\n<a>&#65;</a></cfg>\n",
-           {"3: saving changes how a character is written: \"&#65;</a></cfg>\" becomes "
+           {"3: saving changes the notation of a character: \"&#65;</a></cfg>\" becomes "
             "\"A</a></cfg>\""});
     expect(kDeclaration + "<cfg>\r\n</cfg>\n",
            {"2: saving changes line ends (carriage returns): \"\\x0d\" becomes \"\""});
     expect(kDeclaration + "<cfg/>", {"2: saving changes the end of the file: \"\\n\" is added"});
-    expect(kDeclaration + "<cfg/>\n\n", {"3: saving changes the end of the file: \"\\n\" is lost"});
+    expect(kDeclaration + "<cfg/>\n\n",
+           {"3: saving changes the end of the file: \"\\n\" is removed"});
 }
 
 TEST_F(KxconfigCheck, TellsThatSavingChangesAFileIfTheLibraryDoesChangeIt)
@@ -464,7 +471,7 @@ TEST_F(KxconfigCheck, TellsThatACompressedFileIsSavedPlain)
         GTEST_SKIP() << "needs an engine that reads compressed files";
     }
     ExpectWarnings(
-        {"1: saving changes the whole file, which is compressed: it is saved as plain text"});
+        {"1: saving changes the whole file: it is compressed, and is saved uncompressed"});
 }
 
 TEST_F(KxconfigCheck, LeavesTheFileAlone)

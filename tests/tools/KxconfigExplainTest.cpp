@@ -75,9 +75,9 @@ TEST_F(KxconfigExplain, TellsLevelByLevelWhatWasComparedWithWhat)
                         "    below /cfg/net[2]: looking for \"ip\"\n"
                         "      line 3: /cfg/net[2]/ip: accepted; value \"10.0.0.2\"\n"
                         "  line 4: /cfg/name: not named \"net\"; suspends the condition for the "
-                        "next element that is\n"
+                        "next element of that name\n"
                         "  line 5: /cfg/net[3]: accepted by name alone: /cfg/name (line 4) "
-                        "suspended the condition \"id=1|id=2\", which it does not fulfil\n"
+                        "suspended the condition \"id=1|id=2\", which it does not fulfill\n"
                         "    below /cfg/net[3]: looking for \"ip\"\n"
                         "      line 5: /cfg/net[3]/ip: accepted; value \"10.0.0.3\"\n"
                         "GetValue(key): \"10.0.0.1\\n10.0.0.2\\n10.0.0.3\"\n"
@@ -99,29 +99,30 @@ TEST_F(KxconfigExplain, TellsThatAnAmpersandAheadOfABarIsPartOfTheValue)
 {
     EXPECT_THAT(Tool({"explain", m_file, "cfg.net@id=1&on=y|id=2.ip"}).out,
                 HasSubstr("  line 2: /cfg/net[1]: rejected: id is \"1\", not \"1&on=y\" (\"&\" "
-                          "ahead of \"|\" is part of the value); or id is \"1\", not \"2\"\n"));
+                          "before \"|\" is part of the value); or id is \"1\", not \"2\"\n"));
 }
 
 TEST_F(KxconfigExplain, TellsOfATermThatNamesNoAttribute)
 {
-    EXPECT_THAT(Tool({"explain", m_file, "cfg.net@id.ip"}).out,
-                HasSubstr("  line 2: /cfg/net[1]: rejected: a term without an attribute name never "
-                          "holds\n"));
+    EXPECT_THAT(
+        Tool({"explain", m_file, "cfg.net@id.ip"}).out,
+        HasSubstr(
+            "  line 2: /cfg/net[1]: rejected: a term without an attribute name is never true\n"));
 }
 
 TEST_F(KxconfigExplain, TellsThatASuspendedConditionWouldHaveHeld)
 {
     EXPECT_THAT(Tool({"explain", m_file, "cfg.net@id=3.ip"}).out,
-                HasSubstr("suspended the condition \"id=3\", which it fulfils anyway\n"));
+                HasSubstr("suspended the condition \"id=3\", which it fulfills anyway\n"));
 }
 
 TEST_F(KxconfigExplain, TellsWhyAnAcceptedElementHasNoValue)
 {
     EXPECT_EQ("  line 1: /cfg/a: accepted; value \"x\"", LineAboutA("<a>x</a>"));
     EXPECT_EQ("  line 1: /cfg/a: accepted; no value: it is empty", LineAboutA("<a/>"));
-    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: its only child is no text: CDATA section",
+    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: its only child is not text: CDATA section",
               LineAboutA("<a><![CDATA[x]]></a>"));
-    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: its only child is no text: entity reference "
+    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: its only child is not text: entity reference "
               "&e;",
               LineAboutA("<a>&e;</a>"));
     EXPECT_EQ("  line 1: /cfg/a: accepted; no value: it has 3 children: text, comment, text",
@@ -164,7 +165,7 @@ TEST_F(KxconfigExplain, TellsThatAForeignRootCountsAsSuccess)
 {
     ExpectExplained("other.name", 1,
                     "line 1: /cfg: the key starts with \"other\", not with the root's name "
-                    "\"cfg\": nothing is sought, and that counts as success\n"
+                    "\"cfg\": nothing is searched, which counts as success\n"
                     "GetValue(key): \"\"\n"
                     "GetValue(key, value): status 0 (success), value \"\"\n");
 }
@@ -172,15 +173,15 @@ TEST_F(KxconfigExplain, TellsThatAForeignRootCountsAsSuccess)
 TEST_F(KxconfigExplain, TellsOfKeysThatNameNothing)
 {
     ExpectExplained("cfg", 2,
-                    "line 1: /cfg: the key \"cfg\" has no \".\", so nothing is sought\n"
+                    "line 1: /cfg: the key \"cfg\" has no \".\", so nothing is searched\n"
                     "GetValue(key): \"\"\n"
                     "GetValue(key, value): status 7 (malformed key), value \"\"\n");
     ExpectExplained("", 2,
-                    "line 1: /cfg: the key is empty, so nothing is sought\n"
+                    "line 1: /cfg: the key is empty, so nothing is searched\n"
                     "GetValue(key): \"\"\n"
                     "GetValue(key, value): status 22 (missing object or empty key), value \"\"\n");
     ExpectExplained("cfg.", 1,
-                    kRoot + "below /cfg: the key ends in \".\", so nothing is sought\n"
+                    kRoot + "below /cfg: the key ends in \".\", so nothing is searched\n"
                             "GetValue(key): \"\"\n"
                             "GetValue(key, value): status -2 (nothing found), value \"\"\n");
     ExpectExplained("cfg.name.x", 0,
@@ -246,16 +247,16 @@ TEST_F(KxconfigExplain, TellsWhatAnUpdateReaches)
     ExpectUpdateExplained(
         "cfg.net@id=2.ip", 0,
         kRoot +
-            "below /cfg: looking, to begin with, for \"net@id=2\"\n"
-            "  line 2: /cfg/net[1]: rejected: id is \"1\", not \"2\"; left out with all that is "
-            "below\n"
+            "below /cfg: looking first for \"net@id=2\"\n"
+            "  line 2: /cfg/net[1]: rejected: id is \"1\", not \"2\"; skipped with everything "
+            "below it\n"
             "  line 3: /cfg/net[2]: accepted as \"net@id=2\": id is \"2\"; no text to replace: its "
-            "only child is no text: element ip\n"
-            "    below /cfg/net[2]: looking, to begin with, for \"ip\"\n"
+            "only child is not text: element ip\n"
+            "    below /cfg/net[2]: looking first for \"ip\"\n"
             "      line 3: /cfg/net[2]/ip: accepted as \"ip\"; its text \"10.0.0.2\" is replaced\n"
             "  line 4: /cfg/name: not \"ip\"\n"
             "  line 5: /cfg/net[3]: not \"ip\"\n"
-            "    below /cfg/net[3]: looking, to begin with, for \"ip\"\n"
+            "    below /cfg/net[3]: looking first for \"ip\"\n"
             "      line 5: /cfg/net[3]/ip: accepted as \"ip\"; its text \"10.0.0.3\" is replaced\n"
             "SetValue(key, value): status 0 (success)\n");
 }
@@ -271,9 +272,9 @@ TEST_F(KxconfigExplain, TellsThatAnUpdateLosesTheLastSegmentAfterARejection)
 TEST_F(KxconfigExplain, TellsThatAnUpdateIgnoresAForeignRootAndATrailingDot)
 {
     EXPECT_THAT(Tool({"explain", "--set", m_file, "other.name"}).out,
-                HasSubstr("that counts as success\nSetValue(key, value): status 0 (success)\n"));
+                HasSubstr("which counts as success\nSetValue(key, value): status 0 (success)\n"));
     ExpectUpdateExplained("cfg.", 1,
-                          kRoot + "below /cfg: the key ends in \".\", so nothing is sought\n"
+                          kRoot + "below /cfg: the key ends in \".\", so nothing is searched\n"
                                   "SetValue(key, value): status -2 (nothing found)\n");
 }
 

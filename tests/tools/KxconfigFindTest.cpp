@@ -109,7 +109,7 @@ TEST_F(KxconfigFind, TellsHowToSelectByANameWithAPrefix)
     const Outcome outcome = Tool({"find", file, "/p:a/p:b"});
     EXPECT_EQ(2, outcome.status);
     EXPECT_THAT(outcome.err,
-                testing::EndsWith("; find knows no prefixes: write *[name()='p:a'] for p:a\n"));
+                testing::EndsWith("; no prefixes are registered: write *[name()='p:a'] for p:a\n"));
     EXPECT_EQ("/p:a/p:b element \"1\"\n",
               Tool({"find", file, "/*[name()='p:a']/*[name()='p:b']"}).out);
     EXPECT_THAT(Tool({"find", file, "//["}).err, testing::Not(testing::HasSubstr("prefix")));

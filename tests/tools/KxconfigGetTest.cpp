@@ -70,10 +70,10 @@ TEST_F(KxconfigGet, RefusesAMalformedKey)
 {
     for (const std::string key : {"", "gateway", "other"})
     {
-        ExpectComplaint(Tool({"get", kGateway, key}), 2,
-                        "malformed key \"" + key +
-                            "\": it names the root element and at least one "
-                            "more, as in root.name");
+        ExpectComplaint(
+            Tool({"get", kGateway, key}), 2,
+            "malformed key \"" + key +
+                "\": a key names the root element and at least one more, as in root.name");
     }
 }
 
@@ -90,7 +90,7 @@ TEST_F(KxconfigGet, RefusesBadUsage)
                     "The following argument was not expected: --frobnicate" + kUsage);
     ExpectComplaint(Tool({"get"}), 2, "FILE is required" + kUsage);
     ExpectComplaint(Tool({"get", kGateway}), 2, "KEY is required" + kUsage);
-    ExpectComplaint(Tool({"get", "-", "a.b"}), 2, "FILE: \"-\" is no file; name one" + kUsage);
+    ExpectComplaint(Tool({"get", "-", "a.b"}), 2, "FILE: \"-\" is not a file name" + kUsage);
     EXPECT_EQ(2, Tool({"get", kGateway, "a.b", "c"}).status);
 }
 
@@ -181,7 +181,7 @@ TEST_F(KxconfigGet, RefusesABadLogMask)
     EXPECT_EQ(2, outcome.status);
     EXPECT_EQ("", outcome.out);
     EXPECT_THAT(outcome.err,
-                StartsWith("kxconfig: --log-mask: \"loud\" is not a log mask; it is "));
+                StartsWith("kxconfig: --log-mask: \"loud\" is not a log mask; expected "));
 }
 
 TEST_F(KxconfigGet, HelpShowsExamples)

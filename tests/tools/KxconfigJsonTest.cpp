@@ -83,7 +83,7 @@ TEST_F(KxconfigJson, CheckGivesEachWarning)
     const json noValue = {{"line", 3},
                           {"kind", "key without a value"},
                           {"text", "\"cfg.net@id=2.name\" has no value: it leads as far as "
-                                   "/cfg/net[2]; kxconfig explain tells why"}};
+                                   "/cfg/net[2]; kxconfig explain shows the reason"}};
     EXPECT_THAT(unfound.at("results"), testing::Contains(noValue));
     EXPECT_EQ(json::array(), unfound.at("messages"));
 }
@@ -98,7 +98,7 @@ TEST_F(KxconfigJson, ExplainGivesEachStep)
         {"depth", 1},
         {"line", 2},
         {"location", "/cfg/net[1]"},
-        {"sought", {{"name", "net"}, {"condition", "id=2"}}},
+        {"segment", {{"name", "net"}, {"condition", "id=2"}}},
         {"verdict", "rejected"},
         {"terms", {{{"attribute", "id"}, {"expected", "2"}, {"actual", "1"}, {"holds", false}}}},
         {"value", nullptr}};

@@ -197,7 +197,7 @@ TEST_F(KxconfigKeys, SaysThatThereIsNone)
 {
     const std::string empty = m_folder.Write("empty.xml", "<cfg><a/></cfg>");
     ExpectComplaint(Tool({"keys", empty}), 1,
-                    "nothing found: " + empty + " holds no value that a key path can name");
+                    "nothing found: " + empty + " has no value that a key path can name");
     const std::string dotted = m_folder.Write("dotted.xml", "<c.f><a>1</a></c.f>");
     EXPECT_EQ(1, Tool({"keys", dotted}).status);
     EXPECT_EQ(3, Tool({"keys", m_folder.Path("missing.xml")}).status);

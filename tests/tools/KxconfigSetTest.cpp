@@ -58,8 +58,9 @@ protected:
     {
         EXPECT_EQ(4, outcome.status);
         EXPECT_EQ("", outcome.out);
-        EXPECT_THAT(outcome.err, testing::EndsWith("\nkxconfig: not saved: " + m_file +
-                                                   " was changed by somebody else meanwhile\n"));
+        EXPECT_THAT(outcome.err,
+                    testing::EndsWith("\nkxconfig: not saved: " + m_file +
+                                      " was changed by another program in the meantime\n"));
     }
 
     long FilesInFolder() const
@@ -120,7 +121,7 @@ TEST_F(KxconfigSet, OutputNeedsAName)
 {
     const std::string seeHelp = " (kxconfig --help shows the usage)";
     ExpectRefused({"set", m_file, "cfg.name", "x", "--output", ""}, 2,
-                  "--output: \"\" is no file; name one" + seeHelp);
+                  "--output: \"\" is not a file name" + seeHelp);
     EXPECT_EQ(2, Tool({"set", m_file, "cfg.name", "x", "--output="}).status);
     ExpectUntouched();
 }
@@ -129,7 +130,7 @@ TEST_F(KxconfigSet, SameTextIsNotSavedAgain)
 {
     const Outcome outcome = Tool({"set", m_file, "cfg.name", "box"});
     EXPECT_EQ(0, outcome.status);
-    EXPECT_EQ("nothing changed: the text is the same already\n", outcome.out);
+    EXPECT_EQ("nothing changed: the text is already the same\n", outcome.out);
     ExpectUntouched();
 }
 
@@ -160,8 +161,8 @@ TEST_F(KxconfigSet, LeavesTheFileAloneWhenNothingIsFound)
 TEST_F(KxconfigSet, LeavesTheFileAloneWhenTheKeyIsMalformed)
 {
     ExpectRefused({"set", m_file, "cfg", "x"}, 2,
-                  "malformed key \"cfg\": it names the root element and at least one more, as in "
-                  "root.name");
+                  "malformed key \"cfg\": a key names the root element and at least one more, as "
+                  "in root.name");
     EXPECT_EQ(2, Tool({"set", m_file, "cfg.name"}).status);
     EXPECT_EQ(2, Tool({"set", "-", "cfg.name", "x"}).status);
     EXPECT_EQ(2, Tool({"set", m_file, "cfg.name", "x", "--output", "-"}).status);
@@ -192,7 +193,7 @@ TEST_F(KxconfigSet, RefusesToSaveWhatWouldNotLoadAgain)
     EXPECT_EQ(4, outcome.status);
     EXPECT_EQ("", outcome.out);
     EXPECT_THAT(outcome.err, testing::StartsWith("kxconfig: not saved: " + m_file +
-                                                 " would not load any more, line 2: "));
+                                                 " would no longer load, line 2: "));
     EXPECT_EQ(1, std::count(outcome.err.begin(), outcome.err.end(), '\n'));
     ExpectUntouched();
 }
@@ -241,7 +242,7 @@ TEST_F(KxconfigSet, RefusesAReferenceToACharacterThatXmlDoesNotHave)
           "&#x10000000000000041;"})
     {
         ExpectRefused({"set", m_file, "cfg.name", value}, 2,
-                      "VALUE is not XML text: it refers to a character that XML does not have");
+                      "VALUE is not XML text: it refers to a character that XML does not allow");
     }
 }
 
@@ -324,7 +325,7 @@ TEST_F(KxconfigSet, SaysThatItIsTheFolderThatMustNotBeWritten)
         RunProgram({KX_CONFIG_TOOL, "set", m_file, "cfg.name", "crate"}, {}, 65534);
     EXPECT_EQ(4, outcome.status);
     EXPECT_EQ("kxconfig: cannot save " + m_file +
-                  ": no new file can be made in its folder: Permission denied\n",
+                  ": cannot create a file in its directory: Permission denied\n",
               outcome.err);
     ExpectUntouched();
 }

@@ -116,6 +116,6 @@ TEST_F(KxconfigUsage, EveryVerbRefusesStandardInput)
     for (const std::string& verb : m_verbs)
     {
         ExpectComplaint(Tool({verb, "-", "a.b", "c"}), 2,
-                        "FILE: \"-\" is no file; name one (kxconfig --help shows the usage)");
+                        "FILE: \"-\" is not a file name (kxconfig --help shows the usage)");
     }
 }

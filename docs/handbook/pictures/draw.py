@@ -4,8 +4,8 @@
 usage: draw.py [--check] KXCONFIG PAGE
 
 A page asks for one with the comment <!-- picture: NAME FILE KEY VALUE -->, where FILE is an XML block of the page
-that is marked with <!-- file: FILE -->. What each element is compared with is worked out here; which of them
-change is what `kxconfig set --dry-run` says, and the two must agree. --check writes nothing and fails if a picture
+that is marked with <!-- file: FILE -->. The script computes what each element is compared with; which of them
+change is the output of `kxconfig set --dry-run`, and the two must agree. --check writes nothing and fails if a picture
 is not up to date.
 """
 
@@ -47,20 +47,20 @@ def update(parent, key):
     """The walk of an update; notes at each box what became of it."""
     first, dot, rest = key.partition(".")
     again, onward = (first, rest) if dot else ("", key)
-    sought = first
+    segment = first
     for box in parent.below:
-        name, _, condition = sought.partition("@")
-        box.note = f"compared with {sought}" if sought else "compared with an empty name"
+        name, _, condition = segment.partition("@")
+        box.note = f"compared with {segment}" if segment else "compared with an empty name"
         if name == box.tag and condition and not holds(condition, box):
-            box.note, box.state = f"not {sought}: left out", "out"
+            box.note, box.state = f"not {segment}: skipped", "out"
             for inner in box.all():
                 inner.state = "out"
-            sought = again
+            segment = again
             continue
         if name == box.tag:
-            box.note = f"is {sought}"
+            box.note = f"is {segment}"
             box.state = "changed" if box.text else "seen"
-        sought = onward
+        segment = onward
         update(box, onward)
 
 
@@ -136,9 +136,9 @@ def main(arguments):
         name, file, key, value = match.groups()[2:]
         top, svg = picture(files[file], key, value)
         worked_out = [box.path for box in top.all() if box.state == "changed"]
-        told = changed_by(kxconfig, files[file], key, value)
-        if worked_out != told:
-            sys.exit(f"{name}: the picture would show {worked_out}, but the library changes {told}")
+        changed = changed_by(kxconfig, files[file], key, value)
+        if worked_out != changed:
+            sys.exit(f"{name}: the picture would show {worked_out}, but the library changes {changed}")
         target = pathlib.Path(__file__).parent / f"{name}.svg"
         if not check:
             target.write_text(svg)

@@ -40,7 +40,7 @@ void CheckName(const xmlNode* element, Warnings& warnings)
         warnings.Warn(
             element, "unreachable element",
             warnings.LocationOf(element) +
-                " cannot be named by a key: its name holds a \".\", which ends a segment");
+                " cannot be named by a key: its name contains a \".\", which ends a segment");
     }
 }
 
@@ -51,7 +51,7 @@ void CheckText(const xmlNode* element, Warnings& warnings)
     if (!text.empty())
     {
         warnings.Warn(element, "invisible value",
-                      warnings.LocationOf(element) + " has no value though it holds " +
+                      warnings.LocationOf(element) + " has no value although it contains " +
                           QuotedStart(text) + ": " +
                           (isValue ? "it is the root, and a key names elements below it"
                                    : WhyNoValue(element)));

@@ -32,19 +32,20 @@ void CheckOrder(const Order& order, const xmlNode* parent, const std::string& se
     {
         if (warnings.IsNew("suspended condition", parent, name))
         {
-            warnings.Warn(order.taken, "suspended condition",
-                          warnings.LocationOf(order.taken) + " is taken for " + Quoted(segment) +
-                              " though it does not fulfil it: " + warnings.Place(order.suspender) +
-                              ", of another name and in front of it, suspends the condition");
+            warnings.Warn(
+                order.taken, "suspended condition",
+                warnings.LocationOf(order.taken) + " is accepted for " + Quoted(segment) +
+                    " although it does not fulfill it: " + warnings.Place(order.suspender) +
+                    ", a preceding element of another name, suspends the condition");
         }
     }
     else if (order.other != nullptr && order.rejected != nullptr &&
              warnings.IsNew("condition depends on order", parent, name))
     {
         warnings.Warn(order.rejected, "condition depends on order",
-                      warnings.LocationOf(order.rejected) + " would be taken for " +
+                      warnings.LocationOf(order.rejected) + " would be accepted for " +
                           Quoted(segment) + " if " + warnings.Place(order.other) +
-                          ", of another name, came right before it");
+                          ", which has another name, preceded it directly");
     }
 }
 
@@ -120,7 +121,7 @@ std::string WhyNoValueUnder(const std::string& key, const xmlNode* root, const x
         return "it starts with " + Quoted(Text(kx::KeySplit(kx::TextView(key)).first)) +
                ", but the root element is " + Quoted(Text(root->name));
     }
-    return "it leads as far as " + warnings.LocationOf(end) + "; kxconfig explain tells why";
+    return "it leads as far as " + warnings.LocationOf(end) + "; kxconfig explain shows the reason";
 }
 
 void WarnOfNoValue(const Trail& trail, xmlDoc* document, const std::string& key, Warnings& warnings)

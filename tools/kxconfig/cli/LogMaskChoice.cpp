@@ -22,7 +22,7 @@ std::string LogMaskError(const std::string& text)
     unsigned int mask = 0;
     return ParseLogMask(text.c_str(), mask)
                ? std::string()
-               : "\"" + text + "\" is not a log mask; it is " + g_LogMaskHelp;
+               : "\"" + text + "\" is not a log mask; expected " + g_LogMaskHelp;
 }
 
 LogMaskChoice::LogMaskChoice(const std::string& mask) : m_former(g_LumLogParams.xmlConfigParserMask)

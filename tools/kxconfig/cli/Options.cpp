@@ -13,13 +13,13 @@ namespace
  */
 std::string StandardStreamError(const std::string& file)
 {
-    return file == "-" ? "\"-\" is no file; name one" : std::string();
+    return file == "-" ? "\"-\" is not a file name" : std::string();
 }
 
 /** An empty name would stand for the file that was loaded, and overwrite it. */
 std::string NewFileError(const std::string& file)
 {
-    return file.empty() ? "\"\" is no file; name one" : StandardStreamError(file);
+    return file.empty() ? "\"\" is not a file name" : StandardStreamError(file);
 }
 
 /** A command with the argument FILE, which @p run carries out. */
@@ -70,24 +70,23 @@ void AddSet(CLI::App& app, Request& request)
 void AddExplain(CLI::App& app, Request& request)
 {
     CLI::App* const explain =
-        AddCommand(app, "explain", "tell level by level why a key path gives what it gives",
+        AddCommand(app, "explain", "explain level by level what a lookup of a key path finds",
                    Explain, request.explain, request);
     AddKey(*explain, request.explain.key);
     explain->add_flag("--set", request.explain.isUpdate,
-                      "tell what an update would reach; changes nothing");
+                      "explain what an update would reach; changes nothing");
 }
 
 void AddCheck(CLI::App& app, Request& request)
 {
-    AddCommand(app, "check", "warn of what will surprise somebody who looks values up", Check,
-               request.check, request)
+    AddCommand(app, "check", "report pitfalls for lookups", Check, request.check, request)
         ->add_option("KEY", request.check.keys, "key paths to check instead of the file's own");
 }
 
 void AddKeys(CLI::App& app, Request& request)
 {
-    AddCommand(app, "keys", "print every key path under which the file holds a value", Keys,
-               request.keys, request);
+    AddCommand(app, "keys", "print every key path that has a value in the file", Keys, request.keys,
+               request);
 }
 
 void AddFind(CLI::App& app, Request& request)
@@ -101,7 +100,7 @@ void AddFind(CLI::App& app, Request& request)
 void AddGeneralOptions(CLI::App& app, Request& request)
 {
     app.set_version_flag("--version", "kxconfig " KX_VERSION);
-    app.add_flag("--json", "answer with one JSON object");
+    app.add_flag("--json", "print one JSON object");
     CLI::Option* const mask =
         app.add_option("--log-mask", request.logMask, std::string("log mask: ") + g_LogMaskHelp)
             ->type_name("MASK")

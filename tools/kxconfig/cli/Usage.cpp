@@ -20,30 +20,30 @@ struct Example
 const Example kExamples[] = {
     {"get device.xml cfg.name", "print a value"},
     {"get device.xml cfg.net.ip", "print the values of every net, one on a line"},
-    {"get device.xml 'cfg.net@id=2.ip'", "of the net whose attribute id is 2"},
-    {"get device.xml 'cfg.net@id=1|id=2.ip'", "of either"},
-    {"explain device.xml 'cfg.net@id=2.ip'", "tell why a key gives what it gives, or nothing"},
-    {"explain --set device.xml cfg.name", "tell what an update would reach, and why"},
-    {"check device.xml", "warn of what will surprise somebody"},
+    {"get device.xml 'cfg.net@id=2.ip'", "print that of the net whose attribute id is 2"},
+    {"get device.xml 'cfg.net@id=1|id=2.ip'", "print those of both"},
+    {"explain device.xml 'cfg.net@id=2.ip'", "explain what a key finds, and why"},
+    {"explain --set device.xml cfg.name", "explain what an update would reach, and why"},
+    {"check device.xml", "report pitfalls for lookups"},
     {"set --dry-run device.xml cfg.name box", "show what would change"},
     {"set device.xml cfg.name box", "change it and save the file"},
     {"set device.xml cfg.offset -- -5", "a value that starts with a dash"},
     {"keys device.xml", "print all keys and values"},
     {"find device.xml '//net[@id]'", "print the nodes that XPath selects"},
-    {"--json get device.xml cfg.name", "answer in JSON, for scripts"},
+    {"--json get device.xml cfg.name", "print JSON, for scripts"},
 };
 
 const char* const kRecords =
-    "The library's log records go to standard error. kxconfig asks for none unless --trace,\n"
-    "--log-mask or the environment variable KX_LOG_MASK says otherwise.\n"
-    "Colours are for terminals, and for those who have not set NO_COLOR.";
+    "The library's log records go to standard error. None are written unless --trace, --log-mask\n"
+    "or the environment variable KX_LOG_MASK selects them.\n"
+    "Output to a terminal is colored unless NO_COLOR is set.";
 
 const char* const kKeyPaths =
-    "A key path names the root element and then one element for each level, joined by dots. After "
-    "@ an attribute condition narrows the elements of a name: terms name=value are joined by | "
-    "(or) and & (and) and combined from left to right. An element of another name on a level "
-    "suspends the condition for the next element that matches by name. An element has a value only "
-    "if a text is its one and only child.";
+    "A key path names the root element and then one element for each level, joined by dots. A "
+    "condition after @ selects elements by their attributes: terms name=value are joined by | (or) "
+    "and & (and) and combined from left to right. An element of another name on a level suspends "
+    "the condition for the next element that matches by name. An element has a value only if text "
+    "is its only child.";
 
 /** @return @p text as the language of man has to have it to print it as it is. */
 std::string Escaped(const std::string& text)

@@ -39,16 +39,16 @@ std::string CompareRoot(const xmlNode* root, const std::string& key)
     const kx::KeySplit split((kx::TextView(key)));
     if (key.empty())
     {
-        return "the key is empty, so nothing is sought";
+        return "the key is empty, so nothing is searched";
     }
     if (!split.hasRest)
     {
-        return "the key " + Quoted(key) + " has no \".\", so nothing is sought";
+        return "the key " + Quoted(key) + " has no \".\", so nothing is searched";
     }
     if (!kx::SameText(root->name, split.first))
     {
         return "the key starts with " + Quoted(Text(split.first)) + ", not with the root's name " +
-               Quoted(Text(root->name)) + ": nothing is sought, and that counts as success";
+               Quoted(Text(root->name)) + ": nothing is searched, which counts as success";
     }
     return "the key starts with the root's name";
 }
@@ -69,7 +69,7 @@ struct RootEvent
         return {{"event", "root"},
                 {"line", LineNumberOf(root)},
                 {"location", Locations().Of(root)},
-                {"told", text},
+                {"text", text},
                 {"depth", 0}};
     }
 };

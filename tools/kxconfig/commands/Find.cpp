@@ -166,7 +166,7 @@ std::string AdviceOnPrefixes()
 {
     const auto error = xmlGetLastError();
     const bool isPrefix = error != nullptr && error->code == XML_XPATH_UNDEF_PREFIX_ERROR;
-    return isPrefix ? "; find knows no prefixes: write *[name()='p:a'] for p:a" : "";
+    return isPrefix ? "; no prefixes are registered: write *[name()='p:a'] for p:a" : "";
 }
 
 Result Evaluate(CXmlParser& document, const std::string& expression)

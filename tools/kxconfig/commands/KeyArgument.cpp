@@ -13,7 +13,7 @@ void RequireWellFormedKey(const std::string& key)
     {
         throw Failure(ExitStatus::BadUsage,
                       "malformed key " + Quoted(key) +
-                          ": it names the root element and at least one more, as in root.name");
+                          ": a key names the root element and at least one more, as in root.name");
     }
 }
 

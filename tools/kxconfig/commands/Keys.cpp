@@ -33,7 +33,7 @@ ExitStatus Keys(const KeysArguments& arguments, Report& report)
     if (keys.empty())
     {
         throw Failure(ExitStatus::NothingFound, "nothing found: " + arguments.file +
-                                                    " holds no value that a key path can name");
+                                                    " has no value that a key path can name");
     }
     for (const std::string& key : keys)
     {

@@ -63,7 +63,7 @@ void AddChanges(const std::vector<ChangedText>& changes, Report& report)
     }
     if (changes.empty())
     {
-        report.AddLine("nothing changed: the text is the same already");
+        report.AddLine("nothing changed: the text is already the same");
     }
 }
 

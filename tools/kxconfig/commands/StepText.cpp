@@ -23,14 +23,14 @@ std::string DescribeTerm(const xmlNode* element, const TestedTerm& term)
 {
     if (term.attribute.empty())
     {
-        return "a term without an attribute name never holds";
+        return "a term without an attribute name is never true";
     }
     const std::optional<std::string> actual = ActualValue(element, term);
     std::string text = Text(term.attribute) + " is " + (actual ? Quoted(*actual) : "absent");
     text += term.holds ? "" : ", not " + Quoted(Text(term.expected));
     if (term.endsWithOr && term.expected.find('&') != std::string_view::npos)
     {
-        text += " (\"&\" ahead of \"|\" is part of the value)";
+        text += " (\"&\" before \"|\" is part of the value)";
     }
     return text;
 }

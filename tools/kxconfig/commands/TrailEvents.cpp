@@ -34,7 +34,7 @@ std::string LevelEvent::Line() const
     std::string line = "below " + narration.locations.Of(level.parent) + ": ";
     if (level.keyEnds)
     {
-        line += "the key ends in \".\", so nothing is sought";
+        line += "the key ends in \".\", so nothing is searched";
     }
     else if (level.steps.empty())
     {
@@ -42,7 +42,7 @@ std::string LevelEvent::Line() const
     }
     else
     {
-        line += narration.walk == Walk::Lookup ? "looking for " : "looking, to begin with, for ";
+        line += narration.walk == Walk::Lookup ? "looking for " : "looking first for ";
         line += DescribeSegment(level.steps.front());
     }
     return Indented(depth, line);
@@ -52,7 +52,7 @@ Json LevelEvent::InJson() const
 {
     return {{"event", "level"},
             {"location", narration.locations.Of(level.parent)},
-            {"sought", level.steps.empty() ? Json() : SegmentInJson(level.steps.front())},
+            {"segment", level.steps.empty() ? Json() : SegmentInJson(level.steps.front())},
             {"depth", depth}};
 }
 
@@ -67,7 +67,7 @@ Json StepEvent::InJson() const
     Json result = {{"event", "element"},
                    {"line", LineNumberOf(step.element)},
                    {"location", narration.locations.Of(step.element)},
-                   {"sought", SegmentInJson(step)},
+                   {"segment", SegmentInJson(step)},
                    {"verdict", VerdictInJson(step)},
                    {"terms", TermsInJson(step)},
                    {"value", step.text ? Json(*step.text) : Json()}};
@@ -88,7 +88,7 @@ std::string StepEvent::DescribeVerdict() const
         return report.Paint(Color::Faint, DescribeOtherName());
     case Verdict::Rejected:
         return report.Paint(Color::Bad, "rejected") + ": " + DescribeTerms(step) +
-               (narration.walk == Walk::Update ? "; left out with all that is below" : "");
+               (narration.walk == Walk::Update ? "; skipped with everything below it" : "");
     default:
         return report.Paint(Color::Good, "accepted") + DescribeAcceptance() + DescribeValue();
     }
@@ -102,7 +102,7 @@ std::string StepEvent::DescribeOtherName() const
     }
     const bool suspends = !step.condition.empty() && suspender == nullptr;
     return "not named " + Quoted(Text(step.name)) +
-           (suspends ? "; suspends the condition for the next element that is" : "");
+           (suspends ? "; suspends the condition for the next element of that name" : "");
 }
 
 std::string StepEvent::DescribeAcceptance() const
@@ -119,7 +119,7 @@ std::string StepEvent::DescribeAcceptance() const
 std::string StepEvent::DescribeSuspension() const
 {
     const std::string wouldHold =
-        Fulfils(step.element, step.condition) ? "fulfils anyway" : "does not fulfil";
+        Fulfils(step.element, step.condition) ? "fulfills anyway" : "does not fulfill";
     return " by name alone: " + narration.locations.Of(suspender) + " (line " + LineOf(suspender) +
            ") suspended the condition " + Quoted(Text(step.condition)) + ", which it " + wouldHold;
 }

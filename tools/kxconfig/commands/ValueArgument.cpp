@@ -24,7 +24,7 @@ void RequireCharacter(const std::string& digits, int base)
     // The engine drops &#0; and stores less of the value than was given.
     if (error != std::errc() || !xmlIsCharQ(code))
     {
-        RefuseValue("it refers to a character that XML does not have");
+        RefuseValue("it refers to a character that XML does not allow");
     }
 }
 
@@ -80,7 +80,7 @@ void RequireXmlText(const std::string& value)
     // characters that they cannot save.
     if (!HasOnlyXmlCharacters(value))
     {
-        RefuseValue("it has control characters, or bytes that are no UTF-8");
+        RefuseValue("it contains control characters, or bytes that are not UTF-8");
     }
     RequireReferencesOnly(value);
 }

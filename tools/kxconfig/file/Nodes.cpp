@@ -72,7 +72,7 @@ std::string WhyNoValue(const xmlNode* element)
     }
     if (element->children->next == nullptr)
     {
-        return "its only child is no text: " + KindOf(element->children);
+        return "its only child is not text: " + KindOf(element->children);
     }
     std::string kinds;
     int count = 0;

@@ -114,12 +114,12 @@ std::string KindOfDifference(const std::string& before, const std::string& after
     }
     if (before[position] == '&' || after[position] == '&')
     {
-        return "how a character is written";
+        return "the notation of a character";
     }
     if (before.compare(position, 2, "\"/") == 0 || after.compare(position, 2, "/>") == 0 ||
         before.compare(position, 2, "/>") == 0)
     {
-        return "how an empty element is written";
+        return "the notation of an empty element";
     }
     return IsInTag(before, position) ? "white space or quotes in a tag" : "the text";
 }
@@ -130,7 +130,7 @@ std::string DifferenceAtTheEnd(const std::string& before, const std::string& aft
     const bool isAdded = before.size() < after.size();
     const std::string& longer = isAdded ? after : before;
     const std::string end = longer.substr(std::min(before.size(), after.size()));
-    return "the end of the file: " + QuotedStart(end) + (isAdded ? " is added" : " is lost");
+    return "the end of the file: " + QuotedStart(end) + (isAdded ? " is added" : " is removed");
 }
 
 Difference FirstDifference(const std::string& before, const std::string& after, long line)
@@ -158,7 +158,7 @@ std::optional<std::string> WholeChange(const std::string& bytes)
     }
     if (start == "\x1F\x8B")
     {
-        return "the whole file, which is compressed: it is saved as plain text";
+        return "the whole file: it is compressed, and is saved uncompressed";
     }
     return std::nullopt;
 }
@@ -168,7 +168,7 @@ std::vector<Difference> Compare(const Parts& before, const Parts& after)
     std::vector<Difference> differences;
     if (before.hasMark)
     {
-        differences.push_back({1, "the byte order mark, which is lost"});
+        differences.push_back({1, "the byte order mark, which is removed"});
     }
     if (before.declaration != after.declaration)
     {
@@ -215,6 +215,6 @@ void RequireLoadsAgain(CXMLReader& reader, const std::string& target)
     if (again == nullptr)
     {
         throw Failure(ExitStatus::NotSaved,
-                      "not saved: " + target + " would not load any more, line " + error.Text());
+                      "not saved: " + target + " would no longer load, line " + error.Text());
     }
 }

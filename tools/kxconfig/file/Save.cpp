@@ -91,7 +91,7 @@ public:
         if (file < 0)
         {
             // A user who may write the file would look for the reason there.
-            throw CannotSave(path, "no new file can be made in its folder: " + SystemReason());
+            throw CannotSave(path, "cannot create a file in its directory: " + SystemReason());
         }
         close(file);
     }
@@ -155,7 +155,7 @@ void SaveBeside(CXMLWriter& writer, const std::string& path, const fs::path& tar
     if (loaded != nullptr && loaded->HasChanged(target))
     {
         throw Failure(ExitStatus::NotSaved,
-                      "not saved: " + path + " was changed by somebody else meanwhile");
+                      "not saved: " + path + " was changed by another program in the meantime");
     }
     if (!replacement.TakePlace())
     {

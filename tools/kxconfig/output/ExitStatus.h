@@ -19,12 +19,12 @@ struct ExitStatusMeaning
 
 /** The one table of them: --help, the man page and the documentation show it. */
 const ExitStatusMeaning kExitStatuses[] = {
-    {ExitStatus::Done, "done: found, changed, or nothing to warn of"},
+    {ExitStatus::Done, "success: found, changed, or no warnings"},
     {ExitStatus::NothingFound, "nothing found; check: there are warnings"},
-    {ExitStatus::BadUsage, "bad usage, malformed key or expression"},
+    {ExitStatus::BadUsage, "usage error, malformed key or expression"},
     {ExitStatus::BadFile, "the file cannot be read, or is not well-formed XML"},
     {ExitStatus::NotSaved,
-     "saving or printing failed, or memory ran out; a file that could not be saved is as it was"},
+     "saving or printing failed, or memory ran out; a file that could not be saved is unchanged"},
 };
 
 #endif
