@@ -23,6 +23,21 @@ inline xmlNode* ElementFrom(xmlNode* node)
     return node;
 }
 
+/** @return the namespace of @p node, or null; only elements and attributes have one. */
+inline const xmlNs* SpaceOf(const xmlNode* node)
+{
+    // They have it at different places of the record.
+    switch (node->type)
+    {
+    case XML_ELEMENT_NODE:
+        return node->ns;
+    case XML_ATTRIBUTE_NODE:
+        return reinterpret_cast<const xmlAttr*>(node)->ns;
+    default:
+        return 0;
+    }
+}
+
 /** @return the text node that is the only child of @p element, or null. */
 inline xmlNode* OnlyTextChild(const xmlNode* element)
 {

@@ -83,6 +83,21 @@ TEST_F(KxconfigFind, PrintsEveryKindOfNode)
     EXPECT_EQ("/cfg/p:e element\n", Find("/cfg/*[3]"));
 }
 
+TEST_F(KxconfigFind, DescribesWhereANodeInADtdIs)
+{
+    // No path leads to it: to XPath a document has no DTD.
+    const std::string file =
+        m_folder.Write("dtd.xml", "<!DOCTYPE c [<!-- hi --><?p q?><!ELEMENT c ANY>]><c/>");
+    EXPECT_EQ("(in the document type declaration) comment \" hi \"\n",
+              Tool({"find", file, "//comment()"}).out);
+    EXPECT_EQ("(in the document type declaration) processing-instruction \"q\"\n",
+              Tool({"find", file, "//processing-instruction()"}).out);
+    const Outcome outcome = Tool({"--json", "find", file, "//comment()"});
+    const nlohmann::json result = nlohmann::json::parse(outcome.out).at("results").at(0);
+    EXPECT_TRUE(result.at("location").is_null());
+    EXPECT_EQ("(in the document type declaration)", result.at("place"));
+}
+
 TEST_F(KxconfigFind, PrintsThePrefixOfAnAttribute)
 {
     const std::string file = m_folder.Write("prefix.xml", "<a xmlns:p='urn:p' p:id='1' id='2'/>");

@@ -8,6 +8,7 @@
 #include <algorithm>
 
 using namespace kxtest;
+using testing::HasSubstr;
 using testing::StartsWith;
 
 namespace
@@ -87,6 +88,29 @@ TEST_F(KxconfigNasty, FilesThatAreNoXmlAreToldWithTheLine)
         deep += "<a>";
     }
     expectOnLine(2, deep);
+}
+
+TEST_F(KxconfigNasty, DeclarationsOfEveryKind)
+{
+    const std::string kinds[] = {
+        "<!NOTATION a SYSTEM 'v'>",        "<!-- a -->",
+        "<?a b?>",                         "<!ELEMENT cfg ANY>",
+        "<!ATTLIST cfg a CDATA #IMPLIED>", "<!ENTITY a 'b'>",
+        "<!ENTITY % a 'b'>",               "<!ENTITY a SYSTEM 'b'>",
+        "<!NOTATION a SYSTEM 'v'><!ENTITY b SYSTEM 'c' NDATA a>"};
+    for (const std::string& kind : kinds)
+    {
+        const std::string file =
+            m_folder.Write("cfg.xml", "<!DOCTYPE cfg [" + kind + "]><cfg><a>1</a></cfg>");
+        for (std::vector<std::string> arguments : VerbsOn(file))
+        {
+            SCOPED_TRACE(arguments[0] + " " + kind);
+            EXPECT_LE(Tool(arguments).status, arguments[0] == "check" ? 1 : 0);
+            EXPECT_TRUE(InJson(arguments).at("messages").empty());
+        }
+        EXPECT_THAT(Tool({"find", file, "//node()|//@*|//namespace::*"}).out,
+                    HasSubstr("\n/cfg/a/text() text \"x\"\n"));
+    }
 }
 
 TEST_F(KxconfigNasty, FilesThatOthersMustNotRead)

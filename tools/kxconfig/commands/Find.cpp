@@ -119,10 +119,14 @@ Json InJson(const xmlNode* node, Locations& locations)
                 {"value", Text(space->href)}};
     }
     const long line = LineNumberOf(node);
-    Json result = {{"location", locations.Of(node)},
+    Json result = {{"location", HasLocation(node) ? Json(locations.Of(node)) : Json()},
                    {"line", line > 0 ? Json(line) : Json()},
                    {"type", TypeName(node)},
                    {"value", ShowsContent(node) ? Json(ContentOf(node)) : Json()}};
+    if (!HasLocation(node))
+    {
+        result["place"] = locations.Of(node);
+    }
     if (node->type == XML_ELEMENT_NODE)
     {
         result["attributes"] = AttributesInJson(node);

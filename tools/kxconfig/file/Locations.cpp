@@ -2,14 +2,19 @@
 
 #include "file/Nodes.h"
 
+#include <cstdint>
 #include <map>
-#include <utility>
-#include <vector>
+#include <optional>
+#include <string_view>
+#include <tuple>
 
 namespace
 {
 
-bool HasNoPath(const xmlNode* node)
+/** Where an expression selects a node that has no path: a comment, say. */
+const char* const kWithoutPath = "(in the document type declaration)";
+
+bool IsKindWithLocation(const xmlNode* node)
 {
     switch (node->type)
     {
@@ -20,100 +25,239 @@ bool HasNoPath(const xmlNode* node)
     case XML_COMMENT_NODE:
     case XML_PI_NODE:
     case XML_DOCUMENT_NODE:
-        return false;
-    default:
         return true;
+    default:
+        return false;
     }
+}
+
+/** @return the number of steps in the path of @p node; none if it has no path. */
+std::optional<size_t> DepthOf(const xmlNode* node)
+{
+    size_t depth = 0;
+    for (; node != nullptr && node->type != XML_DOCUMENT_NODE; node = node->parent)
+    {
+        if (!IsKindWithLocation(node))
+        {
+            return std::nullopt;
+        }
+        ++depth;
+    }
+    return depth;
 }
 
 /** @return whether XPath has no name for the element: it is in a namespace without a prefix. */
 bool IsNameless(const xmlNode* node)
 {
-    return node->type == XML_ELEMENT_NODE && node->ns != nullptr && node->ns->prefix == nullptr;
+    const xmlNs* const space = kx::SpaceOf(node);
+    return node->type == XML_ELEMENT_NODE && space != nullptr && space->prefix == nullptr;
 }
 
-/** @return a step without its position: nodes of one parent that share it are numbered. */
-std::string StepOf(const xmlNode* node)
+/** Appends a step without its position: nodes of one parent that share it are numbered. */
+void AppendStep(std::string& text, const xmlNode* node)
 {
     switch (node->type)
     {
     case XML_ATTRIBUTE_NODE:
-        return "/@" + NameWithPrefix(node);
+        text += "@" + NameWithPrefix(node);
+        break;
     case XML_TEXT_NODE:
     case XML_CDATA_SECTION_NODE:
-        return "/text()";
+        text += "text()";
+        break;
     case XML_COMMENT_NODE:
-        return "/comment()";
+        text += "comment()";
+        break;
     case XML_PI_NODE:
-        return "/processing-instruction('" + Text(node->name) + "')";
+        text += "processing-instruction('" + Text(node->name) + "')";
+        break;
     default:
-        return IsNameless(node) ? "/*" : "/" + NameWithPrefix(node);
+        text += IsNameless(node) ? "*" : NameWithPrefix(node);
     }
+}
+
+/** What the nodes with the same step have in common: kind, name and prefix. */
+using Alike = std::tuple<xmlElementType, std::string_view, std::string_view>;
+
+std::string_view View(const xmlChar* text)
+{
+    return kx::FromEngine(text);
+}
+
+Alike AlikeOf(const xmlNode* node)
+{
+    const xmlNs* const space = kx::SpaceOf(node);
+    switch (node->type)
+    {
+    case XML_ELEMENT_NODE:
+        // A prefix that is not declared is a part of the name.
+        return {node->type, View(node->name), space == nullptr ? "" : View(space->prefix)};
+    case XML_CDATA_SECTION_NODE:
+        return {XML_TEXT_NODE, "", ""};
+    case XML_PI_NODE:
+        return {node->type, View(node->name), ""};
+    default:
+        return {node->type, "", ""};
+    }
+}
+
+// The mark of a node: its position among the nodes with the same step, from 1, or 0 if there is no
+// other; and in the lowest bit whether its own children are counted.
+
+const uintptr_t kIsCounted = 1;
+
+uintptr_t MarkOf(const xmlNode* node)
+{
+    return reinterpret_cast<uintptr_t>(node->_private);
+}
+
+void SetMark(const xmlNode* node, uintptr_t mark)
+{
+    const_cast<xmlNode*>(node)->_private = reinterpret_cast<void*>(mark);
+}
+
+void SetPosition(const xmlNode* node, uintptr_t position)
+{
+    SetMark(node, position << 1 | (MarkOf(node) & kIsCounted));
+}
+
+/** Numbers children that share a step. */
+class Numbering
+{
+public:
+    /** @return the position of @p node, which comes after those that were numbered before. */
+    size_t Number(const xmlNode* node, const Alike& alike)
+    {
+        Group& group = m_groups[alike];
+        group.first = group.count == 0 ? node : group.first;
+        return ++group.count;
+    }
+
+    /** Takes the position from each node that shares its step with no other. */
+    void RemoveFromSingleNodes() const
+    {
+        for (const auto& [alike, group] : m_groups)
+        {
+            if (group.count == 1)
+            {
+                SetPosition(group.first, 0);
+            }
+        }
+    }
+
+private:
+    struct Group
+    {
+        const xmlNode* first = nullptr;
+        size_t count = 0;
+    };
+
+    std::map<Alike, Group> m_groups;
+};
+
+void NumberChildren(const xmlNode* parent)
+{
+    Numbering named;
+    Numbering elements; // "*" stands for every one
+    for (const xmlNode* node = parent->children; node != nullptr; node = node->next)
+    {
+        const bool isElement = node->type == XML_ELEMENT_NODE;
+        const size_t place = isElement ? elements.Number(node, {}) : 0;
+        SetPosition(node, IsNameless(node) ? place : named.Number(node, AlikeOf(node)));
+    }
+    named.RemoveFromSingleNodes();
+    elements.RemoveFromSingleNodes();
 }
 
 } // namespace
 
-std::string Locations::Of(const xmlNode* node)
+bool HasLocation(const xmlNode* node)
 {
-    std::vector<std::string> steps;
-    for (; node != nullptr && node->type != XML_DOCUMENT_NODE; node = node->parent)
-    {
-        if (HasNoPath(node))
-        {
-            return "";
-        }
-        steps.push_back(StepOf(node) + PositionOf(node));
-    }
-    std::string path;
-    for (auto step = steps.rbegin(); step != steps.rend(); ++step)
-    {
-        path += *step;
-    }
-    return path.empty() ? "/" : path;
+    return DepthOf(node).has_value();
 }
 
-std::string Locations::PositionOf(const xmlNode* node)
+Locations::~Locations()
+{
+    for (const xmlNode* const parent : m_counted)
+    {
+        SetMark(parent, MarkOf(parent) & ~kIsCounted);
+        for (const xmlNode* node = parent->children; node != nullptr; node = node->next)
+        {
+            SetPosition(node, 0);
+        }
+    }
+}
+
+std::string Locations::Of(const xmlNode* node)
+{
+    std::string text;
+    AppendTo(text, node);
+    return text;
+}
+
+void Locations::AppendTo(std::string& text, const xmlNode* node)
+{
+    const std::optional<size_t> depth = DepthOf(node);
+    if (!depth)
+    {
+        text += kWithoutPath;
+        return;
+    }
+    Follow(node, *depth);
+    text += m_path.empty() ? "/" : m_path;
+}
+
+std::string Locations::LastStepOf(const xmlNode* node)
+{
+    std::string step;
+    AppendLastStep(step, node);
+    return step;
+}
+
+bool Locations::IsOnPath(const xmlNode* node, size_t depth) const
+{
+    return depth <= m_steps.size() && m_steps[depth - 1].node == node;
+}
+
+/** Makes the path of @p node, which has @p depth steps, the last one. */
+void Locations::Follow(const xmlNode* node, size_t depth)
+{
+    m_below.clear();
+    for (; depth != 0 && !IsOnPath(node, depth); --depth)
+    {
+        m_below.push_back(node);
+        node = node->parent;
+    }
+    m_steps.resize(depth);
+    m_path.resize(depth == 0 ? 0 : m_steps.back().end);
+    for (auto below = m_below.rbegin(); below != m_below.rend(); ++below)
+    {
+        m_path += '/';
+        AppendLastStep(m_path, *below);
+        m_steps.push_back({*below, m_path.size()});
+    }
+}
+
+void Locations::AppendLastStep(std::string& text, const xmlNode* node)
+{
+    AppendStep(text, node);
+    if (const size_t position = PositionOf(node))
+    {
+        text += '[' + std::to_string(position) + ']';
+    }
+}
+
+size_t Locations::PositionOf(const xmlNode* node)
 {
     if (node->type == XML_ATTRIBUTE_NODE || node->parent == nullptr)
     {
-        return "";
+        return 0;
     }
-    if (m_counted.insert(node->parent).second)
+    if ((MarkOf(node->parent) & kIsCounted) == 0)
     {
-        CountChildren(node->parent);
+        NumberChildren(node->parent);
+        SetMark(node->parent, MarkOf(node->parent) | kIsCounted);
+        m_counted.push_back(node->parent);
     }
-    const auto position = m_positions.find(node);
-    return position == m_positions.end() ? "" : "[" + std::to_string(position->second) + "]";
-}
-
-void Locations::CountChildren(const xmlNode* parent)
-{
-    struct Alike
-    {
-        const xmlNode* first = nullptr;
-        long count = 0;
-    };
-    std::map<std::pair<std::string, bool>, Alike> groups;
-    const auto countAs = [&groups](const std::string& step, bool hasSpace, const xmlNode* node)
-    {
-        Alike& group = groups[{step, hasSpace}];
-        group.first = group.count == 0 ? node : group.first;
-        return ++group.count;
-    };
-    for (const xmlNode* node = parent->children; node != nullptr; node = node->next)
-    {
-        const bool isElement = node->type == XML_ELEMENT_NODE;
-        // "*" stands for every element, so that all of them count for one without a name.
-        const long place = isElement ? countAs("/*", true, node) : 0;
-        // A prefix that is not declared is a part of the name.
-        const bool hasSpace = isElement && node->ns != nullptr;
-        m_positions[node] = IsNameless(node) ? place : countAs(StepOf(node), hasSpace, node);
-    }
-    for (const auto& [step, group] : groups)
-    {
-        if (group.count == 1)
-        {
-            m_positions.erase(group.first);
-        }
-    }
+    return MarkOf(node) >> 1;
 }

@@ -4,29 +4,55 @@
 #include <libxml/tree.h>
 
 #include <string>
-#include <unordered_map>
-#include <unordered_set>
+#include <vector>
 
 /**
  * The location paths of many nodes of a document, which must not change meanwhile.
  *
- * They are what xmlGetNodePath() gives, which counts the siblings of a node anew for each path;
- * here the children of a node are counted once.
+ * They are what xmlGetNodePath() gives, which counts the siblings of a node anew for each path.
+ * Here the children of a node are counted once. Their positions are kept in the field that the
+ * engine's records have for applications (_private), until the object is destroyed.
  */
 class Locations
 {
 public:
-    /** @return the location path of @p node, such as /cfg/net[2]/ip. */
+    Locations() = default;
+    ~Locations();
+    Locations(Locations&&) = default;
+    Locations& operator=(Locations&&) = delete;
+
+    /**
+     * @return the location path of @p node, such as /cfg/net[2]/ip; for a node in a DTD, which has
+     * none, words in parentheses.
+     */
     std::string Of(const xmlNode* node);
 
+    /** Appends the same to @p text. */
+    void AppendTo(std::string& text, const xmlNode* node);
+
+    /** @return the last step of the path of @p node, which has one, such as net[2]. */
+    std::string LastStepOf(const xmlNode* node);
+
 private:
-    /** @return "[2]" and the like; empty if @p node needs none. */
-    std::string PositionOf(const xmlNode* node);
+    /** A node on the last path, and where its step ends there. */
+    struct Step
+    {
+        const xmlNode* node;
+        size_t end;
+    };
 
-    void CountChildren(const xmlNode* parent);
+    bool IsOnPath(const xmlNode* node, size_t depth) const;
+    void Follow(const xmlNode* node, size_t depth);
+    void AppendLastStep(std::string& text, const xmlNode* node);
+    size_t PositionOf(const xmlNode* node);
 
-    std::unordered_set<const xmlNode*> m_counted;         ///< parents whose children are counted
-    std::unordered_map<const xmlNode*, long> m_positions; ///< from 1; none if nothing is like it
+    std::string m_path; ///< the last one: most paths begin like the one before
+    std::vector<Step> m_steps;
+    std::vector<const xmlNode*> m_below;   ///< of a path, the nodes that the last one does not have
+    std::vector<const xmlNode*> m_counted; ///< the nodes whose children are counted
 };
+
+/** @return whether a location path selects @p node: none selects what is inside a DTD. */
+bool HasLocation(const xmlNode* node);
 
 #endif

@@ -57,9 +57,7 @@ std::string ContentOf(const xmlNode* node)
 
 std::string NameWithPrefix(const xmlNode* node)
 {
-    // Elements and attributes have their namespace at different places of the record.
-    const xmlNs* const space =
-        node->type == XML_ATTRIBUTE_NODE ? reinterpret_cast<const xmlAttr*>(node)->ns : node->ns;
+    const xmlNs* const space = kx::SpaceOf(node);
     const bool hasPrefix = space != nullptr && space->prefix != nullptr;
     return (hasPrefix ? Text(space->prefix) + ":" : "") + Text(node->name);
 }
