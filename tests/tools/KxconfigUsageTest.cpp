@@ -63,7 +63,7 @@ TEST_F(KxconfigUsage, ExitStatusesAreToldAlikeByHelpManPageAndDocumentation)
         EXPECT_THAT(page, HasSubstr("\\fB" + status + "\\fR\n" + meaning.substr(0, 10)));
         EXPECT_THAT(documentation, HasSubstr("| " + status + "      | " + meaning));
     }
-    EXPECT_EQ(5, count);
+    EXPECT_EQ(6, count);
 }
 
 TEST_F(KxconfigUsage, ColoursAreForTerminals)

@@ -98,7 +98,7 @@ _kxconfig_offer_options()
     local options=(--help --json --log-mask --trace)
     case $1 in
         "") options+=(--version) ;;
-        set) options+=(--dry-run --output) ;;
+        set) options+=(--drop-attributes --dry-run --output --wait) ;;
         explain) options+=(--set) ;;
     esac
     _kxconfig_offer "${options[@]}"
@@ -118,7 +118,7 @@ _kxconfig_offer_arguments()
     local verb= file= position=0 i
     for ((i = 1; i < ${#words[@]}; ++i)); do
         case ${words[i]} in
-            --log-mask | --output) ((++i)) ;;
+            --log-mask | --output | --wait) ((++i)) ;;
             -*) ;;
             *)
                 ((++position))

@@ -9,6 +9,8 @@
 namespace
 {
 
+const int g_longestWait = 1000000; // seconds
+
 /** To the engine "-" is standard input or output; a user who writes it here means something else.
  */
 std::string StandardStreamError(const std::string& file)
@@ -19,7 +21,7 @@ std::string StandardStreamError(const std::string& file)
 /** An empty name would stand for the file that was loaded, and overwrite it. */
 std::string NewFileError(const std::string& file)
 {
-    return file.empty() ? "\"\" is not a file name" : StandardStreamError(file);
+    return file.empty() ? "\"\" is not a file name" : "";
 }
 
 /** A command with the argument FILE, which @p run carries out. */
@@ -62,9 +64,17 @@ void AddSet(CLI::App& app, Request& request)
     AddKey(*set, arguments.key);
     set->add_option("VALUE", arguments.value, "the new text, as XML: write & as &amp;")->required();
     set->add_flag("--dry-run", arguments.dryRun, "show what would change and save nothing");
-    set->add_option("--output", arguments.output, "save to this file instead")
+    set->add_option(
+           "--output", arguments.output,
+           "save to this file instead; -: to standard output, and report to standard error")
         ->type_name("FILE")
         ->check(CLI::Validator(NewFileError, ""));
+    set->add_option("--wait", arguments.waitSeconds,
+                    "wait this long while another process has the file locked; default: 10")
+        ->type_name("SECONDS")
+        ->check(CLI::Validator(CLI::Range(0, g_longestWait)).description(""));
+    set->add_flag("--drop-attributes", arguments.dropAttributes,
+                  "save even if the owner, the ACL or the like would be lost");
 }
 
 void AddExplain(CLI::App& app, Request& request)

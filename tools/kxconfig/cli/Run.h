@@ -6,8 +6,8 @@
 #include <vector>
 
 /**
- * Runs kxconfig. The engine's settings, the log mask and the current folder are afterwards what
- * they were before; it is for one thread at a time.
+ * Runs kxconfig. The engine's settings, the log mask and the handlers of signals are afterwards
+ * what they were before; it is for one thread at a time.
  *
  * @param arguments  those after the program's name.
  * @param input      standard input, which no command reads.

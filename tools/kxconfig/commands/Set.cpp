@@ -2,10 +2,10 @@
 
 #include "commands/KeyArgument.h"
 #include "commands/ValueArgument.h"
+#include "file/Destination.h"
 #include "file/Engine.h"
 #include "file/Load.h"
 #include "file/RoundTrip.h"
-#include "file/Save.h"
 #include "file/Texts.h"
 #include "output/Failure.h"
 #include "output/Quoting.h"
@@ -14,6 +14,8 @@
 #include "diag/Status.h"
 
 #include <nlohmann/json.hpp>
+
+#include <chrono>
 
 namespace
 {
@@ -67,33 +69,60 @@ void AddChanges(const std::vector<ChangedText>& changes, Report& report)
     }
 }
 
-void SaveChanges(CXMLReader& reader, CXMLWriter& writer, const SetArguments& arguments,
-                 const FileState& loaded)
+bool SavesElsewhere(const SetArguments& arguments)
 {
-    const bool elsewhere = !arguments.output.empty();
-    const std::string& target = elsewhere ? arguments.output : arguments.file;
-    RequireLoadsAgain(reader, target);
+    return !arguments.output.empty();
+}
+
+Destination DestinationOf(const SetArguments& arguments)
+{
+    const bool elsewhere = SavesElsewhere(arguments);
+    return Destination(elsewhere ? arguments.output : arguments.file,
+                       elsewhere ? Destination::Role::OtherFile : Destination::Role::LoadedFile,
+                       std::chrono::seconds(arguments.waitSeconds));
+}
+
+void Warn(const std::string& warning, Report& report)
+{
+    if (!warning.empty())
+    {
+        report.Complain(warning);
+    }
+}
+
+ExitStatus Save(CXMLReader& reader, Destination& destination, const SetArguments& arguments,
+                Report& report)
+{
+    const std::string bytes = SavedBytes(reader);
+    RequireLoadsAgain(bytes, destination.Path());
+    destination.Save(bytes, {arguments.dropAttributes, arguments.dryRun});
     if (!arguments.dryRun)
     {
-        Save(writer, target, elsewhere ? nullptr : &loaded);
+        report.NoteSaved();
     }
+    Warn(destination.SyncWarning(), report);
+    return destination.SyncWarning().empty() ? ExitStatus::Done : ExitStatus::NotReported;
 }
 
 } // namespace
 
 ExitStatus Set(const SetArguments& arguments, Report& report)
 {
-    const FileState loaded(arguments.file);
+    Destination destination = DestinationOf(arguments);
+    if (destination.IsStandardOutput())
+    {
+        destination.SetStream(report.GiveOutput());
+    }
+    Warn(destination.LockWarning(), report);
     const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file);
     RequireKey(arguments.key, arguments.file, *reader);
     const Texts texts(reader->GetDataPtr());
     GuestWriter writer(*reader);
     Update(writer.Get(), arguments);
     const std::vector<ChangedText> changes = texts.Changes();
-    if (!changes.empty() || !arguments.output.empty())
-    {
-        SaveChanges(*reader, writer.Get(), arguments, loaded);
-    }
+    const bool isSaved = !changes.empty() || SavesElsewhere(arguments);
+    const ExitStatus status =
+        isSaved ? Save(*reader, destination, arguments, report) : ExitStatus::Done;
     AddChanges(changes, report);
-    return ExitStatus::Done;
+    return status;
 }

@@ -1,25 +1,19 @@
 #include "file/Load.h"
 
 #include "file/Engine.h"
+#include "file/Input.h"
 #include "output/Failure.h"
 #include "output/Quoting.h"
 
 #include <libxml/tree.h>
 
-#include <cerrno>
-#include <cstring>
-
-#include <fcntl.h>
-#include <sys/stat.h>
-#include <unistd.h>
-
 namespace
 {
 
-Failure NotRead(const std::string& path, int error)
+Failure NotRead(const std::string& path, const std::error_code& error)
 {
     return {ExitStatus::BadFile,
-            "cannot read " + (path.empty() ? Quoted(path) : path) + ": " + std::strerror(error)};
+            "cannot read " + (path.empty() ? Quoted(path) : path) + ": " + error.message()};
 }
 
 Failure NotParsed(const std::string& path, const FirstEngineError& error)
@@ -27,20 +21,15 @@ Failure NotParsed(const std::string& path, const FirstEngineError& error)
     return {ExitStatus::BadFile, path + ":" + (error.IsNone() ? " not parsed" : error.Text())};
 }
 
-/** Throws unless @p path is a file that can be read. */
-void RequireReadable(const std::string& path)
+Input Open(const std::string& path)
 {
-    struct stat status = {};
-    const int file = open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK);
-    if (file < 0)
+    try
     {
-        throw NotRead(path, errno);
+        return Input(path);
     }
-    fstat(file, &status);
-    close(file);
-    if (S_ISDIR(status.st_mode))
+    catch (const std::system_error& error)
     {
-        throw NotRead(path, EISDIR);
+        throw NotRead(path, error.code());
     }
 }
 
@@ -48,9 +37,9 @@ void RequireReadable(const std::string& path)
 
 std::unique_ptr<CXMLReader> LoadFile(const std::string& path)
 {
-    RequireReadable(path);
+    const Input input = Open(path);
     const FirstEngineError error;
-    std::unique_ptr<CXMLReader> reader(GetCXMLReaderObject(path.c_str()));
+    std::unique_ptr<CXMLReader> reader(GetCXMLReaderObject(input.Path().c_str()));
     if (reader == nullptr || reader->GetDataPtr() == nullptr)
     {
         throw NotParsed(path, error);
@@ -60,9 +49,9 @@ std::unique_ptr<CXMLReader> LoadFile(const std::string& path)
 
 void LoadDocument(const std::string& path, CXmlParser& document)
 {
-    RequireReadable(path);
+    const Input input = Open(path);
     const FirstEngineError error;
-    if (document.ParseXml(path) != 0)
+    if (document.ParseXml(input.Path()) != 0)
     {
         throw NotParsed(path, error);
     }

@@ -11,7 +11,8 @@
 struct _xmlDoc;
 
 /**
- * Loads a file of this machine; URLs and other names that the engine would fetch are not files.
+ * Loads a file of this machine; URLs and other names that the engine would fetch are not files. A
+ * pipe is read to its end.
  *
  * @return a reader that holds a document.
  * @throws Failure with the line number if the file is not well-formed.

@@ -18,12 +18,15 @@ struct Difference
  * no regular file: its bytes were there to be read once, by the engine. */
 std::vector<Difference> WhatSavingChanges(CXMLReader& reader, const std::string& file);
 
+/** @return the bytes that CXMLWriter::SaveData() writes for @p reader's document. */
+std::string SavedBytes(CXMLReader& reader);
+
 /**
- * Requires that the document of @p reader loads again once it is saved.
+ * Requires that @p bytes, which are about to be saved, load.
  *
  * @param target  the file to save to, for the message.
  * @throws Failure with the line and the engine's reason.
  */
-void RequireLoadsAgain(CXMLReader& reader, const std::string& target);
+void RequireLoadsAgain(const std::string& bytes, const std::string& target);
 
 #endif

@@ -8,7 +8,8 @@ enum class ExitStatus
     NothingFound = 1,
     BadUsage = 2,
     BadFile = 3,
-    NotSaved = 4
+    NotSaved = 4,
+    NotReported = 5
 };
 
 struct ExitStatusMeaning
@@ -25,6 +26,7 @@ const ExitStatusMeaning kExitStatuses[] = {
     {ExitStatus::BadFile, "the file cannot be read, or is not well-formed XML"},
     {ExitStatus::NotSaved,
      "saving or printing failed, or memory ran out; a file that could not be saved is unchanged"},
+    {ExitStatus::NotReported, "saved, but not reported, or not certain to survive a loss of power"},
 };
 
 #endif

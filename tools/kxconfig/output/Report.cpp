@@ -60,7 +60,7 @@ Json OrNull(const std::optional<std::string>& text)
 
 } // namespace
 
-Report::Report(std::ostream& output, std::ostream& errors) : m_output(output), m_errors(errors)
+Report::Report(std::ostream& output, std::ostream& errors) : m_output(&output), m_errors(errors)
 {
 }
 
@@ -76,7 +76,7 @@ void Report::AddLine(const std::string& line)
 {
     if (!m_isJson)
     {
-        m_output << line << '\n';
+        *m_output << line << '\n';
     }
 }
 
@@ -102,7 +102,14 @@ void Report::Complain(const std::string& message)
 
 std::string Report::Paint(Color color, const std::string& text) const
 {
-    return !m_isJson && ShowsColors(m_output) ? Colored(color, text) : text;
+    return !m_isJson && ShowsColors(*m_output) ? Colored(color, text) : text;
+}
+
+std::ostream& Report::GiveOutput()
+{
+    std::ostream& output = *m_output;
+    m_output = &m_errors;
+    return output;
 }
 
 ExitStatus Report::Finish(ExitStatus status)
@@ -111,20 +118,20 @@ ExitStatus Report::Finish(ExitStatus status)
     {
         WriteAnswer(status);
     }
-    if (m_output.flush())
+    if (m_output->flush())
     {
         return status;
     }
     m_isJson = false; // no one could read it
     Complain("cannot write to standard output");
-    return ExitStatus::NotSaved;
+    return m_failure;
 }
 
 ExitStatus Report::FinishOutOfMemory()
 {
     std::vector<Json>().swap(m_results); // there may be no memory to write them
     Complain("out of memory");
-    return Finish(ExitStatus::NotSaved);
+    return Finish(m_failure);
 }
 
 void Report::WriteAnswer(ExitStatus status)
@@ -136,5 +143,5 @@ void Report::WriteAnswer(ExitStatus status)
                    {"messages", m_messages}};
     answer["results"].get_ref<Json::array_t&>().swap(m_results);
     // Bytes that are not UTF-8 become U+FFFD, so that any parser accepts the object.
-    m_output << answer.dump(2, ' ', false, Json::error_handler_t::replace) << '\n';
+    *m_output << answer.dump(2, ' ', false, Json::error_handler_t::replace) << '\n';
 }

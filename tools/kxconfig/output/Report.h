@@ -64,7 +64,18 @@ public:
     /** @return @p text in color if the output is a terminal that shows colors. */
     std::string Paint(Color color, const std::string& text) const;
 
-    /** Ends the output. @return @p status, or NotSaved if the output could not be written. */
+    /**
+     * Leaves the output to a document: from now on results and the JSON object go to the errors.
+     *
+     * @return the output.
+     */
+    std::ostream& GiveOutput();
+
+    /** Notes that a file is saved: what fails from now on fails after that. */
+    void NoteSaved() { m_failure = ExitStatus::NotReported; }
+
+    /** Ends the output. @return @p status; NotSaved, or NotReported after NoteSaved(), if the
+     * output could not be written. */
     ExitStatus Finish(ExitStatus status);
 
     /** The same after memory ran out: without the results that JSON would show. */
@@ -73,8 +84,9 @@ public:
 private:
     void WriteAnswer(ExitStatus status);
 
-    std::ostream& m_output;
+    std::ostream* m_output;
     std::ostream& m_errors;
+    ExitStatus m_failure = ExitStatus::NotSaved; ///< of a run whose output cannot be written
     bool m_isJson = false;
     std::optional<std::string> m_verb;
     std::optional<std::string> m_file;

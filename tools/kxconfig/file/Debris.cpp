@@ -1,0 +1,74 @@
+#include "file/Debris.h"
+
+#include "file/Place.h"
+
+#include <memory>
+#include <random>
+
+#include <dirent.h>
+#include <fcntl.h>
+#include <sys/file.h>
+
+namespace
+{
+
+const std::string g_start = ".kxconfig-";
+const std::string g_end = ".tmp";
+const char* const g_digits = "0123456789abcdef";
+const size_t g_digitCount = 16;
+
+bool IsNameOfReplacement(const std::string& name)
+{
+    const size_t size = g_start.size() + g_digitCount + g_end.size();
+    return name.size() == size && name.compare(0, g_start.size(), g_start) == 0 &&
+           name.find_first_not_of(g_digits, g_start.size()) == size - g_end.size() &&
+           name.compare(size - g_end.size(), g_end.size(), g_end) == 0;
+}
+
+bool IsRegular(int folder, const char* name)
+{
+    struct stat status = {};
+    return fstatat(folder, name, &status, AT_SYMLINK_NOFOLLOW) == 0 && S_ISREG(status.st_mode);
+}
+
+/** A save holds the lock on its file until the file has its place or is removed. */
+void RemoveUnlessLocked(int folder, const char* name)
+{
+    if (!IsRegular(folder, name))
+    {
+        return;
+    }
+    const Descriptor file(openat(folder, name, O_RDWR | O_CLOEXEC | O_NOFOLLOW | O_NONBLOCK));
+    if (file && flock(file.Get(), LOCK_EX | LOCK_NB) == 0)
+    {
+        unlinkat(folder, name, 0);
+    }
+}
+
+} // namespace
+
+std::string NameOfReplacement()
+{
+    std::random_device random;
+    std::uniform_int_distribution<size_t> digit(0, 15);
+    std::string name = g_start;
+    for (size_t i = 0; i != g_digitCount; ++i)
+    {
+        name += g_digits[digit(random)];
+    }
+    return name + g_end;
+}
+
+void RemoveDebris(int folder)
+{
+    const int list = openat(folder, ".", O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+    const std::unique_ptr<DIR, int (*)(DIR*)> entries(list < 0 ? nullptr : fdopendir(list),
+                                                      closedir);
+    while (const dirent* const entry = entries ? readdir(entries.get()) : nullptr)
+    {
+        if (IsNameOfReplacement(entry->d_name))
+        {
+            RemoveUnlessLocked(folder, entry->d_name);
+        }
+    }
+}
