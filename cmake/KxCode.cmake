@@ -58,15 +58,3 @@ function(kx_binds_own_calls target)
     endif()
     target_link_options(${target} PRIVATE LINKER:-Bsymbolic-functions)
 endfunction()
-
-# Compiles the target's sources that match as one, where it is built to be fast or small. Otherwise each is for
-# itself, and compile_commands.json names it.
-function(kx_compiles_together target group regex)
-    if(NOT CMAKE_BUILD_TYPE MATCHES "Rel")
-        return()
-    endif()
-    get_target_property(sources ${target} SOURCES)
-    list(FILTER sources INCLUDE REGEX "${regex}")
-    set_source_files_properties(${sources} PROPERTIES UNITY_GROUP ${group})
-    set_target_properties(${target} PROPERTIES UNITY_BUILD ON UNITY_BUILD_MODE GROUP)
-endfunction()

@@ -1,11 +1,11 @@
-// The handle itself, its kind and name, navigation, emptying.
-
 #include "CXmlNode.h"
 
 #include "EngineNode.h"
 #include "Handle.h"
 #include "diag/Log.h"
 #include "diag/Status.h"
+
+// CXmlNodeAttributes.cpp has the operations on attributes.
 
 using namespace kx;
 
@@ -17,6 +17,87 @@ int TypeOf(const xmlNode* node)
 {
     const int number = node != 0 ? static_cast<int>(node->type) : 0;
     return number >= NODE_ELEMENT && number <= NODE_XINCLUDE_END ? number : NODE_NONE;
+}
+
+/** Whether exactly one child lies under @p node, and it is text. */
+bool HasOnlyText(const xmlNode* node)
+{
+    const xmlNode* const child = LinkOf(node, &xmlNode::children);
+    return child != 0 && child->type == XML_TEXT_NODE && child->next == 0;
+}
+
+/**
+ * @return the first of @p child and the children after it under @p node that bears @p name.
+ *
+ * It is the node that must be an element, not the child: clients find text and comments under the
+ * engine's names for them, and nothing under a document.
+ */
+xmlNode* NamedFrom(const xmlNode* node, xmlNode* child, const std::string& name)
+{
+    if (!IsElement(node))
+    {
+        return 0;
+    }
+    while (child != 0 && !SameText(NameOf(child), name))
+    {
+        child = child->next;
+    }
+    return child;
+}
+
+xmlNode* NewChild(xmlNode* parent, const std::string& name, const std::string& content)
+{
+    return WholeElement(xmlNewDocNode(parent->doc, NamespaceOf(parent), ToEngine(name),
+                                      content.empty() ? 0 : ToEngine(content)));
+}
+
+/** Links @p child by hand: the engine's own call would merge and reject by kind. */
+void LinkLast(xmlNode* parent, xmlNode* child)
+{
+    child->type = XML_ELEMENT_NODE;
+    child->parent = parent;
+    child->doc = parent->doc;
+    child->prev = parent->last;
+    if (parent->children == 0)
+    {
+        parent->children = child;
+    }
+    else
+    {
+        parent->last->next = child;
+    }
+    parent->last = child;
+}
+
+/** @return the new element, linked as the last child of @p parent, or null. */
+xmlNode* AppendChild(xmlNode* parent, const std::string& name, const std::string& content)
+{
+    xmlNode* const child = NewChild(parent, name, content);
+    if (child != 0)
+    {
+        LinkLast(parent, child);
+    }
+    return child;
+}
+
+/** @return the new element, linked by the engine after the last sibling of @p node, or null. */
+xmlNode* AppendSibling(xmlNode* node, const std::string& name, const std::string& content)
+{
+    xmlNode* const sibling = WholeElement(xmlNewNode(0, ToEngine(name)));
+    if (sibling == 0)
+    {
+        return 0;
+    }
+    if (!content.empty())
+    {
+        xmlNodeSetContent(sibling, ToEngine(content));
+    }
+    xmlNode* const linked = xmlAddSibling(node, sibling);
+    if (linked == 0)
+    {
+        xmlFreeNode(sibling);
+    }
+    return linked;
 }
 
 } // namespace
@@ -116,6 +197,138 @@ int CXmlNode::ClearNode()
     {
         RemoveChildren(m_pXmlNode);
         RemoveAttributes(m_pXmlNode);
+        status = StatusOk;
+    }
+    KX_TRACE("-");
+    return status;
+}
+
+// --- Content
+
+std::string CXmlNode::GetContent()
+{
+    KX_TRACE("+");
+    std::string content;
+    if (HasOnlyText(m_pXmlNode))
+    {
+        // The engine's buffer stays allocated: clients are built around what this call leaves
+        // behind.
+        content = FromEngine(xmlNodeGetContent(m_pXmlNode));
+    }
+    KX_TRACE("-");
+    return content;
+}
+
+int CXmlNode::SetContent(std::string text)
+{
+    KX_TRACE("+");
+    int status = StatusMissing;
+    if (CanTakeContent(m_pXmlNode))
+    {
+        ReplaceContent(m_pXmlNode, text);
+        status = StatusOk;
+    }
+    KX_TRACE("-");
+    return status;
+}
+
+int CXmlNode::GetContentOfChildNode(std::string name, std::string& value)
+{
+    KX_TRACE("+");
+    int status = StatusNotFound;
+    CXmlNode child = FindChildNode(name);
+    if (child.m_pXmlNode != 0)
+    {
+        value = child.GetContent();
+        status = StatusOk;
+    }
+    KX_TRACE("-");
+    return status;
+}
+
+// --- Finding children
+
+std::list<CXmlNode> CXmlNode::Children()
+{
+    KX_TRACE("+");
+    std::list<CXmlNode> children;
+    xmlNode* child = ElementFrom(LinkOf(m_pXmlNode, &xmlNode::children), &xmlNode::next);
+    while (child != 0)
+    {
+        children.push_back(CXmlNode(child));
+        child = ElementFrom(child->next, &xmlNode::next);
+    }
+    KX_TRACE("-");
+    return children;
+}
+
+CXmlNode CXmlNode::FindChildNode(std::string name)
+{
+    KX_TRACE("+");
+    return HandleOn(__FUNCTION__,
+                    NamedFrom(m_pXmlNode, LinkOf(m_pXmlNode, &xmlNode::children), name));
+}
+
+std::list<CXmlNode> CXmlNode::FindAllChildNodes(std::string name)
+{
+    KX_TRACE("+");
+    std::list<CXmlNode> children;
+    xmlNode* child = NamedFrom(m_pXmlNode, LinkOf(m_pXmlNode, &xmlNode::children), name);
+    while (child != 0)
+    {
+        children.push_back(CXmlNode(child));
+        child = NamedFrom(m_pXmlNode, child->next, name);
+    }
+    KX_TRACE("-");
+    return children;
+}
+
+// --- Adding and removing
+
+CXmlNode CXmlNode::AddChildNode(std::string name, std::string content)
+{
+    KX_TRACE("+");
+    CXmlNode child;
+    if (CanHoldChildren(m_pXmlNode) && !name.empty())
+    {
+        xmlNode* const made = AppendChild(m_pXmlNode, name, content);
+        if (made == 0)
+        {
+            KX_ERROR("Error creating child node");
+        }
+        Designate(child, made);
+    }
+    KX_TRACE("-");
+    return child;
+}
+
+CXmlNode CXmlNode::AddSiblingNode(std::string name, std::string content)
+{
+    KX_TRACE("+");
+    CXmlNode sibling;
+    if (!CanHaveSiblings(m_pXmlNode))
+    {
+        KX_TRACE("-");
+        return sibling;
+    }
+    CXmlNode parent = Parent();
+    if (parent.m_pXmlNode != 0)
+    {
+        // Last in the row, without a namespace, under an empty name too: clients count on each.
+        Designate(sibling, AppendSibling(m_pXmlNode, name, content));
+    }
+    KX_TRACE("-");
+    return sibling;
+}
+
+int CXmlNode::RemoveChildNode(std::string name)
+{
+    KX_TRACE("+");
+    int status = StatusMissing;
+    CXmlNode child = FindChildNode(name);
+    if (CanBeRemoved(child.m_pXmlNode))
+    {
+        FreeFromTree(child.m_pXmlNode);
         status = StatusOk;
     }
     KX_TRACE("-");

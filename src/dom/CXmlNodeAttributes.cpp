@@ -1,5 +1,3 @@
-// Attributes.
-
 #include "CXmlNode.h"
 
 #include "EngineNode.h"
