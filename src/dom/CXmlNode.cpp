@@ -1,9 +1,10 @@
 #include "CXmlNode.h"
 
-#include "EngineNode.h"
 #include "Handle.h"
 #include "diag/Log.h"
 #include "diag/Status.h"
+#include "engine/Edit.h"
+#include "engine/Node.h"
 
 // CXmlNodeAttributes.cpp has the operations on attributes.
 
@@ -17,13 +18,6 @@ int TypeOf(const xmlNode* node)
 {
     const int number = node != 0 ? static_cast<int>(node->type) : 0;
     return number >= NODE_ELEMENT && number <= NODE_XINCLUDE_END ? number : NODE_NONE;
-}
-
-/** Whether exactly one child lies under @p node, and it is text. */
-bool HasOnlyText(const xmlNode* node)
-{
-    const xmlNode* const child = LinkOf(node, &xmlNode::children);
-    return child != 0 && child->type == XML_TEXT_NODE && child->next == 0;
 }
 
 /**
@@ -102,10 +96,10 @@ xmlNode* AppendSibling(xmlNode* node, const std::string& name, const std::string
 
 } // namespace
 
-CXmlNode kx::HandleOn(const char* tag, xmlNode* node)
+CXmlNode kx::LeaveWithHandle(const char* tag, xmlNode* node)
 {
     CXmlNode handle;
-    Designate(handle, node);
+    SetIfFound(handle, node);
     KX_TRACE_AS(tag, "-");
     return handle;
 }
@@ -159,32 +153,33 @@ CXmlNode CXmlNode::Parent()
 {
     KX_TRACE("+");
     xmlNode* const parent = LinkOf(m_pXmlNode, &xmlNode::parent);
-    return HandleOn(__FUNCTION__, IsElement(parent) ? parent : 0);
+    return LeaveWithHandle(__FUNCTION__, IsElement(parent) ? parent : 0);
 }
 
 CXmlNode CXmlNode::FirstChild()
 {
     KX_TRACE("+");
-    return HandleOn(__FUNCTION__,
-                    ElementFrom(LinkOf(m_pXmlNode, &xmlNode::children), &xmlNode::next));
+    return LeaveWithHandle(__FUNCTION__, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::children)));
 }
 
 CXmlNode CXmlNode::LastChild()
 {
     KX_TRACE("+");
-    return HandleOn(__FUNCTION__, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::last), &xmlNode::prev));
+    return LeaveWithHandle(__FUNCTION__,
+                           ElementFrom(LinkOf(m_pXmlNode, &xmlNode::last), &xmlNode::prev));
 }
 
 CXmlNode CXmlNode::NextSibling()
 {
     KX_TRACE("+");
-    return HandleOn(__FUNCTION__, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::next), &xmlNode::next));
+    return LeaveWithHandle(__FUNCTION__, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::next)));
 }
 
 CXmlNode CXmlNode::PrevSibling()
 {
     KX_TRACE("+");
-    return HandleOn(__FUNCTION__, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::prev), &xmlNode::prev));
+    return LeaveWithHandle(__FUNCTION__,
+                           ElementFrom(LinkOf(m_pXmlNode, &xmlNode::prev), &xmlNode::prev));
 }
 
 // --- Emptying
@@ -209,7 +204,7 @@ std::string CXmlNode::GetContent()
 {
     KX_TRACE("+");
     std::string content;
-    if (HasOnlyText(m_pXmlNode))
+    if (OnlyTextChild(m_pXmlNode) != 0)
     {
         // The engine's buffer stays allocated: clients are built around what this call leaves
         // behind.
@@ -252,11 +247,11 @@ std::list<CXmlNode> CXmlNode::Children()
 {
     KX_TRACE("+");
     std::list<CXmlNode> children;
-    xmlNode* child = ElementFrom(LinkOf(m_pXmlNode, &xmlNode::children), &xmlNode::next);
+    xmlNode* child = ElementFrom(LinkOf(m_pXmlNode, &xmlNode::children));
     while (child != 0)
     {
         children.push_back(CXmlNode(child));
-        child = ElementFrom(child->next, &xmlNode::next);
+        child = ElementFrom(child->next);
     }
     KX_TRACE("-");
     return children;
@@ -265,8 +260,8 @@ std::list<CXmlNode> CXmlNode::Children()
 CXmlNode CXmlNode::FindChildNode(std::string name)
 {
     KX_TRACE("+");
-    return HandleOn(__FUNCTION__,
-                    NamedFrom(m_pXmlNode, LinkOf(m_pXmlNode, &xmlNode::children), name));
+    return LeaveWithHandle(__FUNCTION__,
+                           NamedFrom(m_pXmlNode, LinkOf(m_pXmlNode, &xmlNode::children), name));
 }
 
 std::list<CXmlNode> CXmlNode::FindAllChildNodes(std::string name)
@@ -296,7 +291,7 @@ CXmlNode CXmlNode::AddChildNode(std::string name, std::string content)
         {
             KX_ERROR("Error creating child node");
         }
-        Designate(child, made);
+        SetIfFound(child, made);
     }
     KX_TRACE("-");
     return child;
@@ -315,7 +310,7 @@ CXmlNode CXmlNode::AddSiblingNode(std::string name, std::string content)
     if (parent.m_pXmlNode != 0)
     {
         // Last in the row, without a namespace, under an empty name too: clients count on each.
-        Designate(sibling, AppendSibling(m_pXmlNode, name, content));
+        SetIfFound(sibling, AppendSibling(m_pXmlNode, name, content));
     }
     KX_TRACE("-");
     return sibling;

@@ -1,8 +1,10 @@
 #include "CXmlNode.h"
 
-#include "EngineNode.h"
 #include "diag/Log.h"
 #include "diag/Status.h"
+#include "engine/Edit.h"
+#include "engine/Kind.h"
+#include "engine/Text.h"
 
 using namespace kx;
 

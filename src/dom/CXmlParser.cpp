@@ -1,9 +1,11 @@
 #include "CXmlParser.h"
 
-#include "EngineNode.h"
 #include "Handle.h"
 #include "diag/Log.h"
 #include "diag/Status.h"
+#include "engine/Edit.h"
+#include "engine/Kind.h"
+#include "engine/Text.h"
 
 #include <libxml/parser.h>
 #include <libxml/xpath.h>

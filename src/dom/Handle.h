@@ -7,7 +7,7 @@ namespace kx
 {
 
 /** Sets @p handle, which is null, to @p node; a null @p node leaves it null. */
-inline void Designate(CXmlNode& handle, _xmlNode* node)
+inline void SetIfFound(CXmlNode& handle, _xmlNode* node)
 {
     if (node != 0)
     {
@@ -20,7 +20,7 @@ inline void Designate(CXmlNode& handle, _xmlNode* node)
  *
  * @return a handle on @p node, which may be null.
  */
-CXmlNode HandleOn(const char* tag, _xmlNode* node);
+CXmlNode LeaveWithHandle(const char* tag, _xmlNode* node);
 
 } // namespace kx
 

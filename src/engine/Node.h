@@ -6,6 +6,7 @@
  * Reading the engine's node records by kind.
  */
 
+#include "Kind.h"
 #include "Text.h"
 
 #include <libxml/tree.h>
@@ -13,35 +14,21 @@
 namespace kx
 {
 
-/** @return the first element among @p node, which may be null, and its next siblings; or null. */
-inline xmlNode* ElementFrom(xmlNode* node)
+/** @return the first element among @p node, which may be null, and those @p link leads to; or null.
+ */
+inline xmlNode* ElementFrom(xmlNode* node, NodeLink link = &xmlNode::next)
 {
     while (node != 0 && node->type != XML_ELEMENT_NODE)
     {
-        node = node->next;
+        node = node->*link;
     }
     return node;
 }
 
-/** @return the namespace of @p node, or null; only elements and attributes have one. */
-inline const xmlNs* SpaceOf(const xmlNode* node)
+/** @return the text node that is the only child of @p node, which may be null; or null. */
+inline xmlNode* OnlyTextChild(const xmlNode* node)
 {
-    // They have it at different places of the record.
-    switch (node->type)
-    {
-    case XML_ELEMENT_NODE:
-        return node->ns;
-    case XML_ATTRIBUTE_NODE:
-        return reinterpret_cast<const xmlAttr*>(node)->ns;
-    default:
-        return 0;
-    }
-}
-
-/** @return the text node that is the only child of @p element, or null. */
-inline xmlNode* OnlyTextChild(const xmlNode* element)
-{
-    xmlNode* const child = element->children;
+    xmlNode* const child = LinkOf(node, &xmlNode::children);
     const bool isOnlyText = child != 0 && child->type == XML_TEXT_NODE && child->next == 0;
     return isOnlyText ? child : 0;
 }

@@ -49,7 +49,7 @@ std::optional<size_t> DepthOf(const xmlNode* node)
 /** @return whether XPath has no name for the element: it is in a namespace without a prefix. */
 bool IsNameless(const xmlNode* node)
 {
-    const xmlNs* const space = kx::SpaceOf(node);
+    const xmlNs* const space = kx::NamespaceOf(node);
     return node->type == XML_ELEMENT_NODE && space != nullptr && space->prefix == nullptr;
 }
 
@@ -86,7 +86,7 @@ std::string_view View(const xmlChar* text)
 
 Alike AlikeOf(const xmlNode* node)
 {
-    const xmlNs* const space = kx::SpaceOf(node);
+    const xmlNs* const space = kx::NamespaceOf(node);
     switch (node->type)
     {
     case XML_ELEMENT_NODE:

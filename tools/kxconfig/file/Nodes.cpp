@@ -57,7 +57,7 @@ std::string ContentOf(const xmlNode* node)
 
 std::string NameWithPrefix(const xmlNode* node)
 {
-    const xmlNs* const space = kx::SpaceOf(node);
+    const xmlNs* const space = kx::NamespaceOf(node);
     const bool hasPrefix = space != nullptr && space->prefix != nullptr;
     return (hasPrefix ? Text(space->prefix) + ":" : "") + Text(node->name);
 }
