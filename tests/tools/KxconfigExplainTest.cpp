@@ -52,7 +52,7 @@ protected:
             m_folder.Write("a.xml", "<!DOCTYPE cfg [<!ENTITY e 'x'>]><cfg>" + content + "</cfg>");
         std::istringstream lines(Tool({"explain", file, "cfg.a"}).out);
         std::string line;
-        while (std::getline(lines, line) && line.find("/cfg/a: ") == std::string::npos)
+        while (std::getline(lines, line) && line.find(": a: ") == std::string::npos)
         {
         }
         return line;
@@ -66,39 +66,37 @@ const std::string kRoot = "line 1: /cfg: the key starts with the root's name\n";
 TEST_F(KxconfigExplain, TellsLevelByLevelWhatWasComparedWithWhat)
 {
     ExpectExplained("cfg.net@id=1|id=2.ip", 0,
-                    kRoot +
-                        "below /cfg: looking for \"net@id=1|id=2\"\n"
-                        "  line 2: /cfg/net[1]: accepted: id is \"1\"; or id is \"1\", not \"2\"\n"
-                        "    below /cfg/net[1]: looking for \"ip\"\n"
-                        "      line 2: /cfg/net[1]/ip: accepted; value \"10.0.0.1\"\n"
-                        "  line 3: /cfg/net[2]: accepted: id is \"2\", not \"1\"; or id is \"2\"\n"
-                        "    below /cfg/net[2]: looking for \"ip\"\n"
-                        "      line 3: /cfg/net[2]/ip: accepted; value \"10.0.0.2\"\n"
-                        "  line 4: /cfg/name: not named \"net\"; suspends the condition for the "
-                        "next element of that name\n"
-                        "  line 5: /cfg/net[3]: accepted by name alone: /cfg/name (line 4) "
-                        "suspended the condition \"id=1|id=2\", which it does not fulfill\n"
-                        "    below /cfg/net[3]: looking for \"ip\"\n"
-                        "      line 5: /cfg/net[3]/ip: accepted; value \"10.0.0.3\"\n"
-                        "GetValue(key): \"10.0.0.1\\n10.0.0.2\\n10.0.0.3\"\n"
-                        "GetValue(key, value): status 0 (success), value "
-                        "\"10.0.0.1\\n10.0.0.2\\n10.0.0.3\"\n");
+                    kRoot + "below /cfg: looking for \"net@id=1|id=2\"\n"
+                            "  line 2: net[1]: accepted: id is \"1\"; or id is \"1\", not \"2\"\n"
+                            "    below net[1]: looking for \"ip\"\n"
+                            "      line 2: ip: accepted; value \"10.0.0.1\"\n"
+                            "  line 3: net[2]: accepted: id is \"2\", not \"1\"; or id is \"2\"\n"
+                            "    below net[2]: looking for \"ip\"\n"
+                            "      line 3: ip: accepted; value \"10.0.0.2\"\n"
+                            "  line 4: name: not named \"net\"; suspends the condition for the "
+                            "next element of that name\n"
+                            "  line 5: net[3]: accepted by name alone: name (line 4) "
+                            "suspended the condition \"id=1|id=2\", which it does not fulfill\n"
+                            "    below net[3]: looking for \"ip\"\n"
+                            "      line 5: ip: accepted; value \"10.0.0.3\"\n"
+                            "GetValue(key): \"10.0.0.1\\n10.0.0.2\\n10.0.0.3\"\n"
+                            "GetValue(key, value): status 0 (success), value "
+                            "\"10.0.0.1\\n10.0.0.2\\n10.0.0.3\"\n");
 }
 
 TEST_F(KxconfigExplain, TellsEachTermUntilOneRejects)
 {
     const Outcome outcome = Tool({"explain", m_file, "cfg.net@on=y&id=9&x=1.ip"});
     EXPECT_EQ(0, outcome.status); // the third net is taken by its name alone
-    EXPECT_THAT(outcome.out, HasSubstr("  line 2: /cfg/net[1]: rejected: on is \"y\"; and id is "
+    EXPECT_THAT(outcome.out, HasSubstr("  line 2: net[1]: rejected: on is \"y\"; and id is "
                                        "\"1\", not \"9\"\n"));
-    EXPECT_THAT(outcome.out,
-                HasSubstr("  line 3: /cfg/net[2]: rejected: on is absent, not \"y\"\n"));
+    EXPECT_THAT(outcome.out, HasSubstr("  line 3: net[2]: rejected: on is absent, not \"y\"\n"));
 }
 
 TEST_F(KxconfigExplain, TellsThatAnAmpersandAheadOfABarIsPartOfTheValue)
 {
     EXPECT_THAT(Tool({"explain", m_file, "cfg.net@id=1&on=y|id=2.ip"}).out,
-                HasSubstr("  line 2: /cfg/net[1]: rejected: id is \"1\", not \"1&on=y\" (\"&\" "
+                HasSubstr("  line 2: net[1]: rejected: id is \"1\", not \"1&on=y\" (\"&\" "
                           "before \"|\" is part of the value); or id is \"1\", not \"2\"\n"));
 }
 
@@ -106,8 +104,7 @@ TEST_F(KxconfigExplain, TellsOfATermThatNamesNoAttribute)
 {
     EXPECT_THAT(
         Tool({"explain", m_file, "cfg.net@id.ip"}).out,
-        HasSubstr(
-            "  line 2: /cfg/net[1]: rejected: a term without an attribute name is never true\n"));
+        HasSubstr("  line 2: net[1]: rejected: a term without an attribute name is never true\n"));
 }
 
 TEST_F(KxconfigExplain, TellsThatASuspendedConditionWouldHaveHeld)
@@ -118,19 +115,19 @@ TEST_F(KxconfigExplain, TellsThatASuspendedConditionWouldHaveHeld)
 
 TEST_F(KxconfigExplain, TellsWhyAnAcceptedElementHasNoValue)
 {
-    EXPECT_EQ("  line 1: /cfg/a: accepted; value \"x\"", LineAboutA("<a>x</a>"));
-    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: it is empty", LineAboutA("<a/>"));
-    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: its only child is not text: CDATA section",
+    EXPECT_EQ("  line 1: a: accepted; value \"x\"", LineAboutA("<a>x</a>"));
+    EXPECT_EQ("  line 1: a: accepted; no value: it is empty", LineAboutA("<a/>"));
+    EXPECT_EQ("  line 1: a: accepted; no value: its only child is not text: CDATA section",
               LineAboutA("<a><![CDATA[x]]></a>"));
-    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: its only child is not text: entity reference "
+    EXPECT_EQ("  line 1: a: accepted; no value: its only child is not text: entity reference "
               "&e;",
               LineAboutA("<a>&e;</a>"));
-    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: it has 3 children: text, comment, text",
+    EXPECT_EQ("  line 1: a: accepted; no value: it has 3 children: text, comment, text",
               LineAboutA("<a>x<!-- c -->y</a>"));
-    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: it has 7 children: blank text, element b, "
+    EXPECT_EQ("  line 1: a: accepted; no value: it has 7 children: blank text, element b, "
               "blank text, element b, blank text, ...",
               LineAboutA("<a> <b/> <b/> <b/> </a>"));
-    EXPECT_EQ("  line 1: /cfg/a: accepted; no value: it has 2 children: processing instruction, "
+    EXPECT_EQ("  line 1: a: accepted; no value: it has 2 children: processing instruction, "
               "text",
               LineAboutA("<a><?p?>x</a>"));
 }
@@ -145,17 +142,17 @@ TEST_F(KxconfigExplain, SummarisesElementsThatAreAlike)
     const std::string file = m_folder.Write("many.xml", xml + "<y/><a>1</a><z/><z/></cfg>");
     ExpectOutput({"explain", file, "cfg.a"}, 0,
                  kRoot + "below /cfg: looking for \"a\"\n"
-                         "  line 1: /cfg/x[1]: not named \"a\"\n"
+                         "  line 1: x[1]: not named \"a\"\n"
                          "  ... 1000 more elements of other names\n"
-                         "  line 1: /cfg/a: accepted; value \"1\"\n"
-                         "  line 1: /cfg/z[1]: not named \"a\"\n"
-                         "  line 1: /cfg/z[2]: not named \"a\"\n"
+                         "  line 1: a: accepted; value \"1\"\n"
+                         "  line 1: z[1]: not named \"a\"\n"
+                         "  line 1: z[2]: not named \"a\"\n"
                          "GetValue(key): \"1\"\n"
                          "GetValue(key, value): status 0 (success), value \"1\"\n");
     EXPECT_THAT(Tool({"explain", file, "cfg.x@i=-"}).out,
-                HasSubstr("  line 1: /cfg/x[1]: rejected: i is \"0\", not \"-\"\n"
+                HasSubstr("  line 1: x[1]: rejected: i is \"0\", not \"-\"\n"
                           "  ... 999 more elements that the condition rejects\n"
-                          "  line 1: /cfg/y: not named \"x\"; suspends"));
+                          "  line 1: y: not named \"x\"; suspends"));
     const std::string same = m_folder.Write("same.xml", xml + "</cfg>");
     EXPECT_THAT(Tool({"explain", same, "cfg.a"}).out,
                 HasSubstr("  ... 999 more elements named x\n"));
@@ -186,11 +183,11 @@ TEST_F(KxconfigExplain, TellsOfKeysThatNameNothing)
                             "GetValue(key, value): status -2 (nothing found), value \"\"\n");
     ExpectExplained("cfg.name.x", 0,
                     kRoot + "below /cfg: looking for \"name\"\n"
-                            "  line 2: /cfg/net[1]: not named \"name\"\n"
-                            "  line 3: /cfg/net[2]: not named \"name\"\n"
-                            "  line 4: /cfg/name: accepted; value \"box\"\n"
-                            "    below /cfg/name: there is no element\n"
-                            "  line 5: /cfg/net[3]: not named \"name\"\n"
+                            "  line 2: net[1]: not named \"name\"\n"
+                            "  line 3: net[2]: not named \"name\"\n"
+                            "  line 4: name: accepted; value \"box\"\n"
+                            "    below name: there is no element\n"
+                            "  line 5: net[3]: not named \"name\"\n"
                             "GetValue(key): \"box\"\n"
                             "GetValue(key, value): status 0 (success), value \"box\"\n");
 }
@@ -246,26 +243,25 @@ TEST_F(KxconfigExplain, TellsWhatAnUpdateReaches)
 {
     ExpectUpdateExplained(
         "cfg.net@id=2.ip", 0,
-        kRoot +
-            "below /cfg: looking first for \"net@id=2\"\n"
-            "  line 2: /cfg/net[1]: rejected: id is \"1\", not \"2\"; skipped with everything "
-            "below it\n"
-            "  line 3: /cfg/net[2]: accepted as \"net@id=2\": id is \"2\"; no text to replace: its "
-            "only child is not text: element ip\n"
-            "    below /cfg/net[2]: looking first for \"ip\"\n"
-            "      line 3: /cfg/net[2]/ip: accepted as \"ip\"; its text \"10.0.0.2\" is replaced\n"
-            "  line 4: /cfg/name: not \"ip\"\n"
-            "  line 5: /cfg/net[3]: not \"ip\"\n"
-            "    below /cfg/net[3]: looking first for \"ip\"\n"
-            "      line 5: /cfg/net[3]/ip: accepted as \"ip\"; its text \"10.0.0.3\" is replaced\n"
-            "SetValue(key, value): status 0 (success)\n");
+        kRoot + "below /cfg: looking first for \"net@id=2\"\n"
+                "  line 2: net[1]: rejected: id is \"1\", not \"2\"; skipped with everything "
+                "below it\n"
+                "  line 3: net[2]: accepted as \"net@id=2\": id is \"2\"; no text to replace: its "
+                "only child is not text: element ip\n"
+                "    below net[2]: looking first for \"ip\"\n"
+                "      line 3: ip: accepted as \"ip\"; its text \"10.0.0.2\" is replaced\n"
+                "  line 4: name: not \"ip\"\n"
+                "  line 5: net[3]: not \"ip\"\n"
+                "    below net[3]: looking first for \"ip\"\n"
+                "      line 5: ip: accepted as \"ip\"; its text \"10.0.0.3\" is replaced\n"
+                "SetValue(key, value): status 0 (success)\n");
 }
 
 TEST_F(KxconfigExplain, TellsThatAnUpdateLosesTheLastSegmentAfterARejection)
 {
     const Outcome outcome = Tool({"explain", "--set", m_file, "cfg.net@id=2"});
     EXPECT_EQ(1, outcome.status);
-    EXPECT_THAT(outcome.out, HasSubstr("  line 3: /cfg/net[2]: not \"\"\n"));
+    EXPECT_THAT(outcome.out, HasSubstr("  line 3: net[2]: not \"\"\n"));
     EXPECT_THAT(outcome.out, HasSubstr("SetValue(key, value): status -2 (nothing found)\n"));
 }
 
@@ -287,7 +283,9 @@ TEST_F(KxconfigExplain, NamesTheElementsThatSetChanges)
         long count = 0;
         for (std::string line; std::getline(changes, line); ++count)
         {
-            EXPECT_THAT(explained, HasSubstr(line.substr(0, line.find(':')) + ": accepted"));
+            const std::string location = line.substr(0, line.find(':'));
+            const std::string step = location.substr(location.rfind('/') + 1);
+            EXPECT_THAT(explained, HasSubstr(": " + step + ": accepted"));
         }
         long told = 0;
         for (auto at = explained.find(" is replaced\n"); at != std::string::npos;
@@ -308,8 +306,8 @@ TEST_F(KxconfigExplain, SaysWhereTheEngineStopsCountingLines)
         std::vector<std::string> arguments = {"explain", file, "cfg.a"};
         arguments.insert(arguments.end(), update.empty() ? 0 : 1, update);
         const std::string told = Tool(arguments).out;
-        EXPECT_THAT(told, HasSubstr("  line 65534: /cfg/a[1]: accepted"));
-        EXPECT_THAT(told, HasSubstr("  line 65535 or later: /cfg/a[2]: accepted"));
+        EXPECT_THAT(told, HasSubstr("  line 65534: a[1]: accepted"));
+        EXPECT_THAT(told, HasSubstr("  line 65535 or later: a[2]: accepted"));
     }
 }
 
@@ -325,4 +323,30 @@ TEST_F(KxconfigExplain, ShowsTheRecordsOfTheLibrarysOwnRunOnly)
     const Outcome outcome = ToolProcess({"explain", "--log-mask", "value", m_file, "cfg.name"});
     EXPECT_EQ(4, std::count(outcome.err.begin(), outcome.err.end(), '\n')) << outcome.err;
     EXPECT_THAT(outcome.out, Not(HasSubstr("Key is")));
+}
+
+TEST_F(KxconfigExplain, PrintsAtMostAHundredTimesTheFile)
+{
+    // Every element is accepted, and so is a line of its own; a path is 250 steps long.
+    std::string key = "a";
+    std::string before;
+    std::string after;
+    for (int i = 0; i != 250; ++i)
+    {
+        key += ".a";
+        before += "<a>";
+        after += "</a>";
+    }
+    std::string xml = before;
+    for (int i = 0; i != 1000; ++i)
+    {
+        xml += "<a/>";
+    }
+    const std::string file = m_folder.Write("deep.xml", xml + after);
+    const Outcome lookup = Tool({"explain", file, key});
+    EXPECT_EQ(1, lookup.status);
+    EXPECT_THAT(lookup.out, HasSubstr("line 1: a[1000]: accepted; no value: it is empty\n"));
+    EXPECT_LT(lookup.out.size(), 100 * xml.size());
+    EXPECT_LT(Tool({"explain", "--set", file, key}).out.size(), 100 * xml.size());
+    EXPECT_LT(Tool({"--json", "explain", file, key}).out.size(), 200 * xml.size());
 }

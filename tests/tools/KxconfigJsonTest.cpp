@@ -97,7 +97,7 @@ TEST_F(KxconfigJson, ExplainGivesEachStep)
         {"event", "element"},
         {"depth", 1},
         {"line", 2},
-        {"location", "/cfg/net[1]"},
+        {"step", "net[1]"},
         {"segment", {{"name", "net"}, {"condition", "id=2"}}},
         {"verdict", "rejected"},
         {"terms", {{{"attribute", "id"}, {"expected", "2"}, {"actual", "1"}, {"holds", false}}}},

@@ -29,7 +29,8 @@ protected:
      * number. */
     static int ExpectValuesOfTheLibrary(const std::string& file)
     {
-        const nlohmann::json answer = nlohmann::json::parse(Tool({"--json", "keys", file}).out);
+        const Outcome outcome = Tool({"--json", "keys", "--all", file});
+        const nlohmann::json answer = nlohmann::json::parse(outcome.out);
         CXMLReader reader(file);
         std::set<std::string> keys;
         for (const nlohmann::json& result : answer.at("results"))
@@ -191,6 +192,50 @@ TEST_F(KxconfigKeys, NeedsNoTimeWorthMentioningForManyElements)
     EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(30));
     EXPECT_EQ(0, outcome.status);
     EXPECT_THAT(outcome.out, testing::EndsWith("\ncfg.net@id=19999.ip\t\"x\\nx\"\n"));
+}
+
+TEST_F(KxconfigKeys, CountsTheValuesAfterTheTenth)
+{
+    std::string ten;
+    std::string xml = "<cfg>";
+    for (int i = 1; i != 11; ++i)
+    {
+        xml += "<a>" + std::to_string(i) + "</a>";
+        ten += (i == 1 ? "" : "\\n") + std::to_string(i);
+    }
+    EXPECT_EQ("cfg.a\t\"" + ten + "\"\n", Keys(xml + "</cfg>"));
+    const std::string file = m_folder.Write("many.xml", xml + "<a>11</a><a>12</a></cfg>");
+    EXPECT_EQ("cfg.a\t\"" + ten + "\" ... 2 more\n", Tool({"keys", file}).out);
+    EXPECT_EQ("cfg.a\t\"" + ten + "\\n11\\n12\"\n", Tool({"keys", "--all", file}).out);
+    const Outcome outcome = Tool({"--json", "keys", file});
+    EXPECT_EQ(2, nlohmann::json::parse(outcome.out).at("results").at(0).at("more"));
+}
+
+TEST_F(KxconfigKeys, CutsSeveralLongValuesButNoSingleOne)
+{
+    const std::string half(500, 'x');
+    EXPECT_EQ("cfg.a\t\"" + half + "\\n" + half + "\" ... 1 more\n",
+              Keys("<cfg><a>" + half + "</a><a>" + half + "</a><a>y</a></cfg>"));
+    EXPECT_EQ("cfg.a\t\"\" ... 2 more\n", Keys("<cfg><a>" + half + half + "x</a><a>y</a></cfg>"));
+    EXPECT_EQ("cfg.a\t\"" + half + half + half + "\"\n",
+              Keys("<cfg><a>" + half + half + half + "</a></cfg>"));
+}
+
+TEST_F(KxconfigKeys, PrintsAtMostAHundredTimesTheFile)
+{
+    // Each title suspends the condition for the next net, so that every key matches every net.
+    const std::string longValue(10000, 'x');
+    for (const std::string& value : {std::string("1"), longValue})
+    {
+        std::string xml = "<cfg><title/><net id='x'><ip>" + value + "</ip></net>";
+        for (int i = 0; i != 300; ++i)
+        {
+            xml += "<title/><net id='" + std::to_string(i) + "'><ip>1</ip></net>";
+        }
+        const std::string file = m_folder.Write("cfg.xml", xml + "</cfg>");
+        EXPECT_LT(Tool({"keys", file}).out.size(), 100 * xml.size());
+        EXPECT_LT(Tool({"--json", "keys", file}).out.size(), 100 * xml.size());
+    }
 }
 
 TEST_F(KxconfigKeys, SaysThatThereIsNone)

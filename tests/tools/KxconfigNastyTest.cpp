@@ -92,12 +92,15 @@ TEST_F(KxconfigNasty, FilesThatAreNoXmlAreToldWithTheLine)
 
 TEST_F(KxconfigNasty, DeclarationsOfEveryKind)
 {
-    const std::string kinds[] = {
-        "<!NOTATION a SYSTEM 'v'>",        "<!-- a -->",
-        "<?a b?>",                         "<!ELEMENT cfg ANY>",
-        "<!ATTLIST cfg a CDATA #IMPLIED>", "<!ENTITY a 'b'>",
-        "<!ENTITY % a 'b'>",               "<!ENTITY a SYSTEM 'b'>",
-        "<!NOTATION a SYSTEM 'v'><!ENTITY b SYSTEM 'c' NDATA a>"};
+    const std::string kinds[] = {"<!NOTATION a SYSTEM 'v'>",
+                                 "<!-- a -->",
+                                 "<?a b?>",
+                                 "<!ELEMENT cfg ANY>",
+                                 "<!ATTLIST cfg a CDATA #IMPLIED>",
+                                 "<!ENTITY a 'b'>",
+                                 "<!ENTITY % a 'b'>",
+                                 "<!ENTITY a SYSTEM 'b'>",
+                                 "<!NOTATION a SYSTEM 'v'><!ENTITY b SYSTEM 'c' NDATA a>"};
     for (const std::string& kind : kinds)
     {
         const std::string file =

@@ -99,6 +99,7 @@ _kxconfig_offer_options()
     case $1 in
         "") options+=(--version) ;;
         set) options+=(--drop-attributes --dry-run --output --wait) ;;
+        keys) options+=(--all) ;;
         explain) options+=(--set) ;;
     esac
     _kxconfig_offer "${options[@]}"

@@ -96,7 +96,8 @@ void AddCheck(CLI::App& app, Request& request)
 void AddKeys(CLI::App& app, Request& request)
 {
     AddCommand(app, "keys", "print every key path that has a value in the file", Keys, request.keys,
-               request);
+               request)
+        ->add_flag("--all", request.keys.all, "print all values of a key, not only the first ten");
 }
 
 void AddFind(CLI::App& app, Request& request)

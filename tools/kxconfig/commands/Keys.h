@@ -10,6 +10,7 @@ class Report;
 struct KeysArguments
 {
     std::string file;
+    bool all = false; ///< print every value under a key that has many
 };
 
 /** kxconfig keys: prints every key path under which a file holds a value, with that value. */

@@ -6,12 +6,18 @@
 
 #include <nlohmann/json.hpp>
 
+#include <algorithm>
+
 namespace
 {
 
+/** Below this depth lines are indented no further: there, spaces would be most of the output. */
+const int kDeepestIndentation = 20;
+
 std::string Indented(int depth, const std::string& line)
 {
-    return std::string(2 * static_cast<size_t>(depth), ' ') + line;
+    const int indentation = 2 * std::min(depth, kDeepestIndentation);
+    return std::string(static_cast<size_t>(indentation), ' ') + line;
 }
 
 const char* VerdictInJson(const TrailStep& step)
@@ -29,9 +35,15 @@ const char* VerdictInJson(const TrailStep& step)
 
 } // namespace
 
+std::string Narration::StepOf(const xmlNode* node)
+{
+    const bool isRoot = node->parent == reinterpret_cast<const xmlNode*>(node->doc);
+    return (isRoot ? "/" : "") + locations.LastStepOf(node);
+}
+
 std::string LevelEvent::Line() const
 {
-    std::string line = "below " + narration.locations.Of(level.parent) + ": ";
+    std::string line = "below " + narration.StepOf(level.parent) + ": ";
     if (level.keyEnds)
     {
         line += "the key ends in \".\", so nothing is searched";
@@ -51,22 +63,22 @@ std::string LevelEvent::Line() const
 Json LevelEvent::InJson() const
 {
     return {{"event", "level"},
-            {"location", narration.locations.Of(level.parent)},
+            {"step", narration.StepOf(level.parent)},
             {"segment", level.steps.empty() ? Json() : SegmentInJson(level.steps.front())},
             {"depth", depth}};
 }
 
 std::string StepEvent::Line() const
 {
-    return Indented(depth, "line " + LineOf(step.element) + ": " +
-                               narration.locations.Of(step.element) + ": " + DescribeVerdict());
+    return Indented(depth, "line " + LineOf(step.element) + ": " + narration.StepOf(step.element) +
+                               ": " + DescribeVerdict());
 }
 
 Json StepEvent::InJson() const
 {
     Json result = {{"event", "element"},
                    {"line", LineNumberOf(step.element)},
-                   {"location", narration.locations.Of(step.element)},
+                   {"step", narration.StepOf(step.element)},
                    {"segment", SegmentInJson(step)},
                    {"verdict", VerdictInJson(step)},
                    {"terms", TermsInJson(step)},
@@ -120,7 +132,7 @@ std::string StepEvent::DescribeSuspension() const
 {
     const std::string wouldHold =
         Fulfils(step.element, step.condition) ? "fulfills anyway" : "does not fulfill";
-    return " by name alone: " + narration.locations.Of(suspender) + " (line " + LineOf(suspender) +
+    return " by name alone: " + narration.StepOf(suspender) + " (line " + LineOf(suspender) +
            ") suspended the condition " + Quoted(Text(step.condition)) + ", which it " + wouldHold;
 }
 

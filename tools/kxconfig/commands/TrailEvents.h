@@ -22,6 +22,10 @@ struct Narration
     Walk walk;
     const Report& report; ///< paints verdicts
     Locations locations;
+
+    /** @return the last step of the node's path, with "/" if it is the root: a line that repeated
+     * the whole path would be as long as the document is deep. */
+    std::string StepOf(const xmlNode* node);
 };
 
 /** The walk starts with the elements below a node. */

@@ -26,19 +26,25 @@ std::vector<std::string> Segments(const std::string& key)
 
 } // namespace
 
+const char* ValueOf(const xmlNode* element)
+{
+    return kx::ContentOf(kx::OnlyTextChild(element));
+}
+
+std::string JoinedValues(const Elements& elements)
+{
+    std::string joined;
+    for (const xmlNode* const element : elements)
+    {
+        joined += joined.empty() ? "" : "\n";
+        joined += ValueOf(element);
+    }
+    return joined;
+}
+
 KeyValues::KeyValues(const xmlNode* root, Levels& levels) : m_levels(levels)
 {
     m_path.push_back({Text(root->name), {root}});
-}
-
-std::string KeyValues::Under(const std::string& key)
-{
-    std::string joined; // as the lookup joins them
-    for (const xmlNode* const element : BearersUnder(key))
-    {
-        joined += (joined.empty() ? "" : "\n") + Text(kx::OnlyTextChild(element)->content);
-    }
-    return joined;
 }
 
 Elements KeyValues::BearersUnder(const std::string& key)

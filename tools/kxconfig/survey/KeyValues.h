@@ -8,6 +8,12 @@
 
 using Elements = std::vector<const xmlNode*>;
 
+/** @return the value of @p element, which has one. */
+const char* ValueOf(const xmlNode* element);
+
+/** @return the values of @p elements as a lookup joins them. */
+std::string JoinedValues(const Elements& elements);
+
 /** A level that a key leads to, and the segment that a lookup compares the level's elements with.
  */
 struct Comparison
@@ -28,10 +34,10 @@ public:
     /** @param levels  must outlive the object, like the document. */
     KeyValues(const xmlNode* root, Levels& levels);
 
-    /** @param key  one that ListKeys() listed. */
-    std::string Under(const std::string& key);
-
-    /** @return the elements that give the values under @p key, in document order. */
+    /**
+     * @param key  one that ListKeys() listed.
+     * @return the elements that give the values under @p key, in document order.
+     */
     Elements BearersUnder(const std::string& key);
 
     /** @return the levels that the last key led to and the one before it did not, in the order in
