@@ -94,6 +94,9 @@ const char* const kLookUpOrTerms = "look up with a condition, terms joined by |"
 const char* const kUpdate = "update one value in a document of 100 KB";
 const char* const kUpdateAndSave = "update one value in a document of 100 KB and save";
 
+const char* const kUpdateCondition = "update with a condition, match at sibling";
+const std::size_t kUpdatedItems = 1000;
+
 const char* const kIterate = "iterate over 10000 children";
 const char* const kListChildren = "list 10000 children";
 const std::size_t kIteratedChildren = 10000;
@@ -118,6 +121,7 @@ const Query kQueries[] = {
 const char* const kLibrary = "this library";
 const char* const kLibraryReturning = "this library, value returned";
 const char* const kWalk = "hand-written walk"; // or whatever else one would write by hand
+const char* const kWalkInPlace = "hand-written walk, in place"; // attributes not copied
 const char* const kXPathFresh = "XPath, fresh";
 const char* const kXPathCompiled = "XPath, compiled";
 const char* const kXPathListed = "XPath, fresh, into a list";

@@ -18,7 +18,7 @@ $programs/kx_bench_allocations >$results/allocations.json
 # several processes, one in each round, and the median of the rounds counts.
 mapfile -t workloads < <($programs/kx_bench --benchmark_list_tests | sed 's,/[^/]*$,,' | awk '!seen[$0]++')
 rm -f $results/time-*.json
-rounds=9
+rounds=${KX_BENCH_ROUNDS:-9}
 for round in $(seq $rounds); do
     echo "== time, round $round of $rounds"
     # shellcheck disable=SC2001  # a regular expression
@@ -33,9 +33,9 @@ done
 echo "== instructions"
 scripts/count_instructions.sh $programs/kx_bench_instructions >$results/instructions.txt
 
-echo "== cost of the log gates and of the walks' observer"
+echo "== cost of the log gates"
 mapfile -t names < <(cut -f2 $results/instructions.txt | grep '/this library' | grep -vE '^load|0000/')
-for variant in as_it_is no_gates no_watch; do
+for variant in as_it_is no_gates; do
     LD_LIBRARY_PATH=$programs/variants/$variant scripts/count_instructions.sh $programs/kx_bench_guard "${names[@]}" \
         >$results/$variant.txt
 done

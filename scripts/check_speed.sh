@@ -1,18 +1,17 @@
 #!/usr/bin/env bash
 # Detects regressions of speed: counts the instructions of some key operations and compares them with the counts in
-# bench/instructions.txt, which are valid for Debian 12 on x86-64, and with those of a library without the observer of
-# the walks.
+# bench/instructions.txt, which are valid for Debian 12 on x86-64; and the stack that a level of a lookup takes.
 # usage: check_speed.sh [--accept]
 #   --accept  writes the present counts to the file, for an intended change
 . "$(dirname "$0")/common.sh"
 
-margin=3          # percent
-observer_margin=1 # percent: the compiler may choose other registers
+margin=3        # percent
+stack_limit=240 # bytes
 file=bench/instructions.txt
 
 need "${build_packages[@]}" valgrind
 
-build_preset bench --target kx_bench_guard kx_as_it_is kx_no_watch
+build_preset bench --target kx_bench_guard kx_as_it_is
 
 # Versions outside this project that affect the counts.
 versions() {
@@ -74,8 +73,12 @@ MESSAGE
     exit 1
 fi
 
-echo "== instructions, against walks without an observer"
-if ! compare $observer_margin <(count no_watch) <(echo "$counted"); then
-    echo "The observer's calls have to vanish in the library's own walks: see src/config/Observer.h." >&2
-    exit 1
-fi
+echo "== stack for a level of a lookup"
+awk -F'\t' -v limit=$stack_limit '
+    /(Append|Collect)Values\(/ {
+        print $2, $1
+        seen++
+        failed = failed || $2 > limit
+    }
+    END { exit failed || seen != 2 }' build/bench/bench/CMakeFiles/kx_as_it_is.dir/__/src/config/KeyPathLookup.cpp.su ||
+    { echo "a level of a lookup has to take at most $stack_limit bytes of stack" >&2; exit 1; }

@@ -1,5 +1,7 @@
 // What one would write by hand over libxml2: the limit of the engine. Fixed paths, names compared
 // by strcmp, nothing allocated but the result and what the engine allocates for an attribute read.
+// Walks with a condition come in two forms: with xmlGetProp(), as one would write them, and reading
+// the attribute in place, which holds for attributes of a single text only.
 //
 // The walks find every match, as a lookup of the library does.
 
@@ -88,6 +90,24 @@ bool HasAttribute(xmlNode* element, const char* name, const char* value)
     return equal;
 }
 
+bool HasAttributeInPlace(xmlNode* element, const char* name, const char* value)
+{
+    for (const xmlAttr* attribute = element->properties; attribute != nullptr;
+         attribute = attribute->next)
+    {
+        if (std::strcmp(Text(attribute->name), name) == 0)
+        {
+            const xmlNode* const text = attribute->children;
+            return text != nullptr && text->next == nullptr && text->type == XML_TEXT_NODE &&
+                   std::strcmp(Text(text->content), value) == 0;
+        }
+    }
+    return false;
+}
+
+/** One of the two ways to test an attribute. */
+using Test = bool (*)(xmlNode* element, const char* name, const char* value);
+
 using Names = std::vector<std::string>;
 
 void AppendBelow(const xmlNode* parent, Names::const_iterator name, Names::const_iterator last,
@@ -151,11 +171,12 @@ struct ExpectedAttribute
     std::string value;
 };
 
+template <Test test>
 bool AllHold(xmlNode* element, const std::vector<ExpectedAttribute>& terms)
 {
     for (const ExpectedAttribute& term : terms)
     {
-        if (!HasAttribute(element, term.name.c_str(), term.value.c_str()))
+        if (!test(element, term.name.c_str(), term.value.c_str()))
         {
             return false;
         }
@@ -164,12 +185,13 @@ bool AllHold(xmlNode* element, const std::vector<ExpectedAttribute>& terms)
 }
 
 /** Tests every term, as the library has to. */
+template <Test test>
 bool AnyHolds(xmlNode* element, const std::vector<ExpectedAttribute>& terms)
 {
     bool any = false;
     for (const ExpectedAttribute& term : terms)
     {
-        any = HasAttribute(element, term.name.c_str(), term.value.c_str()) || any;
+        any = test(element, term.name.c_str(), term.value.c_str()) || any;
     }
     return any;
 }
@@ -275,44 +297,72 @@ void AddLookUpsByDepth()
     }
 }
 
-void AddLookUpsWithConditions()
+template <Test test>
+void AddLookUpsWithConditions(const char* implementation)
 {
     for (const std::size_t count : Joined(kItemCounts, kMoreItemCounts))
     {
-        Add(Sized(kLookUpCondition, count), kWalk, ItemName(count),
+        Add(Sized(kLookUpCondition, count), implementation, ItemName(count),
             [count]
             {
                 return [document = LoadedDocument(Items(count)), id = std::to_string(count)]
                 {
                     return TextsInSelected(RootOf(document), "item", "name",
                                            [&id](xmlNode* item)
-                                           { return HasAttribute(item, "id", id.c_str()); });
+                                           { return test(item, "id", id.c_str()); });
                 };
             });
     }
     for (const std::size_t count : kTermCounts)
     {
-        Add(Sized(kLookUpAndTerms, count), kWalk, std::string(kAttributedValue),
+        Add(Sized(kLookUpAndTerms, count), implementation, std::string(kAttributedValue),
             [count]
             {
                 return [document = LoadedDocument(Attributed()), terms = AndTerms(count)]
                 {
                     return TextsInSelected(RootOf(document), "item", "name",
                                            [&terms](xmlNode* item)
-                                           { return AllHold(item, terms); });
+                                           { return AllHold<test>(item, terms); });
                 };
             });
-        Add(Sized(kLookUpOrTerms, count), kWalk, std::string(kAttributedValue),
+        Add(Sized(kLookUpOrTerms, count), implementation, std::string(kAttributedValue),
             [count]
             {
                 return [document = LoadedDocument(Attributed()), terms = OrTerms(count)]
                 {
                     return TextsInSelected(RootOf(document), "item", "name",
                                            [&terms](xmlNode* item)
-                                           { return AnyHolds(item, terms); });
+                                           { return AnyHolds<test>(item, terms); });
                 };
             });
     }
+}
+
+/** Gives the text to the elements @p name in those "item" whose "id" it is. */
+template <Test test>
+int UpdateSelected(const xmlNode* root, const char* id, const char* name, const char* text)
+{
+    int updated = 0;
+    for (xmlNode* child = root->children; child != nullptr; child = child->next)
+    {
+        if (IsNamed(child, "item") && test(child, "id", id))
+        {
+            updated += Update(child, name, text);
+        }
+    }
+    return updated;
+}
+
+template <Test test>
+void AddUpdatesWithConditions(const char* implementation)
+{
+    Add(Sized(kUpdateCondition, kUpdatedItems), implementation, 1,
+        []
+        {
+            return [document = LoadedDocument(Items(kUpdatedItems)),
+                    id = std::to_string(kUpdatedItems), text = ItemName(kUpdatedItems)]
+            { return UpdateSelected<test>(RootOf(document), id.c_str(), "name", text.c_str()); };
+        });
 }
 
 void AddUpdates()
@@ -344,8 +394,11 @@ const Registration registration(
         AddLoads();
         AddLookUpsBySiblings();
         AddLookUpsByDepth();
-        AddLookUpsWithConditions();
+        AddLookUpsWithConditions<HasAttribute>(kWalk);
+        AddLookUpsWithConditions<HasAttributeInPlace>(kWalkInPlace);
         AddUpdates();
+        AddUpdatesWithConditions<HasAttribute>(kWalk);
+        AddUpdatesWithConditions<HasAttributeInPlace>(kWalkInPlace);
     });
 
 } // namespace

@@ -143,6 +143,14 @@ void AddUpdates()
             return [writer = LoadedWriter(Channels(kUpdatedChannels)), key, text]
             { return writer->SetValue(key, text); };
         });
+    // The text stays what it is, as lookups work on the same document.
+    Add(Sized(kUpdateCondition, kUpdatedItems), kLibrary, 0,
+        []
+        {
+            return [writer = LoadedWriter(Items(kUpdatedItems)),
+                    key = "cfg.item@id=" + std::to_string(kUpdatedItems) + ".name",
+                    text = ItemName(kUpdatedItems)] { return writer->SetValue(key, text); };
+        });
     Add(kUpdateAndSave, kLibrary, 0,
         [key, text]
         {

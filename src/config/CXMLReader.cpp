@@ -1,5 +1,6 @@
 #include "CXMLReader.h"
 
+#include "KeyPath.h"
 #include "KeyPathLookup.h"
 #include "diag/Log.h"
 #include "diag/Status.h"
@@ -15,7 +16,7 @@ namespace
 
 bool IsRootOf(const xmlNode* root, const KeySplit& key)
 {
-    return key.hasRest && SameText(root->name, key.first);
+    return key.HasRest() && SameText(root->name, key.First());
 }
 
 int FindValues(xmlDoc* document, TextView key, std::string& value)
@@ -27,7 +28,7 @@ int FindValues(xmlDoc* document, TextView key, std::string& value)
         return StatusMissing;
     }
     const KeySplit split(key);
-    if (!split.hasRest)
+    if (!split.HasRest())
     {
         return StatusBadArgument;
     }
@@ -37,7 +38,7 @@ int FindValues(xmlDoc* document, TextView key, std::string& value)
         return StatusOk;
     }
     unsigned int found = 0;
-    AppendValues(root, split.rest, value, found);
+    AppendValues(root, split.Rest(), value, found);
     return found != 0 ? StatusOk : StatusNotFound;
 }
 
@@ -95,7 +96,7 @@ std::string CXMLReader::GetValue(const std::string& key)
     const KeySplit split((TextView(key)));
     if (root != 0 && IsRootOf(root, split))
     {
-        CollectValues(root, split.rest, result);
+        CollectValues(root, split.Rest(), result);
     }
     KX_VALUE_OF("Parsed Value :: %s", result.c_str());
     return result;

@@ -1,5 +1,6 @@
 #include "CXMLWriter.h"
 
+#include "KeyPath.h"
 #include "KeyPathUpdate.h"
 #include "diag/Log.h"
 #include "diag/Status.h"
@@ -68,17 +69,17 @@ int CXMLWriter::SetValue(const std::string& key, std::string value)
         return StatusMissing;
     }
     const KeySplit split((TextView(key)));
-    if (!split.hasRest)
+    if (!split.HasRest())
     {
         return StatusBadArgument;
     }
     // Clients take a key of another document's for success with nothing done.
-    if (!SameText(root->name, split.first))
+    if (!SameText(root->name, split.First()))
     {
         return StatusOk;
     }
     unsigned int updated = 0;
-    const int status = UpdateValues(root, split.rest, value.c_str(), updated);
+    const int status = UpdateValues(root, split.Rest(), value.c_str(), updated);
     return updated == 0 ? StatusNotFound : status;
 }
 

@@ -1,98 +1,105 @@
 #ifndef KX_CONFIG_CONDITION_H
 #define KX_CONFIG_CONDITION_H
 
-#include "KeyPath.h"
+#include "engine/Attribute.h"
 
 namespace kx
 {
 
-/** One comparison of a condition: an attribute's name and the value that it must have. */
-struct Term
-{
-    TextView name;
-    TextView value;
-    bool endsWithOr; ///< whether "|" follows the term: it decides how the next one is joined
-};
+/**
+ * One comparison of a condition: an attribute that the element must have.
+ *
+ * A term without "=" has an empty name, which names no attribute.
+ */
+typedef AttributeView Term;
 
-/** Takes the terms off a condition, one after the other; linear in the condition's length. */
+/**
+ * Takes the terms off a condition, one after the other; linear in the condition's length.
+ *
+ * "|" is searched first and over all that remains, so that a "&" ahead of it becomes part of the
+ * term's value. Conditions in the field are written for this reading.
+ */
 class TermCursor
 {
 public:
-    explicit TermCursor(TextView condition) : m_remaining(condition), m_orAhead(true) {}
+    explicit TermCursor(TextView condition) : m_remaining(condition), m_tookOr(true) {}
 
     bool AtEnd() const { return m_remaining.IsEmpty(); }
     Term Next();
+
+    /** @return whether "|" follows the term taken last: it decides how the next one is joined. */
+    bool TookOr() const { return m_tookOr; }
 
 private:
     size_t FindSeparator();
 
     TextView m_remaining;
-    bool m_orAhead; ///< false once a search has shown that no "|" is left
-};
-
-/** A term made ready to be tested: the engine takes an attribute's name zero-terminated. */
-class TermTest
-{
-public:
-    explicit TermTest(const Term& term);
-
-    bool Holds(xmlNode* element) const
-    {
-        return m_shortName[0] != 0 ? HasValue(element, m_shortName) : LongNameHolds(element);
-    }
-
-private:
-    /** Longer than any sensible attribute name is: only such are copied to the heap. */
-    static const size_t kShortName = 64;
-
-    bool HasValue(xmlNode* element, const xmlChar* name) const
-    {
-        xmlChar* const text = xmlGetProp(element, name);
-        if (text == 0)
-        {
-            return false;
-        }
-        const bool equal = SameText(text, m_value);
-        xmlFree(text);
-        return equal;
-    }
-
-    bool LongNameHolds(xmlNode* element) const;
-
-    const TextView m_value;
-    TextView m_longName;             ///< a name that is too long for the copy
-    xmlChar m_shortName[kShortName]; ///< zero-terminated; empty if the name is long, or none
+    bool m_tookOr; ///< once false, no "|" is left
 };
 
 /**
- * What the attributes of an element must fulfil.
+ * What the attributes of an element must fulfil; without a text, nothing.
  *
- * One object tests all the elements of a level: most conditions have a single term, and the first
- * one is split and made ready only once.
+ * The first term is split once for all elements of a level: most conditions have no other.
  */
-class Condition
+struct Condition
 {
-public:
-    /** @param text  not empty. */
-    explicit Condition(TextView text) : m_others(text), m_first(m_others.Next()), m_test(m_first) {}
+    Condition() : others(text) {}
 
-    /** Terms combine from left to right; a failed "&" or last term rejects at once. */
-    template <class Observer>
-    bool Holds(xmlNode* element) const
+    explicit Condition(TextView whole)
+        : text(whole), others(whole), first(IsEmpty() ? Term() : others.Next())
     {
-        const bool firstHolds = m_test.Holds(element);
-        Observer::Tested(m_first, firstHolds);
-        return m_others.AtEnd() ? firstHolds : OthersHold<Observer>(element, firstHolds);
     }
 
-private:
-    /** ConditionEvaluation.h defines it; the library has it for the observer Silent. */
-    template <class Observer>
-    bool OthersHold(xmlNode* element, bool accepted) const;
+    bool IsEmpty() const { return text.IsEmpty(); }
 
-    TermCursor m_others; ///< the terms after the first
-    const Term m_first;
-    const TermTest m_test;
+    /** @return whether @p element fulfills the condition; any does if it is empty. */
+    bool Admits(const xmlNode* element) const
+    {
+        return IsEmpty() || (others.AtEnd() ? HasAttribute(element, first) : TestTerms(element));
+    }
+
+    bool TestTerms(const xmlNode* element) const;
+
+    TextView text;
+    TermCursor others; ///< the terms after the first
+    Term first;
+};
+
+/**
+ * Tests a condition, which is not empty, on an element: term by term, from left to right, without
+ * precedence of one separator over the other.
+ *
+ * A test stands on a term that has been tested, from its construction on.
+ */
+class ConditionTest
+{
+public:
+    ConditionTest(const Condition& condition, const xmlNode* element)
+        : m_element(element),
+          m_others(condition.others),
+          m_term(condition.first),
+          m_termHolds(HasAttribute(element, m_term)),
+          m_accepted(m_termHolds)
+    {
+    }
+
+    /** Tests the next term. @return false if there is none, or if a term has rejected for good. */
+    bool Next();
+
+    const Term& GetTerm() const { return m_term; }
+    bool TermEndsWithOr() const { return m_others.TookOr(); }
+    bool TermHolds() const { return m_termHolds; }
+
+    /** @return what all terms so far amount to. */
+    bool IsAccepted() const { return m_accepted; }
+
+private:
+    const xmlNode* m_element;
+    TermCursor m_others;
+    Term m_term;
+    bool m_termHolds;
+    bool m_accepted;
 };
 
 } // namespace kx

@@ -8,24 +8,28 @@
  * Everything works on views of the caller's bytes; nothing is copied.
  */
 
-#include "engine/Node.h"
+#include "Condition.h"
 
 namespace kx
 {
 
 /** A key split at its first "." into this level's segment and the key of the levels below. */
-struct KeySplit
+class KeySplit
 {
-    explicit KeySplit(TextView key)
-        : first(key.Before(key.Find('.'))),
-          rest(key.After(first.size)),
-          hasRest(first.size != key.size)
-    {
-    }
+public:
+    explicit KeySplit(TextView key) : m_key(key), m_dot(key.Find('.')) {}
 
-    TextView first;
-    TextView rest; ///< reaches to the end of the key, so it is zero-terminated like the key
-    bool hasRest;  ///< false only without a "."; a key that ends in "." has an empty rest
+    TextView First() const { return m_key.Before(m_dot); }
+
+    /** @return whether there is a "."; a key that ends in it has an empty rest. */
+    bool HasRest() const { return m_dot != m_key.size; }
+
+    /** @return the bytes after the "."; zero-terminated if the key is, as they reach to its end. */
+    TextView Rest() const { return m_key.After(m_dot); }
+
+private:
+    TextView m_key;
+    size_t m_dot;
 };
 
 /** A segment split at its first "@" into an element name and a condition. */
@@ -38,16 +42,11 @@ struct Segment
     {
     }
 
-    Segment(TextView elementName, TextView itsCondition)
-        : name(elementName), condition(itsCondition)
-    {
-    }
-
     /** @return whether @p element bears the segment's name. */
     bool Names(const xmlNode* element) const { return SameText(element->name, name); }
 
     TextView name;
-    TextView condition; ///< empty if the segment has none: every element of the name will do
+    Condition condition;
 };
 
 } // namespace kx

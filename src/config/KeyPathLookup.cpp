@@ -1,6 +1,8 @@
 #include "KeyPathLookup.h"
 
-#include "LookupWalk.h"
+#include "SiblingScan.h"
+#include "diag/Log.h"
+#include "diag/Status.h"
 
 namespace kx
 {
@@ -8,66 +10,90 @@ namespace kx
 namespace
 {
 
-/** One level of the lookup that runs the values of one parent together. */
-class Collector
+void AppendLine(std::string& lines, const char* text)
 {
-public:
-    Collector(const KeySplit& key, std::string& result)
-        : m_key(key), m_result(result), m_start(result.size())
+    if (!lines.empty())
     {
+        lines += '\n';
     }
+    lines += text;
+}
 
-    void Accept(const xmlNode* element)
+/** Puts "\n" in front of @p text if @p separate, but not of one that is empty. */
+void AppendText(std::string& result, bool separate, const char* text)
+{
+    if (separate && *text != 0)
     {
-        const xmlNode* const text = OnlyTextChild(element);
-        if (text != 0)
-        {
-            m_result += ContentOf(text);
-        }
-        if (m_key.hasRest)
-        {
-            CollectBranch(element);
-        }
+        result += '\n';
     }
-
-private:
-    Collector(const Collector&);
-    Collector& operator=(const Collector&);
-
-    void CollectBranch(const xmlNode* element)
-    {
-        const size_t end = m_result.size();
-        const bool separate = end != m_start;
-        if (separate)
-        {
-            m_result += '\n';
-        }
-        CollectValues(element, m_key.rest, m_result);
-        if (separate && m_result.size() == end + 1)
-        {
-            m_result.resize(end);
-        }
-    }
-
-    const KeySplit& m_key;
-    std::string& m_result;
-    const size_t m_start; ///< where this level's own result begins
-};
+    result += text;
+}
 
 } // namespace
 
-void CollectValues(const xmlNode* node, TextView key, std::string& result)
+void CollectValues(const xmlNode* node, TextView key, std::string& result, bool separate)
 {
     if (node == 0 || key.IsEmpty())
     {
         return;
     }
+    const size_t start = result.size(); // what is before it was found on other levels
     const KeySplit split(key);
-    Collector collector(split, result);
-    ScanSiblings<Silent>(node, Segment(split.first), collector);
+    const Segment segment(split.First());
+    SiblingScan scan(node, segment);
+    while (scan.Next())
+    {
+        if (!scan.IsSelected())
+        {
+            continue;
+        }
+        if (const xmlNode* const text = OnlyTextChild(scan.Element()))
+        {
+            AppendText(result, separate && result.size() == start, ContentOf(text));
+        }
+        if (split.HasRest())
+        {
+            CollectValues(scan.Element(), split.Rest(), result, separate || result.size() != start);
+        }
+    }
 }
 
-template int AppendValues<Silent>(const xmlNode* node, TextView key, std::string& value,
-                                  unsigned int& found);
+int AppendValues(const xmlNode* node, TextView key, std::string& value, unsigned int& found)
+{
+    const char* const tag = "XMLGetValue";
+    if (node == 0 || key.IsEmpty())
+    {
+        KX_TRACE_AS(tag, "+");
+        KX_TRACE_AS(tag, "-");
+        return StatusMissing;
+    }
+    KX_LOG_EITHER(LogLevelTrace, LogLevelValue)
+    {
+        KX_TRACE_AS(tag, "+");
+        KX_VALUE_AS(tag, "Key :: %s", key.data);
+    }
+    int status = StatusNotFound;
+    const KeySplit split(key);
+    const Segment segment(split.First());
+    SiblingScan scan(node, segment);
+    while (scan.Next())
+    {
+        if (!scan.IsSelected())
+        {
+            continue;
+        }
+        if (const xmlNode* const text = OnlyTextChild(scan.Element()))
+        {
+            AppendLine(value, ContentOf(text));
+            found = 1;
+        }
+        if (split.HasRest())
+        {
+            status = AppendValues(scan.Element(), split.Rest(), value, found);
+        }
+    }
+    KX_TRACE_AS(tag, "-");
+    return status;
+}
 
 } // namespace kx

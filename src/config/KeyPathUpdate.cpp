@@ -1,11 +1,28 @@
 #include "KeyPathUpdate.h"
 
 #include "UpdateWalk.h"
+#include "diag/Status.h"
 
 namespace kx
 {
 
-template int UpdateValues<Silent>(xmlNode* top, TextView key, const char* value,
-                                  unsigned int& updated);
+int UpdateValues(xmlNode* top, TextView key, const char* value, unsigned int& updated)
+{
+    if (top == 0 || key.IsEmpty())
+    {
+        return StatusMissing;
+    }
+    UpdateWalk walk(top, key);
+    while (walk.Next())
+    {
+        // Also in the middle of a path: an element that holds only text is meant.
+        if (walk.IsSelected() && OnlyTextChild(walk.Element()) != 0)
+        {
+            xmlNodeSetContent(walk.Element(), reinterpret_cast<const xmlChar*>(value));
+            updated = 1;
+        }
+    }
+    return walk.GetStatus();
+}
 
 } // namespace kx

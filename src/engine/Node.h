@@ -25,12 +25,18 @@ inline xmlNode* ElementFrom(xmlNode* node, NodeLink link = &xmlNode::next)
     return node;
 }
 
+/** @return @p node, which may be null, if it is a text node and the last of its siblings; or null.
+ */
+inline xmlNode* OnlyText(xmlNode* node)
+{
+    const bool isOnlyText = node != 0 && node->type == XML_TEXT_NODE && node->next == 0;
+    return isOnlyText ? node : 0;
+}
+
 /** @return the text node that is the only child of @p node, which may be null; or null. */
 inline xmlNode* OnlyTextChild(const xmlNode* node)
 {
-    xmlNode* const child = LinkOf(node, &xmlNode::children);
-    const bool isOnlyText = child != 0 && child->type == XML_TEXT_NODE && child->next == 0;
-    return isOnlyText ? child : 0;
+    return OnlyText(LinkOf(node, &xmlNode::children));
 }
 
 /** @return the content of the text node @p text; never null. */

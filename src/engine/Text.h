@@ -19,7 +19,7 @@ namespace kx
 /** A run of bytes in a string that outlives the view. Any byte may occur, NUL included. */
 struct TextView
 {
-    TextView() : data(""), size(0) {}
+    TextView() : data(0), size(0) {}
     TextView(const char* bytes, size_t count) : data(bytes), size(count) {}
     explicit TextView(const std::string& text) : data(text.c_str()), size(text.size()) {}
 
@@ -69,13 +69,15 @@ inline bool SameText(const xmlChar* text, TextView view)
         return false;
     }
     const xmlChar* const bytes = reinterpret_cast<const xmlChar*>(view.data);
-    size_t same = 0;
-    // A NUL in the view is no byte of the text: it must not lead past the terminator.
-    while (same != view.size && text[same] == bytes[same] && text[same] != 0)
+    for (size_t i = 0; i != view.size; ++i)
     {
-        ++same;
+        // A NUL in the view is no byte of the text: it must not lead past the terminator.
+        if (text[i] != bytes[i] || text[i] == 0)
+        {
+            return false;
+        }
     }
-    return same == view.size && text[same] == 0;
+    return text[view.size] == 0;
 }
 
 /** The same of a zero-terminated name, which the system's calls compare faster. */

@@ -124,6 +124,7 @@ class Library
 public:
     explicit Library(const std::string& path) : m_reader(path)
     {
+        Reshape(GetDocument());
         m_writer.SetDataPtr(GetDocument());
     }
     ~Library() { m_writer.SetDataPtr(nullptr); }
@@ -255,6 +256,7 @@ std::string Difference(const Case& subject, Tally& tally)
     const MemoryFile file(subject.document);
     Library library(file.Path());
     const Document document(xmlParseFile(file.Path().c_str()));
+    Reshape(document.get());
     if ((document == nullptr) != (library.GetDocument() == nullptr))
     {
         return "one of them does not parse the document";

@@ -88,6 +88,10 @@ private:
         {
             return m_dice.Pick({"&e;", "x&e;y"});
         }
+        if (m_dice.OneIn(8))
+        {
+            return m_dice.Pick({"#", "#0", "#2", "#c"}); // for Reshape()
+        }
         return m_dice.Pick({"1", "1", "1", "2", "2", "12", "", "=", "1=2", "1|2", "1&amp;2",
                             "1&amp;nm=2", "1@m=2", "&lt;"});
     }
@@ -314,6 +318,7 @@ Case Generated(std::uint64_t seed)
     const xmlDocPtr document =
         xmlReadMemory(drawn.document.data(), static_cast<int>(drawn.document.size()), nullptr,
                       nullptr, XML_PARSE_NOERROR | XML_PARSE_NOWARNING);
+    Reshape(document);
     if (document != nullptr)
     {
         KeyWriter keys(dice, document);

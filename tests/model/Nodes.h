@@ -14,6 +14,14 @@ namespace kxmodel
  */
 std::vector<xmlNodePtr> NodesOf(xmlDocPtr document);
 
+/**
+ * Gives attributes shapes that no parser makes but that clients can: those whose value begins with
+ * "#" lose their children, or get a text without content, two texts or a CDATA section instead.
+ *
+ * What a shape is follows from the value, so that a case stays a text. @p document may be null.
+ */
+void Reshape(xmlDocPtr document);
+
 } // namespace kxmodel
 
 #endif

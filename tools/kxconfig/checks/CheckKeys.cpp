@@ -118,7 +118,7 @@ std::string WhyNoValueUnder(const std::string& key, const xmlNode* root, const x
 {
     if (!StartsAtRoot(root->doc, key))
     {
-        return "it starts with " + Quoted(Text(kx::KeySplit(kx::TextView(key)).first)) +
+        return "it starts with " + Quoted(Text(kx::KeySplit(kx::TextView(key)).First())) +
                ", but the root element is " + Quoted(Text(root->name));
     }
     return "it leads as far as " + warnings.LocationOf(end) + "; kxconfig explain shows the reason";

@@ -41,13 +41,13 @@ std::string CompareRoot(const xmlNode* root, const std::string& key)
     {
         return "the key is empty, so nothing is searched";
     }
-    if (!split.hasRest)
+    if (!split.HasRest())
     {
         return "the key " + Quoted(key) + " has no \".\", so nothing is searched";
     }
-    if (!kx::SameText(root->name, split.first))
+    if (!kx::SameText(root->name, split.First()))
     {
-        return "the key starts with " + Quoted(Text(split.first)) + ", not with the root's name " +
+        return "the key starts with " + Quoted(Text(split.First())) + ", not with the root's name " +
                Quoted(Text(root->name)) + ": nothing is searched, which counts as success";
     }
     return "the key starts with the root's name";
@@ -136,13 +136,11 @@ ExitStatus ExplainLookup(CXMLReader& reader, const std::string& key, Report& rep
 
 ExitStatus ExplainUpdate(CXMLReader& reader, const std::string& key, Report& report)
 {
-    // Any text that leaves an element with a text will do: both walks find the same elements.
-    const char* const value = "-";
-    const Trail trail = RecordUpdate(DocumentOf(reader), key, value);
+    const Trail trail = RecordUpdate(DocumentOf(reader), key);
     AddTrail(trail, Walk::Update, report);
 
     GuestWriter writer(reader);
-    const int status = writer.Get().SetValue(key, value);
+    const int status = writer.Get().SetValue(key, "-");
     report.Add(CallEvent{"SetValue(key, value)", status, std::nullopt});
     return ToExitStatus(status, !trail.StepsWithText().empty());
 }

@@ -9,7 +9,7 @@
 
 void RequireWellFormedKey(const std::string& key)
 {
-    if (!kx::KeySplit(kx::TextView(key)).hasRest)
+    if (!kx::KeySplit(kx::TextView(key)).HasRest())
     {
         throw Failure(ExitStatus::BadUsage,
                       "malformed key " + Quoted(key) +
@@ -21,7 +21,7 @@ void RequireKey(const std::string& key, const std::string& file, CXMLReader& rea
 {
     RequireWellFormedKey(key);
     const xmlNode* const root = RootOf(reader);
-    const kx::TextView first = kx::KeySplit(kx::TextView(key)).first;
+    const kx::TextView first = kx::KeySplit(kx::TextView(key)).First();
     if (!kx::SameText(root->name, first))
     {
         throw Failure(ExitStatus::NothingFound,

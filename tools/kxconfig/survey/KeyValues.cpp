@@ -17,9 +17,9 @@ std::vector<std::string> Segments(const std::string& key)
     for (bool hasRest = true; hasRest;)
     {
         const kx::KeySplit split(rest);
-        segments.push_back(Text(split.first));
-        rest = split.rest;
-        hasRest = split.hasRest;
+        segments.push_back(Text(split.First()));
+        rest = split.Rest();
+        hasRest = split.HasRest();
     }
     return segments;
 }

@@ -1,8 +1,7 @@
 #include "walk/Trail.h"
 
 #include "KxLog.h"
-#include "config/ConditionEvaluation.h"
-#include "config/LookupWalk.h"
+#include "config/SiblingScan.h"
 #include "config/UpdateWalk.h"
 
 namespace
@@ -13,85 +12,132 @@ std::string_view View(const kx::TextView& text)
     return {text.data, text.size};
 }
 
-/** Writes down what the walks tell. They tell it to no object, so there is one recorder at a time.
- */
-class Recorder
+/** What an element was compared with, and whether it bears the name. */
+TrailStep Compared(const xmlNode* element, const kx::Segment& segment, bool isNamed)
 {
-public:
-    Recorder() { s_current = this; }
-    ~Recorder() { s_current = nullptr; }
-    Recorder(const Recorder&) = delete;
-    Recorder& operator=(const Recorder&) = delete;
+    TrailStep step;
+    step.element = element;
+    step.name = View(segment.name);
+    step.condition = View(segment.condition.text);
+    step.verdict = isNamed ? Verdict::Rejected : Verdict::OtherName;
+    return step;
+}
 
-    Trail Take() { return std::move(m_trail); }
-
-    // The observer of a walk: src/config/Observer.h tells what each call means.
-
-    static void EnterLevel(const xmlNode* parent) { s_current->Enter(parent); }
-    static void LeaveLevel() { s_current->m_levels.pop_back(); }
-    static void EmptyKey(const xmlNode* parent) { s_current->EndKey(parent); }
-    static void OtherName() { Step().verdict = Verdict::OtherName; }
-    static void Rejected() { Step().verdict = Verdict::Rejected; }
-
-    static void Compare(const xmlNode* element, const kx::Segment& segment)
+/** The terms of the condition, up to the one that decided. */
+std::vector<TestedTerm> TestTerms(const xmlNode* element, const kx::Condition& condition)
+{
+    std::vector<TestedTerm> terms;
+    if (!condition.IsEmpty())
     {
-        TrailStep step;
-        step.element = element;
-        step.name = View(segment.name);
-        step.condition = View(segment.condition);
-        s_current->m_levels.back()->steps.push_back(std::move(step));
-    }
-
-    static void Selected(bool suspended)
-    {
-        Step().verdict = Verdict::Accepted;
-        Step().suspended = suspended && !Step().condition.empty();
-    }
-
-    static void Tested(const kx::Term& term, bool holds)
-    {
-        Step().terms.push_back({View(term.name), View(term.value), term.endsWithOr, holds});
-    }
-
-    static void Value(const xmlNode* text)
-    {
-        if (text != nullptr)
+        kx::ConditionTest test(condition, element);
+        do
         {
-            Step().text = kx::ContentOf(text);
+            terms.push_back({View(test.GetTerm().name), View(test.GetTerm().value),
+                             test.TermEndsWithOr(), test.TermHolds()});
+        } while (test.Next());
+    }
+    return terms;
+}
+
+void Accept(TrailStep& step)
+{
+    step.verdict = Verdict::Accepted;
+    if (const xmlNode* const text = kx::OnlyTextChild(step.element))
+    {
+        step.text = kx::ContentOf(text);
+    }
+}
+
+TrailStep StepOf(const kx::SiblingScan& scan, const kx::Segment& segment)
+{
+    TrailStep step = Compared(scan.Element(), segment, scan.IsNamed());
+    step.suspended = scan.IsNamed() && scan.IsSuspended() && !step.condition.empty();
+    if (scan.IsNamed() && !scan.IsSuspended())
+    {
+        step.terms = TestTerms(scan.Element(), segment.condition);
+    }
+    if (scan.IsSelected())
+    {
+        Accept(step);
+    }
+    return step;
+}
+
+TrailStep StepOf(const kx::UpdateWalk& walk)
+{
+    TrailStep step = Compared(walk.Element(), walk.Wanted(), walk.IsNamed());
+    if (walk.IsNamed())
+    {
+        step.terms = TestTerms(walk.Element(), walk.Wanted().condition);
+    }
+    if (walk.IsSelected())
+    {
+        Accept(step);
+    }
+    step.keyEnds = !walk.IsRejected() && walk.EndsHere();
+    return step;
+}
+
+std::unique_ptr<TrailLevel> LevelBelow(const xmlNode* parent)
+{
+    auto level = std::make_unique<TrailLevel>();
+    level->parent = parent;
+    return level;
+}
+
+/** The descent of AppendValues(), with each step of its scan written down. */
+std::unique_ptr<TrailLevel> LookUp(const xmlNode* node, kx::TextView key)
+{
+    auto level = LevelBelow(node);
+    const kx::KeySplit split(key);
+    const kx::Segment segment(split.First());
+    kx::SiblingScan scan(node, segment);
+    while (scan.Next())
+    {
+        TrailStep step = StepOf(scan, segment);
+        if (step.verdict == Verdict::Accepted && split.HasRest())
+        {
+            step.keyEnds = split.Rest().IsEmpty();
+            step.below = step.keyEnds ? nullptr : LookUp(scan.Element(), split.Rest());
+        }
+        level->steps.push_back(std::move(step));
+    }
+    return level;
+}
+
+/** The walk of UpdateValues(), with each step written down; nothing is replaced. */
+std::unique_ptr<TrailLevel> Update(const xmlNode* node, kx::TextView key)
+{
+    auto top = LevelBelow(node);
+    std::vector<TrailLevel*> levels = {top.get()}; // that the walk is in, the innermost last
+    kx::UpdateWalk walk(node, key);
+    while (walk.Next())
+    {
+        while (levels.back()->parent != walk.Element()->parent)
+        {
+            levels.pop_back();
+        }
+        TrailStep step = StepOf(walk);
+        if (!walk.IsRejected() && !step.keyEnds)
+        {
+            step.below = LevelBelow(walk.Element());
+        }
+        TrailLevel* const below = step.below.get();
+        levels.back()->steps.push_back(std::move(step));
+        if (below != nullptr)
+        {
+            levels.push_back(below);
         }
     }
+    return top;
+}
 
-private:
-    static TrailStep& Step() { return s_current->m_levels.back()->steps.back(); }
-
-    void Enter(const xmlNode* parent)
-    {
-        auto level = std::make_unique<TrailLevel>();
-        level->parent = parent;
-        TrailLevel* const entered = level.get();
-        (m_levels.empty() ? m_trail.top : Step().below) = std::move(level);
-        m_levels.push_back(entered);
-    }
-
-    void EndKey(const xmlNode* parent)
-    {
-        if (!m_levels.empty())
-        {
-            Step().keyEnds = true;
-            return;
-        }
-        m_trail.top = std::make_unique<TrailLevel>();
-        m_trail.top->parent = parent;
-        m_trail.top->keyEnds = true;
-    }
-
-    static Recorder* s_current;
-
-    Trail m_trail;
-    std::vector<TrailLevel*> m_levels; ///< that the walk is in, the innermost last
-};
-
-Recorder* Recorder::s_current = nullptr;
+std::unique_ptr<TrailLevel> KeyEnd(const xmlNode* node)
+{
+    auto level = LevelBelow(node);
+    level->keyEnds = true;
+    return level;
+}
 
 /** Keeps the recorded walk from logging: the library's own run writes the records. */
 class Muted
@@ -106,10 +152,19 @@ private:
     const unsigned int m_mask = g_LumLogParams.xmlConfigParserMask;
 };
 
-/** @return the part of @p key after the root's name. */
-kx::TextView RestOf(const std::string& key)
+/** Records @p walk, one of the two above, from the root of @p document on. */
+template <class Walk>
+Trail Record(const xmlDoc* document, const std::string& key, Walk walk)
 {
-    return kx::KeySplit(kx::TextView(key)).rest;
+    const Muted muted;
+    Trail trail;
+    if (StartsAtRoot(document, key))
+    {
+        const xmlNode* const root = xmlDocGetRootElement(document);
+        const kx::TextView rest = kx::KeySplit(kx::TextView(key)).Rest();
+        trail.top = rest.IsEmpty() ? KeyEnd(root) : walk(root, rest);
+    }
+    return trail;
 }
 
 void AddStepsWithText(const TrailLevel& level, std::vector<const TrailStep*>& found)
@@ -142,36 +197,20 @@ std::vector<const TrailStep*> Trail::StepsWithText() const
 bool StartsAtRoot(const xmlDoc* document, const std::string& key)
 {
     const kx::KeySplit split((kx::TextView(key)));
-    return split.hasRest && kx::SameText(xmlDocGetRootElement(document)->name, split.first);
+    return split.HasRest() && kx::SameText(xmlDocGetRootElement(document)->name, split.First());
 }
 
-Trail RecordLookup(xmlDoc* document, const std::string& key)
+Trail RecordLookup(const xmlDoc* document, const std::string& key)
 {
-    const Muted muted;
-    Recorder recorder;
-    if (StartsAtRoot(document, key))
-    {
-        std::string value;
-        unsigned int found = 0;
-        kx::AppendValues<Recorder>(xmlDocGetRootElement(document), RestOf(key), value, found);
-    }
-    return recorder.Take();
+    return Record(document, key, LookUp);
 }
 
-Trail RecordUpdate(xmlDoc* document, const std::string& key, const char* value)
+Trail RecordUpdate(const xmlDoc* document, const std::string& key)
 {
-    const Muted muted;
-    Recorder recorder;
-    if (StartsAtRoot(document, key))
-    {
-        unsigned int updated = 0;
-        kx::UpdateValues<Recorder>(xmlDocGetRootElement(document), RestOf(key), value, updated);
-    }
-    return recorder.Take();
+    return Record(document, key, Update);
 }
 
 bool Fulfils(const xmlNode* element, std::string_view condition)
 {
-    return kx::Condition(kx::TextView(condition.data(), condition.size()))
-        .Holds<kx::Silent>(const_cast<xmlNode*>(element));
+    return kx::Condition(kx::TextView(condition.data(), condition.size())).Admits(element);
 }

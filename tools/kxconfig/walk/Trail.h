@@ -9,7 +9,7 @@
 #include <string_view>
 #include <vector>
 
-// What a lookup or an update did, as recorded by an observer of the library's own walks.
+// What a lookup or an update does, recorded step by step along the library's own walks.
 
 /** A term of a condition, and whether the element's attribute fulfilled it. */
 struct TestedTerm
@@ -64,12 +64,12 @@ struct Trail
 bool StartsAtRoot(const xmlDoc* document, const std::string& key);
 
 /** What happens when @p key is looked up; no log records are written. */
-Trail RecordLookup(xmlDoc* document, const std::string& key);
+Trail RecordLookup(const xmlDoc* document, const std::string& key);
 
-/** What happens when the text under @p key is replaced: the document is changed. */
-Trail RecordUpdate(xmlDoc* document, const std::string& key, const char* value);
+/** What happens when the text under @p key is replaced; it is not. No log records are written. */
+Trail RecordUpdate(const xmlDoc* document, const std::string& key);
 
-/** @return whether @p element fulfils @p condition, as the library tells it. */
+/** @return whether @p element fulfills @p condition, by the library's own evaluation. */
 bool Fulfils(const xmlNode* element, std::string_view condition);
 
 #endif
