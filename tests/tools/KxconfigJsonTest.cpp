@@ -75,6 +75,7 @@ TEST_F(KxconfigJson, CheckGivesEachWarning)
     const json expected = {
         {"line", 3},
         {"kind", "ambiguous key"},
+        {"severity", "warning"},
         {"text", "\"cfg.net.ip\" matches 2 elements, the first of them /cfg/net[1]/ip (line 2)"}};
     EXPECT_THAT(answer.at("results"), testing::Contains(expected));
 
@@ -82,6 +83,7 @@ TEST_F(KxconfigJson, CheckGivesEachWarning)
     EXPECT_EQ(1, unfound.at("status"));
     const json noValue = {{"line", 3},
                           {"kind", "key without a value"},
+                          {"severity", "warning"},
                           {"text", "\"cfg.net@id=2.name\" has no value: it leads as far as "
                                    "/cfg/net[2]; kxconfig explain shows the reason"}};
     EXPECT_THAT(unfound.at("results"), testing::Contains(noValue));

@@ -24,7 +24,7 @@ protected:
                 {"set", file, "cfg.a", "x"},
                 {"explain", file, "cfg.a"},
                 {"explain", "--set", file, "cfg.a"},
-                {"check", file},
+                {"check", "--notes", file},
                 {"keys", file},
                 {"find", file, "//a"}};
     }

@@ -101,6 +101,7 @@ _kxconfig_offer_options()
         set) options+=(--drop-attributes --dry-run --output --wait) ;;
         keys) options+=(--all) ;;
         explain) options+=(--set) ;;
+        check) options+=(--notes --only --ignore --kinds) ;;
     esac
     _kxconfig_offer "${options[@]}"
 }

@@ -33,28 +33,39 @@ bool IsRoot(const xmlNode* element)
     return element == xmlDocGetRootElement(element->doc);
 }
 
-void CheckName(const xmlNode* element, Warnings& warnings)
+void CheckName(const xmlNode* element, Findings& findings)
 {
     if (!IsFreeOf(".", Text(element->name)))
     {
-        warnings.Warn(
-            element, "unreachable element",
-            warnings.LocationOf(element) +
+        findings.Add(
+            element, Kind::UnreachableElement,
+            findings.LocationOf(element) +
                 " cannot be named by a key: its name contains a \".\", which ends a segment");
     }
 }
 
-void CheckText(const xmlNode* element, Warnings& warnings)
+/** @return whether @p element has text of its own beside elements, as prose has. */
+bool IsMixed(const xmlNode* element)
+{
+    return kx::ElementFrom(element->children) != nullptr;
+}
+
+void CheckText(const xmlNode* element, Findings& findings)
 {
     const bool isValue = kx::OnlyTextChild(element) != nullptr;
-    const std::string text = isValue && !IsRoot(element) ? "" : OwnText(element);
+    const Kind kind = IsMixed(element) ? Kind::MixedContent : Kind::InvisibleValue;
+    if ((isValue && !IsRoot(element)) || !findings.Want(kind))
+    {
+        return;
+    }
+    const std::string text = OwnText(element);
     if (!text.empty())
     {
-        warnings.Warn(element, "invisible value",
-                      warnings.LocationOf(element) + " has no value although it contains " +
-                          QuotedStart(text) + ": " +
-                          (isValue ? "it is the root, and a key names elements below it"
-                                   : WhyNoValue(element)));
+        findings.Add(element, kind,
+                     findings.LocationOf(element) + " has no value although it contains " +
+                         QuotedStart(text) + ": " +
+                         (isValue ? "it is the root, and a key names elements below it"
+                                  : WhyNoValue(element)));
     }
 }
 
@@ -111,23 +122,40 @@ struct Repeat
     const Attributes* attributes;
 };
 
+/** The elements of a group that bear the same telling attributes. */
+using Bearers = std::map<Attributes, Group>;
+
+/** @return whether the attributes seem to identify elements, so that a repeat is a mistake: those
+ * that do repeat are no more than the elements that are told apart. */
+bool Identify(const Bearers& bearers)
+{
+    std::ptrdiff_t balance = 0;
+    for (const auto& [attributes, elements] : bearers)
+    {
+        const bool isUnique = elements.size() == 1;
+        balance += isUnique ? 1 : attributes.empty() ? 0 : -1;
+    }
+    return balance >= 0;
+}
+
 /** @param telling  what TellingAttributes() gives for @p group. */
 std::vector<Repeat> RepeatsIn(const Group& group, const std::vector<Attributes>& telling)
 {
+    Bearers bearers;
     std::vector<Repeat> repeats;
-    std::map<Attributes, const xmlNode*> bearers;
     for (size_t i = 0; i != group.size(); ++i)
     {
-        const auto bearer = bearers.emplace(telling[i], group[i]);
-        if (!bearer.second && !telling[i].empty())
+        Group& alike = bearers[telling[i]];
+        alike.push_back(group[i]);
+        if (alike.size() > 1 && !telling[i].empty())
         {
-            repeats.push_back({group[i], bearer.first->second, &telling[i]});
+            repeats.push_back({group[i], alike.front(), &telling[i]});
         }
     }
-    return repeats;
+    return Identify(bearers) ? repeats : std::vector<Repeat>();
 }
 
-void CheckGroup(const Group& group, const Levels& levels, Warnings& warnings)
+void CheckGroup(const Group& group, const Levels& levels, Findings& findings)
 {
     const std::vector<Attributes> telling = TellingAttributes(group, levels);
     const std::vector<Repeat> repeats = RepeatsIn(group, telling);
@@ -137,38 +165,60 @@ void CheckGroup(const Group& group, const Levels& levels, Warnings& warnings)
     }
     const Repeat& first = repeats.front();
     const size_t more = repeats.size() - 1;
-    warnings.Warn(
-        first.element, "repeated attribute",
-        warnings.LocationOf(first.element) + " has the same " + Listed(*first.attributes) + " as " +
-            warnings.Place(first.before) +
+    findings.Add(
+        first.element, Kind::RepeatedAttribute,
+        findings.LocationOf(first.element) + " has the same " + Listed(*first.attributes) + " as " +
+            findings.Place(first.before) +
             (more == 0 ? "" : "; " + std::to_string(more) + " more of that name repeat others"));
 }
 
-/** @return the children of @p parent that are elements, by their names. */
-std::map<std::string, Group> GroupsBelow(const xmlNode* parent)
+/** Checks elements from the innermost to the outermost. */
+class ElementChecker
 {
-    std::map<std::string, Group> groups;
-    for (const xmlNode* child = kx::ElementFrom(parent->children); child != nullptr;
-         child = kx::ElementFrom(child->next))
+public:
+    ElementChecker(const Levels& levels, Findings& findings)
+        : m_levels(levels), m_findings(findings)
     {
-        groups[Text(child->name)].push_back(child);
     }
-    return groups;
-}
+
+    /** @return whether @p element or one below it has a value. */
+    bool Check(const xmlNode* element)
+    {
+        CheckText(element, m_findings);
+        const bool hasValue = CheckBelow(element) || kx::OnlyTextChild(element) != nullptr;
+        if (hasValue)
+        {
+            CheckName(element, m_findings);
+        }
+        return hasValue;
+    }
+
+private:
+    bool CheckBelow(const xmlNode* parent)
+    {
+        std::map<std::string, Group> groups; // of elements with values, by their names
+        for (const xmlNode* child = kx::ElementFrom(parent->children); child != nullptr;
+             child = kx::ElementFrom(child->next))
+        {
+            if (Check(child))
+            {
+                groups[Text(child->name)].push_back(child);
+            }
+        }
+        for (const auto& [name, group] : groups)
+        {
+            CheckGroup(group, m_levels, m_findings);
+        }
+        return !groups.empty();
+    }
+
+    const Levels& m_levels;
+    Findings& m_findings;
+};
 
 } // namespace
 
-void CheckElements(const xmlNode* element, const Levels& levels, Warnings& warnings)
+void CheckElements(const xmlNode* root, const Levels& levels, Findings& findings)
 {
-    CheckName(element, warnings);
-    CheckText(element, warnings);
-    for (const auto& [name, group] : GroupsBelow(element))
-    {
-        CheckGroup(group, levels, warnings);
-    }
-    for (const xmlNode* child = kx::ElementFrom(element->children); child != nullptr;
-         child = kx::ElementFrom(child->next))
-    {
-        CheckElements(child, levels, warnings);
-    }
+    ElementChecker(levels, findings).Check(root);
 }

@@ -1,11 +1,11 @@
 #ifndef KX_TOOLS_CHECKELEMENTS_H
 #define KX_TOOLS_CHECKELEMENTS_H
 
-#include "checks/Warnings.h"
+#include "checks/Findings.h"
 #include "survey/Levels.h"
 
-/** Warns of what no lookup can see in @p element and below, and of what no condition can tell
- * apart. */
-void CheckElements(const xmlNode* element, const Levels& levels, Warnings& warnings);
+/** Checks @p root and all elements below it for text that no lookup finds, names that no key can
+ * contain, and attributes that no longer distinguish elements. */
+void CheckElements(const xmlNode* root, const Levels& levels, Findings& findings);
 
 #endif

@@ -5,51 +5,63 @@
 #include "survey/KeyList.h"
 #include "survey/KeyValues.h"
 #include "walk/Trail.h"
+#include "walk/UpdateReach.h"
 
 #include "config/KeyPath.h"
+
+#include <algorithm>
+#include <iterator>
+#include <unordered_set>
 
 namespace
 {
 
 // Keys: what a lookup finds, and what it would find if the elements stood in another order.
 
-void CheckMatches(const Elements& found, const std::string& key, Warnings& warnings)
+std::string Counted(size_t count)
 {
-    if (found.size() > 1)
+    return std::to_string(count) + (count == 1 ? " element" : " elements");
+}
+
+void CheckMatches(const Elements& found, const std::string& key, Kind kind, Findings& findings)
+{
+    if (found.size() > 1 && findings.Want(kind))
     {
-        warnings.Warn(found[1], "ambiguous key",
-                      Quoted(key) + " matches " + std::to_string(found.size()) +
-                          " elements, the first of them " + warnings.Place(found[0]));
+        findings.Add(found[1], kind,
+                     Quoted(key) + " matches " + Counted(found.size()) + ", the first of them " +
+                         findings.Place(found[0]));
     }
 }
 
 /** @param segment  has a condition, and is what the children of @p parent are compared with. */
 void CheckOrder(const Order& order, const xmlNode* parent, const std::string& segment,
-                Warnings& warnings)
+                Findings& findings)
 {
     const std::string name = Text(kx::Segment(kx::TextView(segment)).name);
     if (order.taken != nullptr)
     {
-        if (warnings.IsNew("suspended condition", parent, name))
+        if (findings.Want(Kind::SuspendedCondition) &&
+            findings.IsNew(Kind::SuspendedCondition, parent, name))
         {
-            warnings.Warn(
-                order.taken, "suspended condition",
-                warnings.LocationOf(order.taken) + " is accepted for " + Quoted(segment) +
-                    " although it does not fulfill it: " + warnings.Place(order.suspender) +
+            findings.Add(
+                order.taken, Kind::SuspendedCondition,
+                findings.LocationOf(order.taken) + " is accepted for " + Quoted(segment) +
+                    " although it does not fulfill it: " + findings.Place(order.suspender) +
                     ", a preceding element of another name, suspends the condition");
         }
     }
     else if (order.other != nullptr && order.rejected != nullptr &&
-             warnings.IsNew("condition depends on order", parent, name))
+             findings.Want(Kind::ConditionDependsOnOrder) &&
+             findings.IsNew(Kind::ConditionDependsOnOrder, parent, name))
     {
-        warnings.Warn(order.rejected, "condition depends on order",
-                      warnings.LocationOf(order.rejected) + " would be accepted for " +
-                          Quoted(segment) + " if " + warnings.Place(order.other) +
-                          ", which has another name, preceded it directly");
+        findings.Add(order.rejected, Kind::ConditionDependsOnOrder,
+                     findings.LocationOf(order.rejected) + " would be accepted for " +
+                         Quoted(segment) + " if " + findings.Place(order.other) +
+                         ", which has another name, preceded it directly");
     }
 }
 
-// A key that somebody gives can hold anything: what is told of it comes from the library's walk.
+// A given key can contain anything: what is reported of it comes from the library's walk.
 
 Order OrderOf(const TrailLevel& level)
 {
@@ -71,19 +83,19 @@ Order OrderOf(const TrailLevel& level)
     return order;
 }
 
-void CheckOrders(const TrailLevel& level, Warnings& warnings)
+void CheckOrders(const TrailLevel& level, Findings& findings)
 {
     if (!level.steps.empty() && !level.steps.front().condition.empty())
     {
         const TrailStep& first = level.steps.front();
         const std::string segment = Text(first.name) + "@" + Text(first.condition);
-        CheckOrder(OrderOf(level), level.parent, segment, warnings);
+        CheckOrder(OrderOf(level), level.parent, segment, findings);
     }
     for (const TrailStep& step : level.steps)
     {
         if (step.below != nullptr)
         {
-            CheckOrders(*step.below, warnings);
+            CheckOrders(*step.below, findings);
         }
     }
 }
@@ -114,29 +126,56 @@ Accepted DeepestAccepted(const TrailLevel& level, const Accepted& above)
 
 /** @return why a lookup of @p key gives nothing, if @p end is as far as it leads. */
 std::string WhyNoValueUnder(const std::string& key, const xmlNode* root, const xmlNode* end,
-                            Warnings& warnings)
+                            Findings& findings)
 {
     if (!StartsAtRoot(root->doc, key))
     {
         return "it starts with " + Quoted(Text(kx::KeySplit(kx::TextView(key)).First())) +
                ", but the root element is " + Quoted(Text(root->name));
     }
-    return "it leads as far as " + warnings.LocationOf(end) + "; kxconfig explain shows the reason";
+    return "it leads as far as " + findings.LocationOf(end) + "; kxconfig explain shows the reason";
 }
 
-void WarnOfNoValue(const Trail& trail, xmlDoc* document, const std::string& key, Warnings& warnings)
+void AddNoValue(const Trail& trail, const xmlDoc* document, const std::string& key,
+                Findings& findings)
 {
     const Accepted root = {xmlDocGetRootElement(document), 0};
     const xmlNode* const end =
         trail.top == nullptr ? root.element : DeepestAccepted(*trail.top, root).element;
-    warnings.Warn(end, "key without a value",
-                  Quoted(key) +
-                      " has no value: " + WhyNoValueUnder(key, root.element, end, warnings));
+    findings.Add(end, Kind::KeyWithoutValue,
+                 Quoted(key) +
+                     " has no value: " + WhyNoValueUnder(key, root.element, end, findings));
 }
 
-} // namespace
+/** @return those of @p elements that are not in @p others. */
+Elements Without(const Elements& others, const Elements& elements)
+{
+    const std::unordered_set<const xmlNode*> excluded(others.begin(), others.end());
+    Elements rest;
+    std::copy_if(elements.begin(), elements.end(), std::back_inserter(rest),
+                 [&](const xmlNode* element) { return excluded.count(element) == 0; });
+    return rest;
+}
 
-void CheckLookup(xmlDoc* document, const std::string& key, Warnings& warnings)
+void CheckUpdate(const Elements& updated, const Elements& found, const std::string& key,
+                 Findings& findings)
+{
+    const auto add = [&](const Elements& elements, Kind kind, const std::string& what)
+    {
+        if (!elements.empty())
+        {
+            findings.Add(elements[0], kind,
+                         "an update of " + Quoted(key) + what + Counted(elements.size()) +
+                             (elements.size() == 1 ? ": " : ", the first of them ") +
+                             findings.Place(elements[0]));
+        }
+    };
+    add(Without(found, updated), Kind::WiderUpdate, " changes, beyond what a lookup finds, ");
+    add(Without(updated, found), Kind::NarrowerUpdate, " leaves, of what a lookup finds, ");
+}
+
+/** @return the elements that a lookup of @p key finds. */
+Elements CheckLookup(const xmlDoc* document, const std::string& key, Findings& findings)
 {
     const Trail trail = RecordLookup(document, key);
     Elements found;
@@ -146,26 +185,43 @@ void CheckLookup(xmlDoc* document, const std::string& key, Warnings& warnings)
     }
     if (found.empty())
     {
-        WarnOfNoValue(trail, document, key, warnings);
+        AddNoValue(trail, document, key, findings);
     }
-    CheckMatches(found, key, warnings);
+    CheckMatches(found, key, Kind::AmbiguousKey, findings);
     if (trail.top != nullptr)
     {
-        CheckOrders(*trail.top, warnings);
+        CheckOrders(*trail.top, findings);
     }
+    return found;
 }
 
-void CheckListedKeys(const xmlNode* root, Levels& levels, Warnings& warnings)
+} // namespace
+
+std::vector<Reach> CheckGivenKeys(const xmlDoc* document, const std::vector<std::string>& keys,
+                                  Findings& findings)
+{
+    std::vector<Reach> reaches;
+    for (const std::string& key : keys)
+    {
+        const Elements found = CheckLookup(document, key, findings);
+        const Elements updated = ElementsOfUpdate(document, key);
+        CheckUpdate(updated, found, key, findings);
+        reaches.push_back({key, found.size(), updated.size()});
+    }
+    return reaches;
+}
+
+void CheckListedKeys(const xmlNode* root, Levels& levels, Findings& findings)
 {
     KeyValues values(root, levels);
     for (const std::string& key : ListKeys(root, levels))
     {
-        CheckMatches(values.BearersUnder(key), key, warnings);
+        CheckMatches(values.BearersUnder(key), key, Kind::SeveralValues, findings);
         for (const auto& [parent, segment] : values.NewComparisons())
         {
             if (!IsFreeOf("@", segment))
             {
-                CheckOrder(levels.Below(parent).OrderFor(segment), parent, segment, warnings);
+                CheckOrder(levels.Below(parent).OrderFor(segment), parent, segment, findings);
             }
         }
     }

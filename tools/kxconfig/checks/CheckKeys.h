@@ -1,15 +1,26 @@
 #ifndef KX_TOOLS_CHECKKEYS_H
 #define KX_TOOLS_CHECKKEYS_H
 
-#include "checks/Warnings.h"
+#include "checks/Findings.h"
 #include "survey/Levels.h"
 
 #include <string>
+#include <vector>
 
-/** Warns of what surprises in a lookup of @p key: no value, several, or a matter of order. */
-void CheckLookup(xmlDoc* document, const std::string& key, Warnings& warnings);
+/** How many elements a key reaches. */
+struct Reach
+{
+    std::string key;
+    size_t lookup; ///< elements that a lookup finds
+    size_t update; ///< elements that an update changes
+};
 
-/** The same for all keys that can be listed, which are too many to walk for each. */
-void CheckListedKeys(const xmlNode* root, Levels& levels, Warnings& warnings);
+/** Checks lookups and updates of @p keys: no value, several, other elements in an update than in a
+ * lookup, suspended conditions. */
+std::vector<Reach> CheckGivenKeys(const xmlDoc* document, const std::vector<std::string>& keys,
+                                  Findings& findings);
+
+/** Checks lookups of all keys that can be listed, which are too many to walk for each. */
+void CheckListedKeys(const xmlNode* root, Levels& levels, Findings& findings);
 
 #endif

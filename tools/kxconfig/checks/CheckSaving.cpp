@@ -2,10 +2,10 @@
 
 #include "file/RoundTrip.h"
 
-void CheckSaving(CXMLReader& reader, const std::string& file, Warnings& warnings)
+void CheckSaving(CXMLReader& reader, const std::string& file, Findings& findings)
 {
     for (const Difference& difference : WhatSavingChanges(reader, file))
     {
-        warnings.Warn(difference.line, "changed by saving", "saving changes " + difference.what);
+        findings.Add(difference.line, Kind::ChangedBySaving, "saving changes " + difference.what);
     }
 }

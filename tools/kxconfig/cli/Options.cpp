@@ -87,10 +87,43 @@ void AddExplain(CLI::App& app, Request& request)
                       "explain what an update would reach; changes nothing");
 }
 
+std::string KindError(const std::string& name)
+{
+    return KindNamed(name) ? std::string()
+                           : "\"" + name + "\" is not a kind; kxconfig check --kinds lists them";
+}
+
+/** An option that takes one kind and can be repeated. */
+void AddKinds(CLI::App& command, const char* name, std::set<Kind>& kinds, const char* description)
+{
+    command
+        .add_option_function<std::vector<std::string>>(
+            name,
+            [&kinds](const std::vector<std::string>& names)
+            {
+                for (const std::string& kind : names)
+                {
+                    kinds.insert(*KindNamed(kind));
+                }
+            },
+            description)
+        ->expected(1)
+        ->take_all()
+        ->allow_extra_args(false)
+        ->type_name("KIND")
+        ->check(CLI::Validator(KindError, ""));
+}
+
 void AddCheck(CLI::App& app, Request& request)
 {
-    AddCommand(app, "check", "report pitfalls for lookups", Check, request.check, request)
-        ->add_option("KEY", request.check.keys, "key paths to check instead of the file's own");
+    Selection& selection = request.check.selection;
+    CLI::App* const check = AddCommand(app, "check", "report pitfalls for lookups and updates",
+                                       Check, request.check, request);
+    check->add_option("KEY", request.check.keys, "key paths to check instead of the whole file");
+    check->add_flag("--notes", selection.notes, "also print notes, which are not warnings");
+    AddKinds(*check, "--only", selection.only, "print this kind only, be it a warning or a note");
+    AddKinds(*check, "--ignore", selection.ignored, "do not print this kind");
+    check->set_version_flag("--kinds", KindList(), "list the kinds of warnings and notes");
 }
 
 void AddKeys(CLI::App& app, Request& request)

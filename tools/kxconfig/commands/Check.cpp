@@ -13,39 +13,77 @@
 namespace
 {
 
-struct WarningOfFile
+struct FindingInFile
 {
     const std::string& file;
-    const Warning& warning;
+    const Finding& finding;
 
     std::string Line() const
     {
-        return OnOneLine(file + ":" + std::to_string(warning.line) + ": " + warning.text);
+        return OnOneLine(file + ":" + std::to_string(finding.line) + ": " + SeverityName() + ": " +
+                         finding.text + " [" + WordOf(finding.kind) + "]");
     }
 
     Json InJson() const
     {
-        return {{"line", warning.line}, {"kind", warning.kind}, {"text", warning.text}};
+        return {{"line", finding.line},
+                {"kind", MeaningOf(finding.kind).name},
+                {"severity", SeverityName()},
+                {"text", finding.text}};
+    }
+
+private:
+    const char* SeverityName() const { return NameOf(MeaningOf(finding.kind).severity); }
+};
+
+struct ReachInFile
+{
+    const std::string& file;
+    const Reach& reach;
+
+    std::string Line() const
+    {
+        return OnOneLine(file + ": " + Quoted(reach.key) + ": lookup " +
+                         std::to_string(reach.lookup) + ", update " + std::to_string(reach.update));
+    }
+
+    Json InJson() const
+    {
+        return {{"key", reach.key}, {"lookup", reach.lookup}, {"update", reach.update}};
     }
 };
 
-/** @return what is found in the document of @p reader. */
-Warnings Examine(CXMLReader& reader, const CheckArguments& arguments)
+void CheckKeys(CXMLReader& reader, const CheckArguments& arguments, Findings& findings,
+               Report& report)
+{
+    for (const Reach& reach : CheckGivenKeys(DocumentOf(reader), arguments.keys, findings))
+    {
+        report.Add(ReachInFile{arguments.file, reach});
+    }
+}
+
+void CheckFile(CXMLReader& reader, const std::string& file, Findings& findings)
 {
     const xmlNode* const root = RootOf(reader);
     Levels levels(root->doc);
-    Warnings warnings;
-    for (const std::string& key : arguments.keys)
+    CheckListedKeys(root, levels, findings);
+    CheckElements(root, levels, findings);
+    if (findings.Want(Kind::ChangedBySaving))
     {
-        CheckLookup(root->doc, key, warnings);
+        CheckSaving(reader, file, findings);
     }
-    if (arguments.keys.empty())
+}
+
+/** @return whether one of @p findings is a warning. */
+bool AddFindings(const Findings& findings, const std::string& file, Report& report)
+{
+    bool hasWarning = false;
+    for (const auto& [line, finding] : findings.ByLine())
     {
-        CheckListedKeys(root, levels, warnings);
+        report.Add(FindingInFile{file, finding});
+        hasWarning = hasWarning || MeaningOf(finding.kind).severity == Severity::Warning;
     }
-    CheckElements(root, levels, warnings);
-    CheckSaving(reader, arguments.file, warnings);
-    return warnings;
+    return hasWarning;
 }
 
 } // namespace
@@ -57,10 +95,15 @@ ExitStatus Check(const CheckArguments& arguments, Report& report)
     {
         RequireWellFormedKey(key);
     }
-    const Warnings warnings = Examine(*reader, arguments);
-    for (const auto& [line, warning] : warnings.ByLine())
+    Findings findings(arguments.selection);
+    if (arguments.keys.empty())
     {
-        report.Add(WarningOfFile{arguments.file, warning});
+        CheckFile(*reader, arguments.file, findings);
     }
-    return warnings.ByLine().empty() ? ExitStatus::Done : ExitStatus::NothingFound;
+    else
+    {
+        CheckKeys(*reader, arguments, findings, report);
+    }
+    return AddFindings(findings, arguments.file, report) ? ExitStatus::NothingFound
+                                                         : ExitStatus::Done;
 }

@@ -1,6 +1,7 @@
 #ifndef KX_TOOLS_CHECK_H
 #define KX_TOOLS_CHECK_H
 
+#include "checks/Kinds.h"
 #include "output/ExitStatus.h"
 
 #include <string>
@@ -11,10 +12,11 @@ class Report;
 struct CheckArguments
 {
     std::string file;
-    std::vector<std::string> keys; ///< empty: those that the file itself suggests
+    std::vector<std::string> keys; ///< if empty, the whole file is checked
+    Selection selection;
 };
 
-/** kxconfig check: reports pitfalls for lookups. */
+/** kxconfig check: reports pitfalls for lookups and updates. */
 ExitStatus Check(const CheckArguments& arguments, Report& report);
 
 #endif

@@ -1,6 +1,7 @@
 #include "walk/Trail.h"
 
-#include "KxLog.h"
+#include "walk/Muted.h"
+
 #include "config/SiblingScan.h"
 #include "config/UpdateWalk.h"
 
@@ -138,19 +139,6 @@ std::unique_ptr<TrailLevel> KeyEnd(const xmlNode* node)
     level->keyEnds = true;
     return level;
 }
-
-/** Keeps the recorded walk from logging: the library's own run writes the records. */
-class Muted
-{
-public:
-    Muted() { g_LumLogParams.xmlConfigParserMask = 0; }
-    ~Muted() { g_LumLogParams.xmlConfigParserMask = m_mask; }
-    Muted(const Muted&) = delete;
-    Muted& operator=(const Muted&) = delete;
-
-private:
-    const unsigned int m_mask = g_LumLogParams.xmlConfigParserMask;
-};
 
 /** Records @p walk, one of the two above, from the root of @p document on. */
 template <class Walk>

@@ -1,0 +1,26 @@
+#include "walk/UpdateReach.h"
+
+#include "walk/Muted.h"
+#include "walk/Trail.h"
+
+#include "config/UpdateWalk.h"
+
+std::vector<const xmlNode*> ElementsOfUpdate(const xmlDoc* document, const std::string& key)
+{
+    const Muted muted;
+    std::vector<const xmlNode*> elements;
+    const kx::TextView rest = kx::KeySplit(kx::TextView(key)).Rest();
+    if (!StartsAtRoot(document, key) || rest.IsEmpty())
+    {
+        return elements;
+    }
+    kx::UpdateWalk walk(xmlDocGetRootElement(document), rest);
+    while (walk.Next())
+    {
+        if (walk.IsSelected() && kx::OnlyTextChild(walk.Element()) != nullptr)
+        {
+            elements.push_back(walk.Element());
+        }
+    }
+    return elements;
+}
