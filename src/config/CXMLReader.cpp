@@ -24,7 +24,7 @@ int FindValues(xmlDoc* document, TextView key, std::string& value)
     const xmlNode* const root = xmlDocGetRootElement(document);
     if (root == 0)
     {
-        KX_ERROR_AS("GetValue", "Root Node ptr is NULL");
+        KX_LOG(LogLevelError, "GetValue", "Root Node ptr is NULL");
         return StatusMissing;
     }
     const KeySplit split(key);
@@ -50,7 +50,7 @@ CXMLReader::CXMLReader() : m_pXmlDoc(0)
 
 CXMLReader::CXMLReader(const std::string& path) : m_pXmlDoc(0)
 {
-    KX_TRACE_OF("File Path %s", path.c_str());
+    KX_LOG_OF(LogLevelTrace, __FUNCTION__, "File Path %s", path.c_str());
     m_pXmlDoc = xmlParseFile(path.c_str());
     if (m_pXmlDoc == 0)
     {
@@ -60,7 +60,7 @@ CXMLReader::CXMLReader(const std::string& path) : m_pXmlDoc(0)
 
 CXMLReader::~CXMLReader()
 {
-    KX_TRACE("Destructor");
+    KX_LOG(LogLevelTrace, __FUNCTION__, "Destructor");
     if (m_pXmlDoc != 0)
     {
         xmlFreeDoc(m_pXmlDoc);
@@ -70,7 +70,7 @@ CXMLReader::~CXMLReader()
 
 int CXMLReader::ParseFile(const std::string& path)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     int status = StatusOk;
     // The document held so far is overwritten and not freed: clients may still work on it.
     m_pXmlDoc = xmlParseFile(path.c_str());
@@ -79,13 +79,13 @@ int CXMLReader::ParseFile(const std::string& path)
         KX_ERROR("Pointer to document structure is NULL");
         status = StatusMissing;
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return status;
 }
 
 std::string CXMLReader::GetValue(const std::string& key)
 {
-    KX_TRACE_OF("Key %s", key.c_str());
+    KX_LOG_OF(LogLevelTrace, __FUNCTION__, "Key %s", key.c_str());
     std::string result;
     if (m_pXmlDoc == 0 || key.empty())
     {
@@ -98,7 +98,7 @@ std::string CXMLReader::GetValue(const std::string& key)
     {
         CollectValues(root, split.Rest(), result);
     }
-    KX_VALUE_OF("Parsed Value :: %s", result.c_str());
+    KX_VALUE("Parsed Value :: %s", result.c_str());
     return result;
 }
 
@@ -109,19 +109,19 @@ int CXMLReader::GetValue(const std::string& key, std::string& value)
         // The lookup works on the key's own bytes, which must not be those that it appends to.
         return CXMLReader::GetValue(std::string(key), value);
     }
-    KX_TRACE("+");
+    KX_ENTER();
     if (m_pXmlDoc == 0 || key.empty())
     {
         KX_ERROR("Document structure pointer m_pXmlDoc is NULL");
-        KX_TRACE("-");
+        KX_LEAVE();
         return StatusMissing;
     }
-    KX_VALUE_OF("Key is %s", key.c_str());
+    KX_VALUE("Key is %s", key.c_str());
     const int status = FindValues(m_pXmlDoc, TextView(key), value);
     KX_LOG_EITHER(LogLevelValue, LogLevelTrace)
     {
-        KX_VALUE_OF("Parsed Value :: %s", value.c_str());
-        KX_TRACE("-");
+        KX_VALUE("Parsed Value :: %s", value.c_str());
+        KX_LEAVE();
     }
     return status;
 }

@@ -13,12 +13,12 @@ using namespace kx;
 
 CXMLWriter::CXMLWriter() : m_pXmlDoc(0)
 {
-    KX_TRACE("+");
+    KX_ENTER();
 }
 
 CXMLWriter::CXMLWriter(const std::string& path) : m_pXmlDoc(0), m_strXmlFile(path)
 {
-    KX_TRACE_OF("File Path %s", path.c_str());
+    KX_LOG_OF(LogLevelTrace, __FUNCTION__, "File Path %s", path.c_str());
     m_pXmlDoc = xmlParseFile(m_strXmlFile.c_str());
     if (m_pXmlDoc == 0)
     {
@@ -28,7 +28,7 @@ CXMLWriter::CXMLWriter(const std::string& path) : m_pXmlDoc(0), m_strXmlFile(pat
 
 CXMLWriter::~CXMLWriter()
 {
-    KX_TRACE("Destructor");
+    KX_LOG(LogLevelTrace, __FUNCTION__, "Destructor");
     if (m_pXmlDoc != 0)
     {
         xmlFreeDoc(m_pXmlDoc);
@@ -38,7 +38,7 @@ CXMLWriter::~CXMLWriter()
 
 int CXMLWriter::ParseFile(const std::string& path)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     int status = SetPath(path);
     if (m_pXmlDoc != 0)
     {
@@ -51,13 +51,13 @@ int CXMLWriter::ParseFile(const std::string& path)
         status = StatusMissing;
         KX_ERROR("Pointer to document structure is NULL");
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return status;
 }
 
 int CXMLWriter::SetValue(const std::string& key, std::string value)
 {
-    KX_TRACE_OF("Key %s", key.c_str());
+    KX_LOG_OF(LogLevelTrace, __FUNCTION__, "Key %s", key.c_str());
     if (m_pXmlDoc == 0 || key.empty())
     {
         KX_ERROR("Document structure pointer m_pXmlDoc is NULL");
@@ -85,7 +85,7 @@ int CXMLWriter::SetValue(const std::string& key, std::string value)
 
 int CXMLWriter::SaveData()
 {
-    KX_TRACE("+");
+    KX_ENTER();
     // Engines before 2.13 answer a failure with -1, later ones with other negative numbers.
     const int written = xmlSaveFileEnc(m_strXmlFile.c_str(), m_pXmlDoc, "UTF-8");
     return written < 0 ? StatusNotFound : StatusOk;

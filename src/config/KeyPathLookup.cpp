@@ -63,14 +63,14 @@ int AppendValues(const xmlNode* node, TextView key, std::string& value, unsigned
     const char* const tag = "XMLGetValue";
     if (node == 0 || key.IsEmpty())
     {
-        KX_TRACE_AS(tag, "+");
-        KX_TRACE_AS(tag, "-");
+        KX_LOG(LogLevelTrace, tag, "+");
+        KX_LOG(LogLevelTrace, tag, "-");
         return StatusMissing;
     }
     KX_LOG_EITHER(LogLevelTrace, LogLevelValue)
     {
-        KX_TRACE_AS(tag, "+");
-        KX_VALUE_AS(tag, "Key :: %s", key.data);
+        KX_LOG(LogLevelTrace, tag, "+");
+        KX_LOG_OF(LogLevelValue, tag, "Key :: %s", key.data);
     }
     int status = StatusNotFound;
     const KeySplit split(key);
@@ -92,7 +92,7 @@ int AppendValues(const xmlNode* node, TextView key, std::string& value, unsigned
             status = AppendValues(scan.Element(), split.Rest(), value, found);
         }
     }
-    KX_TRACE_AS(tag, "-");
+    KX_LOG(LogLevelTrace, tag, "-");
     return status;
 }
 

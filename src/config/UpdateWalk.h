@@ -69,7 +69,10 @@ private:
     UpdateWalk(const UpdateWalk&);
     UpdateWalk& operator=(const UpdateWalk&);
 
-    static void LogKey(TextView key) { KX_VALUE_AS("XMLSetValue", "Key :: %s", key.data); }
+    static void LogKey(TextView key)
+    {
+        KX_LOG_OF(LogLevelValue, "XMLSetValue", "Key :: %s", key.data);
+    }
 
     bool StandOn(xmlNode* element)
     {

@@ -11,13 +11,12 @@
  * costs a load, a test and a branch that is not taken, and evaluates no argument. Each gate reads
  * the word again, because the platform can change it at any time.
  *
- * The tag of a record is the bare name of the operation. A gate uses the name of the function that
- * contains it; the _AS form takes the tag as an argument, for functions that work on behalf of an
- * operation. The _OF form takes the single argument of its format.
+ * The tag of a record is the bare name of the operation: that of the function that contains the
+ * gate. Functions that work on behalf of an operation use KX_LOG and KX_LOG_OF with its name.
  *
- * An operation that traces begins with KX_TRACE("+") and ends with KX_TRACE("-") on each return
- * path. No destructor logs the "-": it is missing after an exception, and it precedes the
- * destruction of the operation's locals.
+ * An operation that traces begins with KX_ENTER() and ends with KX_LEAVE() on each return path. No
+ * destructor logs the "-": it is missing after an exception, and it precedes the destruction of
+ * the operation's locals.
  *
  * Text from outside (a key, a path, a value) is always an argument, never the format.
  */
@@ -99,23 +98,18 @@ __attribute__((noinline)) inline void LogEntryAndReturn(int line, const char* ta
 
 } // namespace kx
 
-/** Logs @p text. It and @p level are constants, so that only one of the calls is compiled. */
-#define KX_LOG_TEXT(level, tag, text)                                                              \
-    ((level) != kx::LogLevelTrace       ? static_cast<void>(KxLog(__LINE__, level, tag, text))     \
-     : __builtin_strcmp(text, "+") == 0 ? kx::LogEntry(__LINE__, tag)                              \
-     : __builtin_strcmp(text, "-") == 0 ? kx::LogReturn(__LINE__, tag)                             \
-                                        : static_cast<void>(KxLog(__LINE__, level, tag, text)))
-
-#define KX_LOG_RECORD(level, tag, text)                                                            \
+/** One record. @p text and @p format are literals; @p tag is the operation's name. */
+#define KX_LOG(level, tag, text)                                                                   \
     do                                                                                             \
     {                                                                                              \
         if (kx::LogEnabled(level))                                                                 \
         {                                                                                          \
-            KX_LOG_TEXT(level, tag, text);                                                         \
+            KxLog(__LINE__, level, tag, text);                                                     \
         }                                                                                          \
     } while (false)
 
-#define KX_LOG_RECORD_OF(level, tag, format, argument)                                             \
+/** One record, with the single argument of its format. */
+#define KX_LOG_OF(level, tag, format, argument)                                                    \
     do                                                                                             \
     {                                                                                              \
         if (kx::LogEnabled(level))                                                                 \
@@ -127,32 +121,29 @@ __attribute__((noinline)) inline void LogEntryAndReturn(int line, const char* ta
 /** Precedes a block of gates of two levels: with both bits clear the block costs one test. */
 #define KX_LOG_EITHER(one, other) if (kx::LogEnabled(one, other))
 
+/** "+": the operation begins. */
+#define KX_ENTER() KX_TRACE_BY(LogEntry)
+
+/** "-": the operation returns. */
+#define KX_LEAVE() KX_TRACE_BY(LogReturn)
+
 /** "+" and "-" of an operation without visible work in between: one test for both. */
-#define KX_TRACE_BOTH()                                                                            \
+#define KX_ENTER_AND_LEAVE() KX_TRACE_BY(LogEntryAndReturn)
+
+#define KX_TRACE_BY(function)                                                                      \
     do                                                                                             \
     {                                                                                              \
         if (kx::LogEnabled(kx::LogLevelTrace))                                                     \
         {                                                                                          \
-            kx::LogEntryAndReturn(__LINE__, __FUNCTION__);                                         \
+            kx::function(__LINE__, __FUNCTION__);                                                  \
         }                                                                                          \
     } while (false)
 
-#define KX_TRACE(text) KX_LOG_RECORD(kx::LogLevelTrace, __FUNCTION__, text)
-#define KX_TRACE_AS(tag, text) KX_LOG_RECORD(kx::LogLevelTrace, tag, text)
-#define KX_TRACE_OF(format, argument)                                                              \
-    KX_LOG_RECORD_OF(kx::LogLevelTrace, __FUNCTION__, format, argument)
-#define KX_ERROR(text) KX_LOG_RECORD(kx::LogLevelError, __FUNCTION__, text)
-#define KX_ERROR_AS(tag, text) KX_LOG_RECORD(kx::LogLevelError, tag, text)
-#define KX_ERROR_OF(format, argument)                                                              \
-    KX_LOG_RECORD_OF(kx::LogLevelError, __FUNCTION__, format, argument)
-#define KX_WARNING(text) KX_LOG_RECORD(kx::LogLevelWarning, __FUNCTION__, text)
-#define KX_VALUE_OF(format, argument)                                                              \
-    KX_LOG_RECORD_OF(kx::LogLevelValue, __FUNCTION__, format, argument)
-#define KX_VALUE_AS(tag, format, argument)                                                         \
-    KX_LOG_RECORD_OF(kx::LogLevelValue, tag, format, argument)
-#define KX_XPATH(text) KX_LOG_RECORD(kx::LogLevelXPath, __FUNCTION__, text)
-#define KX_XPATH_AS(tag, text) KX_LOG_RECORD(kx::LogLevelXPath, tag, text)
-#define KX_XPATH_OF(format, argument)                                                              \
-    KX_LOG_RECORD_OF(kx::LogLevelXPath, __FUNCTION__, format, argument)
+/** The operation cannot do its work. */
+#define KX_ERROR(text) KX_LOG(kx::LogLevelError, __FUNCTION__, text)
+#define KX_ERROR_OF(format, argument) KX_LOG_OF(kx::LogLevelError, __FUNCTION__, format, argument)
+
+/** A key that was requested, or a value that was found. */
+#define KX_VALUE(format, argument) KX_LOG_OF(kx::LogLevelValue, __FUNCTION__, format, argument)
 
 #endif

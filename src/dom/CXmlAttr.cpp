@@ -4,15 +4,15 @@
 
 CXmlAttr::CXmlAttr()
 {
-    KX_TRACE_BOTH();
+    KX_ENTER_AND_LEAVE();
 }
 
 CXmlAttr::CXmlAttr(std::string name, std::string value) : m_strName(name), m_strValue(value)
 {
-    KX_TRACE_BOTH();
+    KX_ENTER_AND_LEAVE();
 }
 
 CXmlAttr::~CXmlAttr()
 {
-    KX_TRACE_BOTH();
+    KX_ENTER_AND_LEAVE();
 }

@@ -100,7 +100,7 @@ CXmlNode kx::LeaveWithHandle(const char* tag, xmlNode* node)
 {
     CXmlNode handle;
     SetIfFound(handle, node);
-    KX_TRACE_AS(tag, "-");
+    KX_LOG(LogLevelTrace, tag, "-");
     return handle;
 }
 
@@ -108,42 +108,42 @@ CXmlNode kx::LeaveWithHandle(const char* tag, xmlNode* node)
 
 CXmlNode::CXmlNode() : m_pXmlNode(0)
 {
-    KX_TRACE_BOTH();
+    KX_ENTER_AND_LEAVE();
 }
 
 CXmlNode::CXmlNode(xmlNode* node) : m_pXmlNode(node)
 {
-    KX_TRACE_BOTH();
+    KX_ENTER_AND_LEAVE();
 }
 
 CXmlNode::~CXmlNode()
 {
-    KX_TRACE_BOTH();
+    KX_ENTER_AND_LEAVE();
 }
 
 void CXmlNode::SetXmlNodePtr(xmlNode* node)
 {
-    KX_TRACE_BOTH();
+    KX_ENTER_AND_LEAVE();
     m_pXmlNode = node;
 }
 
 bool CXmlNode::IsNull()
 {
-    KX_TRACE_BOTH();
+    KX_ENTER_AND_LEAVE();
     return m_pXmlNode == 0;
 }
 
 int CXmlNode::Type()
 {
-    KX_TRACE_BOTH();
+    KX_ENTER_AND_LEAVE();
     return TypeOf(m_pXmlNode);
 }
 
 std::string CXmlNode::Name()
 {
-    KX_TRACE("+");
+    KX_ENTER();
     std::string name(FromEngine(NameOf(m_pXmlNode)));
-    KX_TRACE("-");
+    KX_LEAVE();
     return name;
 }
 
@@ -151,33 +151,33 @@ std::string CXmlNode::Name()
 
 CXmlNode CXmlNode::Parent()
 {
-    KX_TRACE("+");
+    KX_ENTER();
     xmlNode* const parent = LinkOf(m_pXmlNode, &xmlNode::parent);
     return LeaveWithHandle(__FUNCTION__, IsElement(parent) ? parent : 0);
 }
 
 CXmlNode CXmlNode::FirstChild()
 {
-    KX_TRACE("+");
+    KX_ENTER();
     return LeaveWithHandle(__FUNCTION__, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::children)));
 }
 
 CXmlNode CXmlNode::LastChild()
 {
-    KX_TRACE("+");
+    KX_ENTER();
     return LeaveWithHandle(__FUNCTION__,
                            ElementFrom(LinkOf(m_pXmlNode, &xmlNode::last), &xmlNode::prev));
 }
 
 CXmlNode CXmlNode::NextSibling()
 {
-    KX_TRACE("+");
+    KX_ENTER();
     return LeaveWithHandle(__FUNCTION__, ElementFrom(LinkOf(m_pXmlNode, &xmlNode::next)));
 }
 
 CXmlNode CXmlNode::PrevSibling()
 {
-    KX_TRACE("+");
+    KX_ENTER();
     return LeaveWithHandle(__FUNCTION__,
                            ElementFrom(LinkOf(m_pXmlNode, &xmlNode::prev), &xmlNode::prev));
 }
@@ -186,7 +186,7 @@ CXmlNode CXmlNode::PrevSibling()
 
 int CXmlNode::ClearNode()
 {
-    KX_TRACE("+");
+    KX_ENTER();
     int status = StatusMissing;
     if (CanBeCleared(m_pXmlNode))
     {
@@ -194,7 +194,7 @@ int CXmlNode::ClearNode()
         RemoveAttributes(m_pXmlNode);
         status = StatusOk;
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return status;
 }
 
@@ -202,34 +202,34 @@ int CXmlNode::ClearNode()
 
 std::string CXmlNode::GetContent()
 {
-    KX_TRACE("+");
+    KX_ENTER();
     std::string content;
-    if (OnlyTextChild(m_pXmlNode) != 0)
+    if (OnlyText(LinkOf(m_pXmlNode, &xmlNode::children)) != 0)
     {
         // The engine's buffer stays allocated: clients are built around what this call leaves
         // behind.
         content = FromEngine(xmlNodeGetContent(m_pXmlNode));
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return content;
 }
 
 int CXmlNode::SetContent(std::string text)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     int status = StatusMissing;
     if (CanTakeContent(m_pXmlNode))
     {
         ReplaceContent(m_pXmlNode, text);
         status = StatusOk;
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return status;
 }
 
 int CXmlNode::GetContentOfChildNode(std::string name, std::string& value)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     int status = StatusNotFound;
     CXmlNode child = FindChildNode(name);
     if (child.m_pXmlNode != 0)
@@ -237,7 +237,7 @@ int CXmlNode::GetContentOfChildNode(std::string name, std::string& value)
         value = child.GetContent();
         status = StatusOk;
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return status;
 }
 
@@ -245,7 +245,7 @@ int CXmlNode::GetContentOfChildNode(std::string name, std::string& value)
 
 std::list<CXmlNode> CXmlNode::Children()
 {
-    KX_TRACE("+");
+    KX_ENTER();
     std::list<CXmlNode> children;
     xmlNode* child = ElementFrom(LinkOf(m_pXmlNode, &xmlNode::children));
     while (child != 0)
@@ -253,20 +253,20 @@ std::list<CXmlNode> CXmlNode::Children()
         children.push_back(CXmlNode(child));
         child = ElementFrom(child->next);
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return children;
 }
 
 CXmlNode CXmlNode::FindChildNode(std::string name)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     return LeaveWithHandle(__FUNCTION__,
                            NamedFrom(m_pXmlNode, LinkOf(m_pXmlNode, &xmlNode::children), name));
 }
 
 std::list<CXmlNode> CXmlNode::FindAllChildNodes(std::string name)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     std::list<CXmlNode> children;
     xmlNode* child = NamedFrom(m_pXmlNode, LinkOf(m_pXmlNode, &xmlNode::children), name);
     while (child != 0)
@@ -274,7 +274,7 @@ std::list<CXmlNode> CXmlNode::FindAllChildNodes(std::string name)
         children.push_back(CXmlNode(child));
         child = NamedFrom(m_pXmlNode, child->next, name);
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return children;
 }
 
@@ -282,7 +282,7 @@ std::list<CXmlNode> CXmlNode::FindAllChildNodes(std::string name)
 
 CXmlNode CXmlNode::AddChildNode(std::string name, std::string content)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     CXmlNode child;
     if (CanHoldChildren(m_pXmlNode) && !name.empty())
     {
@@ -293,17 +293,17 @@ CXmlNode CXmlNode::AddChildNode(std::string name, std::string content)
         }
         SetIfFound(child, made);
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return child;
 }
 
 CXmlNode CXmlNode::AddSiblingNode(std::string name, std::string content)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     CXmlNode sibling;
     if (!CanHaveSiblings(m_pXmlNode))
     {
-        KX_TRACE("-");
+        KX_LEAVE();
         return sibling;
     }
     CXmlNode parent = Parent();
@@ -312,13 +312,13 @@ CXmlNode CXmlNode::AddSiblingNode(std::string name, std::string content)
         // Last in the row, without a namespace, under an empty name too: clients count on each.
         SetIfFound(sibling, AppendSibling(m_pXmlNode, name, content));
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return sibling;
 }
 
 int CXmlNode::RemoveChildNode(std::string name)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     int status = StatusMissing;
     CXmlNode child = FindChildNode(name);
     if (CanBeRemoved(child.m_pXmlNode))
@@ -326,6 +326,6 @@ int CXmlNode::RemoveChildNode(std::string name)
         FreeFromTree(child.m_pXmlNode);
         status = StatusOk;
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return status;
 }

@@ -38,7 +38,7 @@ private:
 
 int CXmlNode::AddNewAttribute(std::string name, std::string value)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     int status = StatusMissing;
     if (m_pXmlNode == 0)
     {
@@ -52,13 +52,13 @@ int CXmlNode::AddNewAttribute(std::string name, std::string value)
     {
         status = StatusOk;
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return status;
 }
 
 int CXmlNode::GetAttributeValue(std::string name, std::string& value)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     int status = StatusMissing;
     if (m_pXmlNode == 0)
     {
@@ -77,13 +77,13 @@ int CXmlNode::GetAttributeValue(std::string name, std::string& value)
             status = StatusOk;
         }
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return status;
 }
 
 std::list<CXmlAttr> CXmlNode::GetAttributeItems()
 {
-    KX_TRACE("+");
+    KX_ENTER();
     std::list<CXmlAttr> items;
     std::string value;
     for (const xmlAttr* attribute = AttributesOf(m_pXmlNode); attribute != 0;
@@ -96,7 +96,7 @@ std::list<CXmlAttr> CXmlNode::GetAttributeItems()
         }
         items.push_back(CXmlAttr(FromEngine(attribute->name), value));
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return items;
 }
 
@@ -104,18 +104,20 @@ std::list<CXmlAttr> CXmlNode::GetAttributeItems()
 
 int CXmlNode::RemoveAttribute(std::string /*name*/)
 {
-    KX_TRACE("+");
-    KX_WARNING("RemoveAttribute feature is not available, Reason: This API is not supported by "
-               "libxml2 present in QNX650");
-    KX_TRACE("-");
+    KX_ENTER();
+    KX_LOG(LogLevelWarning, __FUNCTION__,
+           "RemoveAttribute feature is not available, Reason: This API is not supported by "
+           "libxml2 present in QNX650");
+    KX_LEAVE();
     return StatusOk;
 }
 
 int CXmlNode::SetAttributeValue(std::string /*name*/, std::string /*value*/)
 {
-    KX_TRACE("+");
-    KX_WARNING("SetAttributeValue feature is not available, Reason: This API is not supported by "
-               "libxml2 present in QNX650");
-    KX_TRACE("-");
+    KX_ENTER();
+    KX_LOG(LogLevelWarning, __FUNCTION__,
+           "SetAttributeValue feature is not available, Reason: This API is not supported by "
+           "libxml2 present in QNX650");
+    KX_LEAVE();
     return StatusOk;
 }

@@ -47,7 +47,7 @@ int CreateRoot(xmlDoc* document, const std::string& name, CXmlNode& handle)
     if (root == 0)
     {
         // The document stays held without a root until the next release.
-        KX_ERROR_AS("CreateNewXmlDoc", "Error creating new root node");
+        KX_LOG(LogLevelError, "CreateNewXmlDoc", "Error creating new root node");
         return StatusMissing;
     }
     xmlDocSetRootElement(document, root);
@@ -78,13 +78,13 @@ const xmlNodeSet* NodesOf(const xmlXPathObject* result, const char* tag)
 {
     if (result == 0)
     {
-        KX_XPATH_AS(tag, "xmlXPathObjectPtr is NULL");
+        KX_LOG(LogLevelXPath, tag, "xmlXPathObjectPtr is NULL");
         return 0;
     }
     const xmlNodeSet* const nodes = result->nodesetval;
     if (nodes == 0 || nodes->nodeNr < 1)
     {
-        KX_XPATH_AS(tag, "NodeSetVal is NULL");
+        KX_LOG(LogLevelXPath, tag, "NodeSetVal is NULL");
         return 0;
     }
     return nodes;
@@ -115,7 +115,7 @@ void AppendEntries(const xmlNodeSet* nodes, std::list<CXmlNode>& found)
         }
         else
         {
-            KX_XPATH_AS("FindAllNodes", "node pointer is NULL");
+            KX_LOG(LogLevelXPath, "FindAllNodes", "node pointer is NULL");
         }
         index = static_cast<unsigned char>(index + 1);
     } while (index < nodes->nodeNr);
@@ -136,17 +136,17 @@ void FreeResult(xmlXPathObject* result)
 
 CXmlParser::CXmlParser() : m_pXmlDoc(0)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     // Deliberately for every later parse, the configuration reader's included.
     xmlKeepBlanksDefault(0);
-    KX_TRACE("-");
+    KX_LEAVE();
 }
 
 CXmlParser::~CXmlParser()
 {
-    KX_TRACE("+");
+    KX_ENTER();
     ClearDocument();
-    KX_TRACE("-");
+    KX_LEAVE();
 }
 
 void CXmlParser::ClearDocument()
@@ -166,7 +166,7 @@ void CXmlParser::ClearDocument()
 
 int CXmlParser::ParseXml(std::string path)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     int status = StatusOk;
     ClearDocument();
     m_strXmlFile = path;
@@ -184,13 +184,13 @@ int CXmlParser::ParseXml(std::string path)
     {
         m_RootNode.SetXmlNodePtr(xmlDocGetRootElement(m_pXmlDoc));
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return status;
 }
 
 int CXmlParser::SaveXml(std::string path)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     int status = StatusOk;
     const std::string& target = path.empty() ? m_strXmlFile : path;
     if (m_pXmlDoc == 0)
@@ -208,15 +208,15 @@ int CXmlParser::SaveXml(std::string path)
     {
         status = StatusNotFound;
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return status;
 }
 
 bool CXmlParser::IsReadable(const std::string& path)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     const bool isReadable = CanBeOpened(path.c_str());
-    KX_TRACE("-");
+    KX_LEAVE();
     return isReadable;
 }
 
@@ -224,7 +224,7 @@ bool CXmlParser::IsReadable(const std::string& path)
 
 int CXmlParser::CreateNewXmlDoc(std::string rootName)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     int status = StatusMissing;
     ClearDocument();
     if (rootName.empty())
@@ -240,15 +240,15 @@ int CXmlParser::CreateNewXmlDoc(std::string rootName)
     {
         status = CreateRoot(m_pXmlDoc, rootName, m_RootNode);
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return status;
 }
 
 CXmlNode CXmlParser::GetRootNode()
 {
-    KX_TRACE("+");
+    KX_ENTER();
     CXmlNode root(m_RootNode);
-    KX_TRACE("-");
+    KX_LEAVE();
     return root;
 }
 
@@ -256,7 +256,7 @@ CXmlNode CXmlParser::GetRootNode()
 
 xmlXPathObject* CXmlParser::GetNodeSet(std::string expression, CXmlNode contextNode)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     xmlXPathObject* result = 0;
     xmlXPathContext* context = 0;
     if (m_pXmlDoc == 0)
@@ -265,7 +265,7 @@ xmlXPathObject* CXmlParser::GetNodeSet(std::string expression, CXmlNode contextN
     }
     else if ((context = xmlXPathNewContext(m_pXmlDoc)) == 0)
     {
-        KX_XPATH("Unable to create new XPath context");
+        KX_LOG(LogLevelXPath, __FUNCTION__, "Unable to create new XPath context");
     }
     else
     {
@@ -273,17 +273,18 @@ xmlXPathObject* CXmlParser::GetNodeSet(std::string expression, CXmlNode contextN
         result = xmlXPathEvalExpression(ToEngine(expression), context);
         if (result == 0)
         {
-            KX_XPATH_OF("Unable to evaluate nodepath :: \"%s\"", expression.c_str());
+            KX_LOG_OF(LogLevelXPath, __FUNCTION__, "Unable to evaluate nodepath :: \"%s\"",
+                      expression.c_str());
         }
         xmlXPathFreeContext(context);
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return result;
 }
 
 CXmlNode CXmlParser::FindNode(std::string expression, CXmlNode contextNode)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     CXmlNode first;
     xmlXPathObject* const result = GetNodeSet(expression, contextNode);
     const xmlNodeSet* const nodes = NodesOf(result, "FindNode");
@@ -292,13 +293,13 @@ CXmlNode CXmlParser::FindNode(std::string expression, CXmlNode contextNode)
         first.SetXmlNodePtr(EntryOf(nodes, 0));
     }
     FreeResult(result);
-    KX_TRACE("-");
+    KX_LEAVE();
     return first;
 }
 
 std::list<CXmlNode> CXmlParser::FindAllNodes(std::string expression, CXmlNode contextNode)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     std::list<CXmlNode> found;
     xmlXPathObject* const result = GetNodeSet(expression, contextNode);
     const xmlNodeSet* const nodes = NodesOf(result, "FindAllNodes");
@@ -307,7 +308,7 @@ std::list<CXmlNode> CXmlParser::FindAllNodes(std::string expression, CXmlNode co
         AppendEntries(nodes, found);
     }
     FreeResult(result);
-    KX_TRACE("-");
+    KX_LEAVE();
     return found;
 }
 
@@ -315,25 +316,25 @@ std::list<CXmlNode> CXmlParser::FindAllNodes(std::string expression, CXmlNode co
 
 CXmlNode CXmlParser::AddNewNode(CXmlNode parent, std::string name, std::string content)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     CXmlNode child;
     if (!parent.IsNull())
     {
         child = parent.AddChildNode(name, content);
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return child;
 }
 
 int CXmlParser::RemoveNode(CXmlNode node)
 {
-    KX_TRACE("+");
+    KX_ENTER();
     int status = StatusMissing;
     if (!node.IsNull() && CanBeRemoved(node.m_pXmlNode))
     {
         FreeFromTree(node.m_pXmlNode);
         status = StatusOk;
     }
-    KX_TRACE("-");
+    KX_LEAVE();
     return status;
 }

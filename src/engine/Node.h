@@ -33,10 +33,10 @@ inline xmlNode* OnlyText(xmlNode* node)
     return isOnlyText ? node : 0;
 }
 
-/** @return the text node that is the only child of @p node, which may be null; or null. */
-inline xmlNode* OnlyTextChild(const xmlNode* node)
+/** @return the text node that is the only child of @p element, or null. */
+inline xmlNode* OnlyTextChild(const xmlNode* element)
 {
-    return OnlyText(LinkOf(node, &xmlNode::children));
+    return OnlyText(element->children);
 }
 
 /** @return the content of the text node @p text; never null. */

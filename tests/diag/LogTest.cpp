@@ -15,10 +15,10 @@ namespace
 
 struct Operation
 {
-    Operation() { KX_TRACE("+"); }
-    ~Operation() { KX_TRACE("Destructor"); }
+    Operation() { KX_ENTER(); }
+    ~Operation() { KX_LOG(kx::LogLevelTrace, __FUNCTION__, "Destructor"); }
 
-    void Run() { KX_TRACE("-"); }
+    void Run() { KX_LEAVE(); }
 };
 
 const char* g_argument = "argument";
@@ -37,10 +37,10 @@ TEST(Gate, PassesTheRecordOfALevelWhoseBitIsSet)
                                      kx::LogLevelValue, kx::LogLevelXPath})
     {
         LogRecorder log(1u << level);
-        KX_LOG_RECORD(level, "Tag", "text");
+        KX_LOG(level, "Tag", "text");
         EXPECT_EQ(Records({{level, "Tag", "text"}}), log.Take());
         LogRecorder::SetMask(~(1u << level));
-        KX_LOG_RECORD(level, "Tag", "text");
+        KX_LOG(level, "Tag", "text");
         EXPECT_EQ(Records(), log.Take());
     }
 }
@@ -70,13 +70,13 @@ TEST(Gate, EvaluatesNoArgumentWhenTheBitIsClear)
     int evaluations = 0;
     LogRecorder log(kMaskNone);
     const unsigned long calls = LogRecorder::Calls();
-    KX_TRACE_OF("%s", CountedArgument(evaluations));
-    KX_VALUE_OF("%s", CountedArgument(evaluations));
+    KX_LOG_OF(kx::LogLevelTrace, __FUNCTION__, "%s", CountedArgument(evaluations));
+    KX_VALUE("%s", CountedArgument(evaluations));
     EXPECT_EQ(0, evaluations);
     EXPECT_EQ(calls, LogRecorder::Calls());
     LogRecorder::SetMask(kMaskTrace);
-    KX_TRACE_OF("%s", CountedArgument(evaluations));
-    KX_VALUE_OF("%s", CountedArgument(evaluations));
+    KX_LOG_OF(kx::LogLevelTrace, __FUNCTION__, "%s", CountedArgument(evaluations));
+    KX_VALUE("%s", CountedArgument(evaluations));
     EXPECT_EQ(1, evaluations);
 }
 
@@ -103,11 +103,11 @@ TEST(Gate, OfTwoLevelsIsPassedIfEitherBitIsSet)
 TEST(Gate, ReadsTheMaskAnewEachTime)
 {
     LogRecorder log(kMaskNone);
-    KX_TRACE_AS("Tag", "first");
+    KX_LOG(kx::LogLevelTrace, "Tag", "first");
     LogRecorder::SetMask(kMaskTrace);
-    KX_TRACE_AS("Tag", "second");
+    KX_LOG(kx::LogLevelTrace, "Tag", "second");
     LogRecorder::SetMask(kMaskNone);
-    KX_TRACE_AS("Tag", "third");
+    KX_LOG(kx::LogLevelTrace, "Tag", "third");
     EXPECT_EQ(Records({Trace("Tag", "second")}), log.Take());
 }
 
@@ -135,7 +135,7 @@ TEST(Gate, TagIsTheBareNameOfTheOperation)
 
 void BothRecords()
 {
-    KX_TRACE_BOTH();
+    KX_ENTER_AND_LEAVE();
 }
 
 TEST(Gate, OfBothRecordsLogsThemUnderTheOperation)
@@ -159,7 +159,7 @@ TEST(Gate, OfBothRecordsReadsTheMaskAnewForTheSecond)
 TEST(Gate, HandsOverTheLineOfItsSite)
 {
     LogRecorder log;
-    KX_TRACE("+");
+    KX_ENTER();
     EXPECT_EQ(__LINE__ - 1, LogRecorder::LastLine());
 }
 
@@ -168,7 +168,7 @@ TEST(Gate, OutsideTextIsAnArgumentAndNeverTheFormat)
     LogRecorder log;
     g_argument = "%n%s";
     int evaluations = 0;
-    KX_VALUE_AS("Tag", "Key :: %s", CountedArgument(evaluations));
+    KX_LOG_OF(kx::LogLevelValue, "Tag", "Key :: %s", CountedArgument(evaluations));
     EXPECT_EQ("Key :: %s", LogRecorder::LastFormat());
     EXPECT_EQ(Records({Value("Tag", "Key :: %n%s")}), log.Take());
 }
@@ -178,7 +178,7 @@ TEST(Gate, IsOneStatement)
     LogRecorder log(kMaskNone);
     bool otherwise = false;
     if (log.Take().size() == 1)
-        KX_TRACE("+");
+        KX_ENTER();
     else
         otherwise = true;
     EXPECT_TRUE(otherwise);

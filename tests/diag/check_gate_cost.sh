@@ -12,7 +12,7 @@ for compiler in "$@"; do
 const char* Text();
 extern "C" void Probe()
 {
-    KX_VALUE_OF("%s", Text());
+    KX_VALUE("%s", Text());
 }
 CODE
     )

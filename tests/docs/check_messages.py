@@ -13,11 +13,12 @@ import pathlib
 import re
 import sys
 
-Macro = collections.namedtuple("Macro", "level tag text")  # the level; the positions of the parameters, or None
+Macro = collections.namedtuple("Macro", "level tag text")  # each is what it always is, or the position of a parameter
 
 STRING = re.compile(r'"((?:[^"\\]|\\.)*)"')
 DEFINITION = re.compile(r"^#define (KX_\w+)\(([^)]*)\)((?:.*\\\n)*.*)", re.M)
 LEVEL = re.compile(r"\b(LogLevel\w+) = (\d+)")
+LEVEL_NAME = re.compile(r"LogLevel\w+")
 FUNCTION = re.compile(r"^(?!using|namespace|class|struct|enum|extern \"C\"\s*\{)"
                       r"[A-Za-z][^;{}(]*?([\w:]*~?\w+)\((?:[^;{}]*)\n\{", re.M)
 ROW = re.compile(r'^\| `"(.*)"` \| (\d+) \| (.*?) \|', re.M)
@@ -28,15 +29,19 @@ class Unclear(Exception):
     """A record of which text, tag or operation cannot be seen in the source."""
 
 
+def levels_of(log_header):
+    return {name: int(number) for name, number in LEVEL.findall(log_header)}
+
+
 def macros_of(log_header):
-    """The log macros, whatever they are called: those that name a level, given away by their parameters."""
-    levels = {name: int(number) for name, number in LEVEL.findall(log_header)}
+    """The log macros that take a text, whatever they are called: given away by their parameters."""
     for name, parameters, body in DEFINITION.findall(log_header):
-        named = [number for level, number in levels.items() if re.search(rf"\b{level}\b", body)]
         parameters = [parameter.strip() for parameter in parameters.split(",")]
-        text = next((parameters.index(word) for word in ("text", "format") if word in parameters), None)
-        if len(named) == 1 and text is not None and "level" not in parameters:
-            yield name, Macro(named[0], parameters.index("tag") if "tag" in parameters else None, text)
+        positions = {parameter: position for position, parameter in enumerate(parameters)}
+        text = positions.get("text", positions.get("format"))
+        if text is not None:
+            level = LEVEL_NAME.search(body)
+            yield name, Macro(level[0] if level else positions["level"], positions.get("tag", "__FUNCTION__"), text)
 
 
 def without_comments(text):
@@ -68,7 +73,9 @@ class Sources:
     def __init__(self, folder, headers):
         self.texts = {path: without_comments(path.read_text()) for path in sorted(folder.rglob("*.*"))
                       if path.suffix in (".h", ".cpp") and path.name != "Log.h"}
-        self.macros = dict(macros_of((folder / "diag/Log.h").read_text()))
+        log_header = (folder / "diag/Log.h").read_text()
+        self.levels = levels_of(log_header)
+        self.macros = dict(macros_of(log_header))
         self.classes = {path.stem: without_comments(path.read_text()) for path in headers.glob("C*.h")}
 
     def function_around(self, text, at):
@@ -117,14 +124,16 @@ class Sources:
                         raise SystemExit(f"{path}:{text.count(chr(10), 0, at) + 1}: {reason}") from None
 
     def records_at(self, path, at, macro, arguments):
-        record = "".join(STRING.findall(arguments[macro.text]))
+        level, tag, text = (arguments[part] if isinstance(part, int) else part for part in macro)
+        record = "".join(STRING.findall(text))
         if not record:
             raise Unclear("the text is not a literal")
+        number = self.levels[LEVEL_NAME.search(level)[0]]
         if record in TRACE:
-            yield record, macro.level, None
+            yield record, number, None
             return
-        for tag in self.tags_of("__FUNCTION__" if macro.tag is None else arguments[macro.tag], path, at):
-            yield record, macro.level, self.operation(tag, path, at)
+        for name in self.tags_of(tag, path, at):
+            yield record, number, self.operation(name, path, at)
 
 
 def listed(page):

@@ -6,8 +6,8 @@
 
 #include "../../../src/diag/Log.h"
 
-#undef KX_LOG_RECORD
-#define KX_LOG_RECORD(level, tag, text)                                                            \
+#undef KX_LOG
+#define KX_LOG(level, tag, text)                                                                   \
     do                                                                                             \
     {                                                                                              \
         if (false)                                                                                 \
@@ -16,8 +16,8 @@
         }                                                                                          \
     } while (false)
 
-#undef KX_LOG_RECORD_OF
-#define KX_LOG_RECORD_OF(level, tag, format, argument)                                             \
+#undef KX_LOG_OF
+#define KX_LOG_OF(level, tag, format, argument)                                                    \
     do                                                                                             \
     {                                                                                              \
         if (false)                                                                                 \
@@ -26,8 +26,8 @@
         }                                                                                          \
     } while (false)
 
-#undef KX_TRACE_BOTH
-#define KX_TRACE_BOTH() static_cast<void>(0)
+#undef KX_TRACE_BY
+#define KX_TRACE_BY(function) static_cast<void>(0)
 
 #undef KX_LOG_EITHER
 #define KX_LOG_EITHER(one, other) if (false)
