@@ -90,17 +90,43 @@ TEST_F(KxconfigJson, CheckGivesEachWarning)
     EXPECT_EQ(json::array(), unfound.at("messages"));
 }
 
+TEST_F(KxconfigJson, ExplainGivesNoLocationOfMoreThanFiveHundredBytes)
+{
+    const std::string name(247, 'n'); // "/cfg/" + 247 + "/" + 247 are 500 bytes
+    const std::string below = name + "><" + name + "/></" + name + ">";
+    const std::string fits = m_folder.Write("fits.xml", "<cfg><" + below + "</cfg>");
+    const std::string key = "." + name + "." + name;
+    const json location = Answer({"explain", fits, "cfg" + key}).at("results")[4].at("location");
+    EXPECT_EQ("/cfg/" + name + "/" + name, location);
+    const std::string longer = m_folder.Write("longer.xml", "<cfgs><" + below + "</cfgs>");
+    const json element = Answer({"explain", longer, "cfgs" + key}).at("results")[4];
+    EXPECT_EQ(nullptr, element.at("location"));
+    EXPECT_EQ(name, element.at("step"));
+}
+
 TEST_F(KxconfigJson, ExplainGivesEachStep)
 {
     const json results = Answer({"explain", m_file, "cfg.net@id=2.ip"}).at("results");
     ASSERT_EQ(8u, results.size());
-    EXPECT_EQ("root", results[0].at("event"));
+    const json root = {{"event", "root"},
+                       {"depth", 0},
+                       {"line", 1},
+                       {"location", "/cfg"},
+                       {"told", "the key starts with the root's name"}};
+    EXPECT_EQ(root, results[0]);
+    const json level = {{"event", "level"},
+                        {"depth", 0},
+                        {"location", "/cfg"},
+                        {"step", "/cfg"},
+                        {"sought", {{"name", "net"}, {"condition", "id=2"}}}};
+    EXPECT_EQ(level, results[1]);
     const json rejected = {
         {"event", "element"},
         {"depth", 1},
         {"line", 2},
+        {"location", "/cfg/net[1]"},
         {"step", "net[1]"},
-        {"segment", {{"name", "net"}, {"condition", "id=2"}}},
+        {"sought", {{"name", "net"}, {"condition", "id=2"}}},
         {"verdict", "rejected"},
         {"terms", {{{"attribute", "id"}, {"expected", "2"}, {"actual", "1"}, {"holds", false}}}},
         {"value", nullptr}};

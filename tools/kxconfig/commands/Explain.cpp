@@ -69,7 +69,7 @@ struct RootEvent
         return {{"event", "root"},
                 {"line", LineNumberOf(root)},
                 {"location", Locations().Of(root)},
-                {"text", text},
+                {"told", text}, // the name in every 1.x
                 {"depth", 0}};
     }
 };

@@ -11,6 +11,9 @@
 namespace
 {
 
+/** In bytes: scripts get it with each step, and a deep document must not make that quadratic. */
+const size_t kLongestLocation = 500;
+
 /** Below this depth lines are indented no further: there, spaces would be most of the output. */
 const int kDeepestIndentation = 20;
 
@@ -41,6 +44,12 @@ std::string Narration::StepOf(const xmlNode* node)
     return (isRoot ? "/" : "") + locations.LastStepOf(node);
 }
 
+Json Narration::LocationInJson(const xmlNode* node)
+{
+    const std::string location = locations.Of(node);
+    return location.size() <= kLongestLocation ? Json(location) : Json();
+}
+
 std::string LevelEvent::Line() const
 {
     std::string line = "below " + narration.StepOf(level.parent) + ": ";
@@ -63,8 +72,9 @@ std::string LevelEvent::Line() const
 Json LevelEvent::InJson() const
 {
     return {{"event", "level"},
+            {"location", narration.LocationInJson(level.parent)},
             {"step", narration.StepOf(level.parent)},
-            {"segment", level.steps.empty() ? Json() : SegmentInJson(level.steps.front())},
+            {"sought", level.steps.empty() ? Json() : SegmentInJson(level.steps.front())},
             {"depth", depth}};
 }
 
@@ -78,8 +88,9 @@ Json StepEvent::InJson() const
 {
     Json result = {{"event", "element"},
                    {"line", LineNumberOf(step.element)},
+                   {"location", narration.LocationInJson(step.element)},
                    {"step", narration.StepOf(step.element)},
-                   {"segment", SegmentInJson(step)},
+                   {"sought", SegmentInJson(step)},
                    {"verdict", VerdictInJson(step)},
                    {"terms", TermsInJson(step)},
                    {"value", step.text ? Json(*step.text) : Json()}};

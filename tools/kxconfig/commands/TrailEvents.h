@@ -26,6 +26,9 @@ struct Narration
     /** @return the last step of the node's path, with "/" if it is the root: a line that repeated
      * the whole path would be as long as the document is deep. */
     std::string StepOf(const xmlNode* node);
+
+    /** @return the node's whole path, or null if it is very long. */
+    Json LocationInJson(const xmlNode* node);
 };
 
 /** The walk starts with the elements below a node. */
