@@ -2,6 +2,7 @@
 
 #include "UpdateWalk.h"
 #include "diag/Status.h"
+#include "engine/OldEngine.h"
 
 namespace kx
 {
@@ -18,7 +19,7 @@ int UpdateValues(xmlNode* top, TextView key, const char* value, unsigned int& up
         // Also in the middle of a path: an element that holds only text is meant.
         if (walk.IsSelected() && OnlyTextChild(walk.Element()) != 0)
         {
-            xmlNodeSetContent(walk.Element(), reinterpret_cast<const xmlChar*>(value));
+            SetContent(walk.Element(), reinterpret_cast<const xmlChar*>(value));
             updated = 1;
         }
     }

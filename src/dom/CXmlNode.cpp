@@ -5,6 +5,7 @@
 #include "diag/Status.h"
 #include "engine/Edit.h"
 #include "engine/Node.h"
+#include "engine/OldEngine.h"
 
 // CXmlNodeAttributes.cpp has the operations on attributes.
 
@@ -41,8 +42,8 @@ xmlNode* NamedFrom(const xmlNode* node, xmlNode* child, const std::string& name)
 
 xmlNode* NewChild(xmlNode* parent, const std::string& name, const std::string& content)
 {
-    return WholeElement(xmlNewDocNode(parent->doc, NamespaceOf(parent), ToEngine(name),
-                                      content.empty() ? 0 : ToEngine(content)));
+    return WholeElement(NewElement(parent->doc, NamespaceOf(parent), ToEngine(name),
+                                   content.empty() ? 0 : ToEngine(content)));
 }
 
 /** Links @p child by hand: the engine's own call would merge and reject by kind. */
@@ -84,7 +85,7 @@ xmlNode* AppendSibling(xmlNode* node, const std::string& name, const std::string
     }
     if (!content.empty())
     {
-        xmlNodeSetContent(sibling, ToEngine(content));
+        SetContent(sibling, ToEngine(content));
     }
     xmlNode* const linked = xmlAddSibling(node, sibling);
     if (linked == 0)

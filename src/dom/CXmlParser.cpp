@@ -5,6 +5,7 @@
 #include "diag/Status.h"
 #include "engine/Edit.h"
 #include "engine/Kind.h"
+#include "engine/OldEngine.h"
 #include "engine/Text.h"
 
 #include <libxml/parser.h>
@@ -270,7 +271,10 @@ xmlXPathObject* CXmlParser::GetNodeSet(std::string expression, CXmlNode contextN
     else
     {
         context->node = contextNode.m_pXmlNode;
-        result = xmlXPathEvalExpression(ToEngine(expression), context);
+        if (QueryEnds(context->node, expression.c_str()))
+        {
+            result = xmlXPathEvalExpression(ToEngine(expression), context);
+        }
         if (result == 0)
         {
             KX_LOG_OF(LogLevelXPath, __FUNCTION__, "Unable to evaluate nodepath :: \"%s\"",

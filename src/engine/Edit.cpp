@@ -2,6 +2,7 @@
 
 #include "Ids.h"
 #include "Kind.h"
+#include "OldEngine.h"
 #include "Text.h"
 
 namespace kx
@@ -53,7 +54,7 @@ void ReplaceContent(xmlNode* node, const std::string& text)
     // Some engines take this kind, which no document has, for a text.
     if (node->type != XML_ENTITY_NODE)
     {
-        xmlNodeSetContent(node, ToEngine(text));
+        SetContent(node, ToEngine(text));
     }
 }
 

@@ -18,6 +18,7 @@
 #include <libxml/parser.h>
 #include <libxml/xpath.h>
 
+#include <algorithm>
 #include <functional>
 #include <memory>
 #include <new>
@@ -403,8 +404,32 @@ private:
         EXPECT_EQ(kXml, ReadFile(m_file));
         EXPECT_EQ(0, heap.Live());
         const long lost = memory.Live();
-        EXPECT_TRUE(lost >= 0 && lost <= 2 * GetParam().kept) << lost;
+        const long lostHere = lost - 2 * GetParam().kept;
+        EXPECT_TRUE(lost >= 0 && lostHere <= LostByTheEngine()) << lost;
         return failed;
+    }
+
+    /** @return how many blocks the engine itself leaks at most when one request of a parse fails.
+     */
+    long LostByTheEngine() const
+    {
+        static const long lost = EngineVersion() < 20910 ? LostByAnOldEngine() : 0;
+        return lost;
+    }
+
+    long LostByAnOldEngine() const
+    {
+        long most = 0;
+        bool failed = true;
+        for (std::size_t n = 1; failed; ++n)
+        {
+            const EngineMemory memory;
+            failed = Failing<EngineMemory>(n, [&] { xmlFreeDoc(xmlParseFile(m_file.c_str())); });
+            TakeEngineErrors();
+            xmlCleanupParser(); // as every release of a document does
+            most = std::max(most, memory.Live());
+        }
+        return most;
     }
 
     void CheckAnswer(const Answer& seen, bool failed)

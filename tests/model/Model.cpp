@@ -332,7 +332,9 @@ int Model::XMLSetValue(xmlNodePtr node, std::string key, std::string value, unsi
             }
             if (HasValue(child))
             {
-                xmlNodeSetContent(child, reinterpret_cast<const xmlChar*>(value.c_str()));
+                // Before 2.9 the engine makes an empty child out of an empty text.
+                const auto text = reinterpret_cast<const xmlChar*>(value.c_str());
+                xmlNodeSetContent(child, value.empty() ? nullptr : text);
                 updated = 1;
             }
         }

@@ -3,12 +3,11 @@
 
 #include "Operations.h"
 
+#include "support/Engine.h"
 #include "support/EngineTranscript.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
-
-#include <libxml/xmlversion.h>
 
 #include <dlfcn.h>
 
@@ -52,7 +51,7 @@ bool Applies(const std::string& versions)
     {
         return true;
     }
-    const bool reached = LIBXML_VERSION >= major * 10000 + minor * 100;
+    const bool reached = EngineVersion() >= major * 10000 + minor * 100;
     return reached == (relation == "since");
 }
 
@@ -107,9 +106,11 @@ TEST_P(EngineCallsTest, AreThoseOfTheTable)
     GetParam().prepare(world);
     Lines calls;
     {
+        AnswerVersion("20914"); // with engines before 2.9.10 the library works around their defects
         EngineTranscript transcript(Files().Folder());
         GetParam().run(world);
         calls = transcript.Take();
+        AnswerVersion(nullptr);
     }
     const auto section = Table().find(GetParam().name);
     ASSERT_NE(Table().end(), section) << "no section";

@@ -57,6 +57,13 @@ public:
     long LiveContexts() const;
 };
 
+/** @return the version of the running engine, 20914 for 2.9.14; LIBXML_VERSION is the headers'. */
+int EngineVersion();
+
+/** Makes the engine report @p version to the library, 2.14 and later engines excepted; null ends
+ * it. */
+void AnswerVersion(const char* version);
+
 /** Makes the next call of xmlSaveFormatFileEnc do nothing and answer @p result. */
 void AnswerNextFormatSave(int result);
 

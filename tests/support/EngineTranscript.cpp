@@ -1,5 +1,6 @@
 #include "support/EngineTranscript.h"
 
+#include <libxml/entities.h>
 #include <libxml/valid.h>
 #include <libxml/xmlmemory.h>
 
@@ -157,6 +158,11 @@ std::string Render(const xmlNode* node)
     return NameOr(node, node != nullptr ? ByKind(node) : "");
 }
 
+std::string Render(const xmlEntity* entity)
+{
+    return Render(reinterpret_cast<const xmlNode*>(entity));
+}
+
 std::string Render(const xmlDoc* document)
 {
     return Render(reinterpret_cast<const xmlNode*>(document));
@@ -258,6 +264,15 @@ void Call::End(const std::string& result)
 
 using kxtest::Forward;
 
+/** The type of a function's first argument, which older headers have without const. */
+template <class Function>
+struct FirstOf;
+template <class Result, class First, class... Others>
+struct FirstOf<Result(First, Others...)>
+{
+    using Type = First;
+};
+
 #if LIBXML_VERSION >= 21300
 using SetContentResult = int;
 #else
@@ -352,4 +367,34 @@ extern "C" void xmlHashScan(xmlHashTablePtr table, xmlHashScanner visit, void* d
 extern "C" void xmlXPathFreeObject(xmlXPathObjectPtr result)
 {
     Forward<&xmlXPathFreeObject>("xmlXPathFreeObject", result);
+}
+
+// The library calls these with old engines only.
+
+extern "C" xmlNodePtr xmlAddChild(xmlNodePtr parent, xmlNodePtr child)
+{
+    return Forward<&xmlAddChild>("xmlAddChild", parent, child);
+}
+
+extern "C" xmlNodePtr xmlNewDocText(FirstOf<decltype(xmlNewDocText)>::Type document,
+                                    const xmlChar* content)
+{
+    return Forward<&xmlNewDocText>("xmlNewDocText", document, content);
+}
+
+extern "C" xmlEntityPtr xmlGetDocEntity(FirstOf<decltype(xmlGetDocEntity)>::Type document,
+                                        const xmlChar* name)
+{
+    return Forward<&xmlGetDocEntity>("xmlGetDocEntity", document, name);
+}
+
+extern "C" xmlNodePtr xmlStringGetNodeList(FirstOf<decltype(xmlStringGetNodeList)>::Type document,
+                                           const xmlChar* text)
+{
+    return Forward<&xmlStringGetNodeList>("xmlStringGetNodeList", document, text);
+}
+
+extern "C" xmlChar* xmlStrndup(const xmlChar* text, int length)
+{
+    return Forward<&xmlStrndup>("xmlStrndup", text, length);
 }

@@ -51,6 +51,7 @@ std::string Render(const char* text);
 std::string Render(const xmlChar* text);
 std::string Render(int number);
 std::string Render(const xmlNode* node);
+std::string Render(const xmlEntity* entity);
 std::string Render(const xmlDoc* document);
 std::string Render(const xmlAttr* attribute);
 std::string Render(const xmlNs* space);

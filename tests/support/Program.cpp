@@ -3,6 +3,7 @@
 #include "support/Files.h"
 
 #include <algorithm>
+#include <sstream>
 #include <stdexcept>
 
 #include <fcntl.h>
@@ -48,6 +49,22 @@ void SetEnvironment(const std::vector<std::string>& settings)
     }
 }
 
+/** @return @p text without the loader's warnings about an engine without symbol versions. */
+std::string WithoutLoaderWarnings(const std::string& text)
+{
+    std::istringstream lines(text);
+    std::string rest;
+    for (std::string line; std::getline(lines, line);)
+    {
+        const bool isLast = lines.eof(); // then it has no end of line
+        if (line.find(": no version information available (required by ") == std::string::npos)
+        {
+            rest += line + (isLast ? "" : "\n");
+        }
+    }
+    return rest;
+}
+
 Outcome RunAsItIs(const std::vector<std::string>& command,
                   const std::vector<std::string>& environment, unsigned user)
 {
@@ -82,7 +99,7 @@ Outcome RunAsItIs(const std::vector<std::string>& command,
     int status = 0;
     waitpid(child, &status, 0);
     const int code = WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
-    return {code, ReadFile(out), ReadFile(err)};
+    return {code, ReadFile(out), WithoutLoaderWarnings(ReadFile(err))};
 }
 
 } // namespace

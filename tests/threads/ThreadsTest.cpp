@@ -17,6 +17,7 @@
 #include <atomic>
 #include <cstdarg>
 #include <cstdio>
+#include <cstdlib>
 #include <functional>
 #include <memory>
 #include <string>
@@ -230,7 +231,17 @@ TEST_F(ThreadsTest, BlanksAreDroppedInTheThreadThatConstructedADocument)
             inItsThread = hasBlanks();
         })
         .join();
-    EXPECT_FALSE(inItsThread);
+    // In a thread other than the first, version 2.7 ignores the setting until the first parse.
+    bool byTheEngine = true;
+    std::thread(
+        [&]
+        {
+            xmlKeepBlanksDefault(0);
+            byTheEngine = hasBlanks();
+        })
+        .join();
+    EXPECT_EQ(byTheEngine, inItsThread);
+    EXPECT_TRUE(!byTheEngine || std::atoi(xmlParserVersion) < 20900);
     EXPECT_TRUE(hasBlanks());
 
     const CXmlParser parser;

@@ -23,6 +23,7 @@
 
 #include <functional>
 #include <memory>
+#include <utility>
 
 using namespace kxtest;
 
@@ -199,10 +200,11 @@ TEST_F(TrustTest, CompressedFilesAreReadIfTheEngineReadsThem)
                                           0x00, 0xc5, 0x27, 0x99, 0xff, 0x13, 0x00, 0x00, 0x00};
     const std::string file =
         m_folder.Write("cfg.xml", std::string(reinterpret_cast<const char*>(kGzip), sizeof kGzip));
-    // Without zlib an engine does not, nor does one from 2.15 on that is not asked to.
+    // Without zlib an engine does not, nor does one from 2.14 on that is not asked to.
     const xmlDocPtr engines = xmlReadFile(file.c_str(), nullptr, 0);
     EXPECT_EQ(engines != nullptr ? "v" : "", CXMLReader(file).GetValue("cfg.a"));
-    EXPECT_TRUE(engines != nullptr || LIBXML_VERSION >= 21500 || xmlHasFeature(XML_WITH_ZLIB) == 0);
+    EXPECT_TRUE(engines != nullptr || EngineVersion() >= 21400 ||
+                xmlHasFeature(XML_WITH_ZLIB) == 0);
     xmlFreeDoc(engines);
 }
 
@@ -215,6 +217,16 @@ TEST_F(TrustTest, NothingBesidesTheFileIsRead)
         Write("<!DOCTYPE cfg SYSTEM '" + m_folder.Write("x.dtd", "<!ELEMENT cfg ANY>") +
               "' [<!ENTITY s SYSTEM '" + secret + "'><!ENTITY % p SYSTEM '" + secret +
               "'> %p;]><cfg><a>&s;</a></cfg>");
+    if (EngineVersion() < 20910)
+    {
+        // These engines read the parameter entity and reject the document, in a bare call as well.
+        xmlFreeDoc(xmlParseFile(file.c_str()));
+        const std::vector<std::string> opened = std::exchange(g_opened, {});
+        EXPECT_EQ((std::vector<std::string>{file, secret}), opened);
+        EXPECT_EQ(nullptr, CXMLReader(file).GetDataPtr());
+        EXPECT_EQ(opened, g_opened);
+        return;
+    }
     EXPECT_EQ("", CXMLReader(file).GetValue("cfg.a"));
     CXMLWriter writer(file);
     EXPECT_EQ(-2, writer.SetValue("cfg.a", "v"));
@@ -388,6 +400,13 @@ TEST_F(TrustTest, NestingOfExpressionsIsLimited)
 {
     ASSERT_EQ(0, m_parser->ParseXml(Write("<cfg/>")));
     const std::string deep = std::string(100000, '(') + "1" + std::string(100000, ')');
+    if (EngineVersion() < 20910)
+    {
+        // These engines have no limit: the bare call exhausts the stack as well.
+        const auto text = reinterpret_cast<const xmlChar*>(deep.c_str());
+        EXPECT_DEATH(xmlXPathEvalExpression(text, xmlXPathNewContext(nullptr)), "");
+        return;
+    }
     EXPECT_EQ(nullptr, m_parser->GetNodeSet(deep, CXmlNode()));
 }
 
