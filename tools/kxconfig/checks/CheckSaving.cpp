@@ -1,6 +1,6 @@
 #include "checks/CheckSaving.h"
 
-#include "file/RoundTrip.h"
+#include "file/SavingChanges.h"
 
 void CheckSaving(CXMLReader& reader, const std::string& file, Findings& findings)
 {

@@ -4,19 +4,6 @@
 #include "CXMLReader.h"
 
 #include <string>
-#include <vector>
-
-/** Something that a file loses or gains when it is loaded and saved. */
-struct Difference
-{
-    long line; ///< of the file as it is
-    std::string what;
-};
-
-/** @return the first difference in the XML declaration and the first one after it; none, if the
- * writer would save @p reader's document as @p file has it, byte for byte. None either of what is
- * no regular file: its bytes were there to be read once, by the engine. */
-std::vector<Difference> WhatSavingChanges(CXMLReader& reader, const std::string& file);
 
 /** @return the bytes that CXMLWriter::SaveData() writes for @p reader's document. */
 std::string SavedBytes(CXMLReader& reader);
