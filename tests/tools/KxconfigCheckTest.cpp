@@ -608,7 +608,7 @@ TEST_F(KxconfigCheck, FindsADifferenceAnywhereInAFile)
 {
     // The engine saves in pieces; a difference can be at their borders.
     const std::string start = kDeclaration + "<cfg>\n";
-    for (size_t size = 3900; size<8300; size += size % 4000> 20 && size % 4000 < 3950 ? 50 : 1)
+    for (size_t size = 3940; size < 4010; size += 2)
     {
         const std::string text = start + "<!--" + std::string(size, 'x') + "-->\n<a>";
         m_file = m_folder.Write("cfg.xml", text + "&#65;</a></cfg>\n");

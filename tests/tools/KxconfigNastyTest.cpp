@@ -1,5 +1,7 @@
 #include "ToolTest.h"
 
+#include "support/Memory.h"
+
 #include <nlohmann/json.hpp>
 
 #include <sys/stat.h>
@@ -20,12 +22,9 @@ class KxconfigNasty : public ToolTest
 protected:
     static std::vector<std::vector<std::string>> VerbsOn(const std::string& file)
     {
-        return {{"get", file, "cfg.a"},
-                {"set", file, "cfg.a", "x"},
-                {"explain", file, "cfg.a"},
-                {"explain", "--set", file, "cfg.a"},
-                {"check", "--notes", file},
-                {"keys", file},
+        return {{"get", file, "cfg.a"},     {"set", file, "cfg.a", "x"},
+                {"explain", file, "cfg.a"}, {"explain", "--set", file, "cfg.a"},
+                {"check", "--notes", file}, {"keys", file},
                 {"find", file, "//a"}};
     }
 
@@ -201,6 +200,28 @@ TEST_F(KxconfigNasty, NamesThatATerminalShouldNotBeShownAreEscaped)
         ExpectComplaint(Tool({"get", m_folder.Path(name), "cfg.a"}), 3,
                         "cannot read " + m_folder.Path(shown) + ": No such file or directory");
     }
+}
+
+TEST_F(KxconfigNasty, RunningOutOfMemoryWhileLoading)
+{
+    const std::string file = m_folder.Write("cfg.xml", "<cfg><a b='1'>1</a><a b='2'>2</a></cfg>");
+    std::size_t failures = 0;
+    std::size_t unreported = 0; // some engines take a buffer that cannot grow for an empty file
+    for (const std::string verb : {"get", "find"})
+    {
+        for (std::size_t n = 1; n != 30; ++n)
+        {
+            const kxtest::EngineMemory memory;
+            kxtest::EngineMemory::FailAt(n);
+            const Outcome outcome = Tool({verb, file, verb == "get" ? "cfg.a" : "/cfg/a"});
+            const bool hasFailed = kxtest::EngineMemory::Failed();
+            kxtest::EngineMemory::FailAt(0);
+            failures += hasFailed && outcome.status == 4 ? 1 : 0;
+            unreported += outcome.status == 3 ? 1 : 0;
+        }
+    }
+    EXPECT_GT(failures, 20U);
+    EXPECT_LE(unreported, 4U);
 }
 
 TEST_F(KxconfigNasty, RunningOutOfMemory)

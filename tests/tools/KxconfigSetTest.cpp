@@ -188,13 +188,42 @@ TEST_F(KxconfigSet, SaysWhyAFileCannotBeRead)
 
 TEST_F(KxconfigSet, RefusesToSaveWhatWouldNotLoadAgain)
 {
-    const Outcome outcome = Tool({"set", m_file, "cfg.name", "&nowhere;"});
+    const std::string xml = "<!DOCTYPE cfg [<!ENTITY e \"<b>\">]>\n<cfg>\n<a>1</a></cfg>\n";
+    const std::string file = m_folder.Write("entity.xml", xml);
+    for (const std::string option : {"--json", "--dry-run"})
+    {
+        EXPECT_EQ(4, Tool({"set", option, file, "cfg.a", "&e;"}).status);
+    }
+    const Outcome outcome = Tool({"set", file, "cfg.a", "&e;"});
     EXPECT_EQ(4, outcome.status);
     EXPECT_EQ("", outcome.out);
-    EXPECT_THAT(outcome.err, testing::StartsWith("kxconfig: not saved: " + m_file +
-                                                 " would no longer load, line 2: "));
+    EXPECT_THAT(outcome.err, testing::StartsWith("kxconfig: not saved: " + file +
+                                                 " would no longer load, line "));
     EXPECT_EQ(1, std::count(outcome.err.begin(), outcome.err.end(), '\n'));
-    ExpectUntouched();
+    EXPECT_EQ(xml, ReadFile(file));
+}
+
+TEST_F(KxconfigSet, RefusesAReferenceToAnEntityThatTheFileDoesNotDeclare)
+{
+    ExpectRefused({"set", m_file, "cfg.name", "a&nowhere;"}, 2,
+                  "VALUE is not XML text: the file declares no entity \"nowhere\"");
+    const std::string file =
+        m_folder.Write("entity.xml", "<!DOCTYPE cfg [<!ENTITY e \"x\">]>\n<cfg><a>1</a></cfg>\n");
+    EXPECT_EQ(0, Tool({"set", file, "cfg.a", "&e;&lt;"}).status);
+    const std::string external = m_folder.Write(
+        "external.xml", "<!DOCTYPE cfg SYSTEM \"missing.dtd\">\n<cfg><a>1</a></cfg>\n");
+    EXPECT_EQ(0, Tool({"set", external, "cfg.a", "&unknown;"}).status);
+}
+
+TEST_F(KxconfigSet, RefusesNoncharacters)
+{
+    for (const std::string character : {"\xEF\xBF\xBE", "\xEF\xBF\xBF"})
+    {
+        ExpectRefused({"set", m_file, "cfg.name", "a" + character}, 2,
+                      "VALUE is not XML text: it contains U+FFFE or U+FFFF, which are not "
+                      "characters");
+    }
+    EXPECT_EQ(0, Tool({"set", m_file, "cfg.name", "\xEF\xBF\xBD"}).status);
 }
 
 TEST_F(KxconfigSet, SaysThatSavingFailed)
@@ -268,7 +297,7 @@ TEST_F(KxconfigSet, TakesReferencesToCharactersAndEntities)
 
 TEST_F(KxconfigSet, DryRunFailsWhereTheRealRunWould)
 {
-    EXPECT_EQ(4, Tool({"set", "--dry-run", m_file, "cfg.name", "&nowhere;"}).status);
+    EXPECT_EQ(2, Tool({"set", "--dry-run", m_file, "cfg.name", "&nowhere;"}).status);
     EXPECT_EQ(2, Tool({"set", "--dry-run", m_file, "cfg.name", "x&y"}).status);
     ExpectUntouched();
 }

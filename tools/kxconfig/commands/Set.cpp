@@ -22,7 +22,6 @@ namespace
 
 void Update(CXMLWriter& writer, const SetArguments& arguments)
 {
-    RequireXmlText(arguments.value);
     const FirstEngineError error;
     const int status = writer.SetValue(arguments.key, arguments.value);
     if (!error.IsNone())
@@ -118,6 +117,8 @@ ExitStatus Set(const SetArguments& arguments, Report& report)
     RequireKey(arguments.key, arguments.file, *reader);
     const Texts texts(reader->GetDataPtr());
     GuestWriter writer(*reader);
+    RequireXmlText(arguments.value);
+    RequireDeclaredEntities(arguments.value, DocumentOf(*reader));
     Update(writer.Get(), arguments);
     const std::vector<ChangedText> changes = texts.Changes();
     const bool isSaved = !changes.empty() || SavesElsewhere(arguments);

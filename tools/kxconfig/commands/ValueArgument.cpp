@@ -1,8 +1,10 @@
 #include "commands/ValueArgument.h"
 
 #include "output/Failure.h"
+#include "output/Quoting.h"
 
 #include <libxml/chvalid.h>
+#include <libxml/entities.h>
 #include <libxml/xmlstring.h>
 
 #include <algorithm>
@@ -42,7 +44,9 @@ void RequireReference(const std::string& text)
     }
 }
 
-void RequireReferencesOnly(const std::string& value)
+/** Calls @p check with each text between "&" and ";" in @p value. */
+template <class Check>
+void ForEachReference(const std::string& value, Check check)
 {
     for (size_t at = value.find('&'); at != value.npos;)
     {
@@ -51,9 +55,14 @@ void RequireReferencesOnly(const std::string& value)
         {
             RefuseValue(g_bareAmpersand);
         }
-        RequireReference(value.substr(at + 1, end - at - 1));
+        check(value.substr(at + 1, end - at - 1));
         at = value.find('&', end);
     }
+}
+
+bool HasExternalDtd(const xmlDoc* document)
+{
+    return document->intSubset != nullptr && document->intSubset->SystemID != nullptr;
 }
 
 /** @return whether @p value is UTF-8 without the control characters that XML does not have. */
@@ -63,6 +72,12 @@ bool HasOnlyXmlCharacters(const std::string& value)
     { return byte < ' ' && byte != '\t' && byte != '\n' && byte != '\r'; };
     return xmlCheckUTF8(reinterpret_cast<const xmlChar*>(value.c_str())) != 0 &&
            std::none_of(value.begin(), value.end(), isForbidden);
+}
+
+/** @return whether @p value, which is UTF-8, contains U+FFFE or U+FFFF. */
+bool HasNoncharacters(const std::string& value)
+{
+    return value.find("\xEF\xBF\xBE") != value.npos || value.find("\xEF\xBF\xBF") != value.npos;
 }
 
 } // namespace
@@ -82,5 +97,26 @@ void RequireXmlText(const std::string& value)
     {
         RefuseValue("it contains control characters, or bytes that are not UTF-8");
     }
-    RequireReferencesOnly(value);
+    if (HasNoncharacters(value))
+    {
+        RefuseValue("it contains U+FFFE or U+FFFF, which are not characters");
+    }
+    ForEachReference(value, RequireReference);
+}
+
+void RequireDeclaredEntities(const std::string& value, const xmlDoc* document)
+{
+    if (HasExternalDtd(document))
+    {
+        return;
+    }
+    ForEachReference(value,
+                     [&](const std::string& name)
+                     {
+                         const auto* const entity = reinterpret_cast<const xmlChar*>(name.c_str());
+                         if (name[0] != '#' && xmlGetDocEntity(document, entity) == nullptr)
+                         {
+                             RefuseValue("the file declares no entity " + Quoted(name));
+                         }
+                     });
 }

@@ -3,11 +3,17 @@
 
 #include <string>
 
+struct _xmlDoc;
+
 /** Ends a command with the message that VALUE is not XML text, and @p why. */
 [[noreturn]] void RefuseValue(const std::string& why);
 
 /** Throws a Failure unless @p value is text as an XML file holds it, with references. */
 void RequireXmlText(const std::string& value);
+
+/** Throws a Failure if @p value, which is XML text, refers to an entity that @p document does not
+ * declare. With an external DTD an engine that does not read it cannot know. */
+void RequireDeclaredEntities(const std::string& value, const _xmlDoc* document);
 
 /** The reason for the most common mistake in a value. */
 extern const char* const g_bareAmpersand;

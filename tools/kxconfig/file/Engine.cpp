@@ -3,6 +3,7 @@
 #include <libxml/parser.h>
 
 #include <algorithm>
+#include <new>
 
 namespace
 {
@@ -62,17 +63,30 @@ FirstEngineError::FirstEngineError() : m_receiver(Keep, this)
 
 void FirstEngineError::Keep(void* self, EngineError error)
 {
-    std::string& text = static_cast<FirstEngineError*>(self)->m_text;
+    FirstEngineError& errors = *static_cast<FirstEngineError*>(self);
+    try
+    {
+        errors.m_isOutOfMemory = errors.m_isOutOfMemory || error->code == XML_ERR_NO_MEMORY;
+        errors.KeepText(error);
+    }
+    catch (const std::bad_alloc&)
+    {
+        errors.m_isOutOfMemory = true; // no exception passes through the engine
+    }
+}
+
+void FirstEngineError::KeepText(EngineError error)
+{
     // A prefix that is not declared is reported, but does not end a parse: what does is wanted.
-    if (!text.empty() || error->level < XML_ERR_ERROR || error->message == nullptr ||
+    if (!m_text.empty() || error->level < XML_ERR_ERROR || error->message == nullptr ||
         error->domain == XML_FROM_NAMESPACE)
     {
         return;
     }
-    text = error->message;
-    text.erase(std::min(text.find_first_of("\r\n"), text.size()));
+    m_text = error->message;
+    m_text.erase(std::min(m_text.find_first_of("\r\n"), m_text.size()));
     if (error->line > 0)
     {
-        text = std::to_string(error->line) + ": " + text;
+        m_text = std::to_string(error->line) + ": " + m_text;
     }
 }

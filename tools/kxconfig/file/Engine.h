@@ -55,13 +55,18 @@ public:
 
     bool IsNone() const { return m_text.empty(); }
 
+    /** @return whether the engine ran out of memory, be it after the first error. */
+    bool IsOutOfMemory() const { return m_isOutOfMemory; }
+
     /** @return "LINE: reason", or the reason alone if it is on no line; empty if there is none. */
     const std::string& Text() const { return m_text; }
 
 private:
     static void Keep(void* self, EngineError error);
+    void KeepText(EngineError error);
 
     std::string m_text;
+    bool m_isOutOfMemory = false;
     const EngineErrorReceiver m_receiver;
 };
 

@@ -7,6 +7,8 @@
 
 #include <libxml/tree.h>
 
+#include <new>
+
 namespace
 {
 
@@ -16,9 +18,15 @@ Failure NotRead(const std::string& path, const std::error_code& error)
             "cannot read " + (path.empty() ? Quoted(path) : path) + ": " + error.message()};
 }
 
-Failure NotParsed(const std::string& path, const FirstEngineError& error)
+/** Throws what kept the engine from loading the file. */
+[[noreturn]] void ThrowNotParsed(const std::string& path, const FirstEngineError& error)
 {
-    return {ExitStatus::BadFile, path + ":" + (error.IsNone() ? " not parsed" : error.Text())};
+    if (error.IsOutOfMemory())
+    {
+        throw std::bad_alloc();
+    }
+    throw Failure(ExitStatus::BadFile,
+                  path + ":" + (error.IsNone() ? " not parsed" : error.Text()));
 }
 
 Input Open(const std::string& path)
@@ -40,9 +48,13 @@ std::unique_ptr<CXMLReader> LoadFile(const std::string& path)
     const Input input = Open(path);
     const FirstEngineError error;
     std::unique_ptr<CXMLReader> reader(GetCXMLReaderObject(input.Path().c_str()));
-    if (reader == nullptr || reader->GetDataPtr() == nullptr)
+    if (reader == nullptr)
     {
-        throw NotParsed(path, error);
+        throw std::bad_alloc();
+    }
+    if (reader->GetDataPtr() == nullptr)
+    {
+        ThrowNotParsed(path, error);
     }
     return reader;
 }
@@ -53,7 +65,7 @@ void LoadDocument(const std::string& path, CXmlParser& document)
     const FirstEngineError error;
     if (document.ParseXml(input.Path()) != 0)
     {
-        throw NotParsed(path, error);
+        ThrowNotParsed(path, error);
     }
 }
 
