@@ -4,6 +4,7 @@
 #include "output/Quoting.h"
 
 #include <iterator>
+#include <string_view>
 
 namespace
 {
@@ -157,6 +158,10 @@ std::vector<Repeat> RepeatsIn(const Group& group, const std::vector<Attributes>&
 
 void CheckGroup(const Group& group, const Levels& levels, Findings& findings)
 {
+    if (group.size() == 1 || !findings.Want(Kind::RepeatedAttribute))
+    {
+        return;
+    }
     const std::vector<Attributes> telling = TellingAttributes(group, levels);
     const std::vector<Repeat> repeats = RepeatsIn(group, telling);
     if (repeats.empty())
@@ -196,13 +201,13 @@ public:
 private:
     bool CheckBelow(const xmlNode* parent)
     {
-        std::map<std::string, Group> groups; // of elements with values, by their names
+        std::map<std::string_view, Group> groups; // of elements with values, by their names
         for (const xmlNode* child = kx::ElementFrom(parent->children); child != nullptr;
              child = kx::ElementFrom(child->next))
         {
             if (Check(child))
             {
-                groups[Text(child->name)].push_back(child);
+                groups[reinterpret_cast<const char*>(child->name)].push_back(child);
             }
         }
         for (const auto& [name, group] : groups)
