@@ -63,13 +63,12 @@ int AppendValues(const xmlNode* node, TextView key, std::string& value, unsigned
     const char* const tag = "XMLGetValue";
     if (node == 0 || key.IsEmpty())
     {
-        KX_LOG(LogLevelTrace, tag, "+");
-        KX_LOG(LogLevelTrace, tag, "-");
+        KX_TRACE(LogEntryAndReturn, tag);
         return StatusMissing;
     }
     KX_LOG_EITHER(LogLevelTrace, LogLevelValue)
     {
-        KX_LOG(LogLevelTrace, tag, "+");
+        KX_TRACE(LogEntry, tag);
         KX_LOG_OF(LogLevelValue, tag, "Key :: %s", key.data);
     }
     int status = StatusNotFound;
@@ -92,7 +91,7 @@ int AppendValues(const xmlNode* node, TextView key, std::string& value, unsigned
             status = AppendValues(scan.Element(), split.Rest(), value, found);
         }
     }
-    KX_LOG(LogLevelTrace, tag, "-");
+    KX_TRACE(LogReturn, tag);
     return status;
 }
 

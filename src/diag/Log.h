@@ -12,7 +12,8 @@
  * the word again, because the platform can change it at any time.
  *
  * The tag of a record is the bare name of the operation: that of the function that contains the
- * gate. Functions that work on behalf of an operation use KX_LOG and KX_LOG_OF with its name.
+ * gate. Functions that work on behalf of an operation use KX_LOG, KX_LOG_OF and KX_TRACE with its
+ * name.
  *
  * An operation that traces begins with KX_ENTER() and ends with KX_LEAVE() on each return path. No
  * destructor logs the "-": it is missing after an exception, and it precedes the destruction of
@@ -122,20 +123,21 @@ __attribute__((noinline)) inline void LogEntryAndReturn(int line, const char* ta
 #define KX_LOG_EITHER(one, other) if (kx::LogEnabled(one, other))
 
 /** "+": the operation begins. */
-#define KX_ENTER() KX_TRACE_BY(LogEntry)
+#define KX_ENTER() KX_TRACE(LogEntry, __FUNCTION__)
 
 /** "-": the operation returns. */
-#define KX_LEAVE() KX_TRACE_BY(LogReturn)
+#define KX_LEAVE() KX_TRACE(LogReturn, __FUNCTION__)
 
 /** "+" and "-" of an operation without visible work in between: one test for both. */
-#define KX_ENTER_AND_LEAVE() KX_TRACE_BY(LogEntryAndReturn)
+#define KX_ENTER_AND_LEAVE() KX_TRACE(LogEntryAndReturn, __FUNCTION__)
 
-#define KX_TRACE_BY(function)                                                                      \
+/** "+" by LogEntry, "-" by LogReturn or both by LogEntryAndReturn. */
+#define KX_TRACE(function, tag)                                                                    \
     do                                                                                             \
     {                                                                                              \
         if (kx::LogEnabled(kx::LogLevelTrace))                                                     \
         {                                                                                          \
-            kx::function(__LINE__, __FUNCTION__);                                                  \
+            kx::function(__LINE__, tag);                                                           \
         }                                                                                          \
     } while (false)
 

@@ -101,7 +101,7 @@ CXmlNode kx::LeaveWithHandle(const char* tag, xmlNode* node)
 {
     CXmlNode handle;
     SetIfFound(handle, node);
-    KX_LOG(LogLevelTrace, tag, "-");
+    KX_TRACE(LogReturn, tag);
     return handle;
 }
 

@@ -8,8 +8,8 @@
 namespace kx
 {
 
-#if LIBXML_VERSION <                                                                               \
-    21400 // from 2.14 on the library has another name: no old engine can take its place
+// From 2.14 on the library has another name: no old engine can take its place.
+#if LIBXML_VERSION < 21400
 
 namespace
 {
@@ -17,7 +17,7 @@ namespace
 bool IsOld()
 {
     // The variable behind it is a macro up to 2.11, and a symbol of its own since.
-    return strncmp(*__xmlParserVersion(), "20910", 5) < 0;
+    return strcmp(*__xmlParserVersion(), "20910") < 0;
 }
 
 /** @return whether the engine turns the content of @p node into child nodes. */
@@ -111,19 +111,17 @@ bool IsInsideAttribute(const xmlNode* node)
 
 void SetContent(xmlNode* node, const xmlChar* text)
 {
-    if (!IsOld() || !HoldsNodes(node))
-    {
-        xmlNodeSetContent(node, text);
-    }
-    else if (Find(text, '&') == 0)
+    const bool needsHelp = IsOld() && HoldsNodes(node);
+    if (needsHelp && Find(text, '&') == 0)
     {
         SetPlainContent(node, text);
+        return;
     }
-    else
+    if (needsHelp)
     {
         PrepareReferences(node->doc, text);
-        xmlNodeSetContent(node, text);
     }
+    xmlNodeSetContent(node, text);
 }
 
 xmlNode* NewElement(xmlDoc* document, xmlNs* space, const xmlChar* name, const xmlChar* content)

@@ -57,12 +57,19 @@ inline const char* FromEngine(const xmlChar* text)
     return text != 0 ? reinterpret_cast<const char*>(text) : "";
 }
 
+// Called from so many places that it is inline only where speed counts more than size.
+#ifdef __OPTIMIZE_SIZE__
+#define KX_INLINE_FOR_SPEED __attribute__((noinline)) inline
+#else
+#define KX_INLINE_FOR_SPEED inline
+#endif
+
 /**
  * @return whether the engine's @p text consists of exactly the bytes of @p view.
  *
  * A null @p text equals nothing: short of memory the engine makes elements without a name.
  */
-inline bool SameText(const xmlChar* text, TextView view)
+KX_INLINE_FOR_SPEED bool SameText(const xmlChar* text, TextView view)
 {
     if (text == 0)
     {

@@ -26,8 +26,8 @@
         }                                                                                          \
     } while (false)
 
-#undef KX_TRACE_BY
-#define KX_TRACE_BY(function) static_cast<void>(0)
+#undef KX_TRACE
+#define KX_TRACE(function, tag) static_cast<void>(tag)
 
 #undef KX_LOG_EITHER
 #define KX_LOG_EITHER(one, other) if (false)
