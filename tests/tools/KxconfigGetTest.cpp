@@ -84,14 +84,87 @@ TEST_F(KxconfigGet, RefusesBadUsage)
     ExpectComplaint(Tool({"frobnicate"}), 2, "unknown command \"frobnicate\"" + kUsage);
     ExpectComplaint(Tool({"frobnicate", kGateway, "a.b"}), 2,
                     "unknown command \"frobnicate\"" + kUsage);
-    ExpectComplaint(Tool({"get", kGateway, "a.b", "frobnicate"}), 2,
+    ExpectComplaint(Tool({"explain", kGateway, "a.b", "frobnicate"}), 2,
                     "The following argument was not expected: frobnicate" + kUsage);
     ExpectComplaint(Tool({"--frobnicate"}), 2,
                     "The following argument was not expected: --frobnicate" + kUsage);
     ExpectComplaint(Tool({"get"}), 2, "FILE is required" + kUsage);
     ExpectComplaint(Tool({"get", kGateway}), 2, "KEY is required" + kUsage);
-    ExpectComplaint(Tool({"get", "-", "a.b"}), 2, "FILE: \"-\" is not a file name" + kUsage);
+    ExpectComplaint(Tool({"check", "-"}), 2, "FILE: \"-\" is not a file name" + kUsage);
     EXPECT_EQ(2, Tool({"get", kGateway, "a.b", "c"}).status);
+}
+
+TEST_F(KxconfigGet, PrintsEachOfSeveralKeysWithItsValues)
+{
+    const Outcome outcome = Tool({"get", kGateway, "gateway.network.dns.server", "gateway.name"});
+    EXPECT_EQ(0, outcome.status);
+    EXPECT_EQ("gateway.network.dns.server\t\"10.20.0.53\"\n"
+              "gateway.network.dns.server\t\"10.20.0.54\"\n"
+              "gateway.name\t\"line-3-gateway\"\n",
+              outcome.out);
+    EXPECT_EQ("", outcome.err);
+}
+
+TEST_F(KxconfigGet, PrintsTheKeysThatHaveValuesAndComplainsAboutTheOthers)
+{
+    const Outcome outcome = Tool({"get", kGateway, "gateway.missing", "gate.name", "gateway.name"});
+    EXPECT_EQ(1, outcome.status);
+    EXPECT_EQ("gateway.name\t\"line-3-gateway\"\n", outcome.out);
+    EXPECT_EQ(
+        "kxconfig: nothing found: no element of " + kGateway +
+            " has a value under \"gateway.missing\"\n"
+            "kxconfig: nothing found: the key starts with \"gate\", but the root element of " +
+            kGateway + " is \"gateway\"\n",
+        outcome.err);
+    const Outcome malformed = Tool({"get", kGateway, "gateway.name", "gateway"});
+    EXPECT_EQ(2, malformed.status);
+    EXPECT_EQ("", malformed.out);
+}
+
+TEST_F(KxconfigGet, PrintsTheDefaultForAKeyThatHasNoValue)
+{
+    for (const std::string key : {"gateway.missing", "gate.name"})
+    {
+        const Outcome outcome = Tool({"get", "--default", "a b", kGateway, key});
+        EXPECT_EQ(0, outcome.status);
+        EXPECT_EQ("a b\n", outcome.out);
+        EXPECT_EQ("", outcome.err);
+    }
+    EXPECT_EQ("line-3-gateway\n", Tool({"get", "--default=x", kGateway, "gateway.name"}).out);
+    EXPECT_EQ("\n", Tool({"get", "--default", "", kGateway, "gateway.missing"}).out);
+    EXPECT_EQ("gateway.name\t\"line-3-gateway\"\ngateway.x\t\"d\"\n",
+              Tool({"get", "--default", "d", kGateway, "gateway.name", "gateway.x"}).out);
+    EXPECT_EQ(2, Tool({"get", "--default", "x", kGateway, "gateway"}).status);
+    EXPECT_EQ(3, Tool({"get", "--default", "x", m_folder.Path("missing"), "a.b"}).status);
+}
+
+TEST_F(KxconfigGet, EndsValuesWithNul)
+{
+    const std::string file = m_folder.Write("cfg.xml", "<cfg><a>1\n2</a><a>\"3\"</a></cfg>");
+    const std::string nul(1, '\0');
+    EXPECT_EQ("1\n2" + nul + "\"3\"" + nul, Tool({"get", "-z", file, "cfg.a"}).out);
+    EXPECT_EQ("cfg.a\t1\n2" + nul + "cfg.a\t\"3\"" + nul + "cfg.b\tx" + nul,
+              Tool({"get", "--null", "--default", "x", file, "cfg.a", "cfg.b"}).out);
+    EXPECT_EQ(Tool({"--json", "get", file, "cfg.a"}).out,
+              Tool({"--json", "get", "-z", file, "cfg.a"}).out);
+}
+
+TEST_F(KxconfigGet, ReadsStandardInput)
+{
+    EXPECT_EQ("1\n", ToolWithInput({"get", "-", "cfg.a"}, "<cfg><a>1</a></cfg>").out);
+    const std::string large = "<cfg><a>" + std::string(200000, 'x') + "</a></cfg>";
+    EXPECT_EQ(200001u, ToolWithInput({"get", "-", "cfg.a"}, large).out.size());
+    EXPECT_EQ("cfg.a\t\"1\"\n", ToolWithInput({"keys", "-"}, "<cfg><a>1</a></cfg>").out);
+    EXPECT_EQ("/cfg/a element \"1\"\n",
+              ToolWithInput({"find", "-", "//a"}, "<cfg><a>1</a></cfg>").out);
+    EXPECT_EQ(0, ToolWithInput({"explain", "-", "cfg.a"}, "<cfg><a>1</a></cfg>").status);
+    const Outcome bad = ToolWithInput({"get", "-", "cfg.a"}, "<cfg>\n<a></cfg>");
+    EXPECT_EQ(3, bad.status);
+    EXPECT_THAT(bad.err, StartsWith("kxconfig: -:2: "));
+    EXPECT_EQ(3, ToolWithInput({"get", "-", "cfg.a"}, "").status);
+    const Outcome piped =
+        RunShell("echo '<cfg><a>1</a></cfg>' | " + InShell(KX_CONFIG_TOOL) + " get - cfg.a");
+    EXPECT_EQ("1\n", piped.out);
 }
 
 TEST_F(KxconfigGet, SaysWhyAFileCannotBeRead)

@@ -104,6 +104,15 @@ TEST_F(KxconfigJson, ExplainGivesNoLocationOfMoreThanFiveHundredBytes)
     EXPECT_EQ(name, element.at("step"));
 }
 
+TEST_F(KxconfigJson, GetNamesTheKeyWhereThereAreSeveral)
+{
+    const json answer = Answer({"get", "--default", "d", m_file, "cfg.net@id=2.ip", "cfg.x"});
+    const json expected = {
+        {{"key", "cfg.net@id=2.ip"}, {"location", "/cfg/net[2]/ip"}, {"line", 3}, {"value", "b"}},
+        {{"key", "cfg.x"}, {"location", nullptr}, {"line", nullptr}, {"value", "d"}}};
+    EXPECT_EQ(expected, answer.at("results"));
+}
+
 TEST_F(KxconfigJson, ExplainGivesEachStep)
 {
     const json results = Answer({"explain", m_file, "cfg.net@id=2.ip"}).at("results");

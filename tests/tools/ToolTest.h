@@ -26,7 +26,14 @@ protected:
                                 const std::vector<std::string>& environment = {})
     {
         const kxtest::Environment changed(environment);
-        std::istringstream in;
+        return ToolWithInput(arguments, "");
+    }
+
+    /** The same with @p input as standard input. */
+    static kxtest::Outcome ToolWithInput(const std::vector<std::string>& arguments,
+                                         const std::string& input)
+    {
+        std::istringstream in(input);
         std::ostringstream out;
         std::ostringstream err;
         const int status = ::Run(arguments, in, out, err);

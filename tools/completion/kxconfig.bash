@@ -102,6 +102,7 @@ _kxconfig_offer_options()
         keys) options+=(--all) ;;
         explain) options+=(--set) ;;
         check) options+=(--notes --only --ignore --kinds) ;;
+        get) options+=(--default --null) ;;
     esac
     _kxconfig_offer "${options[@]}"
 }
@@ -120,7 +121,7 @@ _kxconfig_offer_arguments()
     local verb= file= position=0 i
     for ((i = 1; i < ${#words[@]}; ++i)); do
         case ${words[i]} in
-            --log-mask | --output | --wait) ((++i)) ;;
+            --default | --log-mask | --output | --wait) ((++i)) ;;
             -*) ;;
             *)
                 ((++position))
@@ -136,7 +137,7 @@ _kxconfig_offer_arguments()
     case $position-$verb in
         0-*) _kxconfig_offer get set explain check keys find ;;
         1-*) _kxconfig_offer_files "" ;;
-        2-get | 2-set | 2-explain | *-check) _kxconfig_offer_keys "$file" ;;
+        *-get | 2-set | 2-explain | *-check) _kxconfig_offer_keys "$file" ;;
     esac
 }
 

@@ -98,8 +98,9 @@ struct CommandLine::Parser
     CLI::App app{"Reads and changes values of XML configuration files by key path.", "kxconfig"};
 };
 
-CommandLine::CommandLine() : m_parser(std::make_unique<Parser>())
+CommandLine::CommandLine(std::istream& input) : m_parser(std::make_unique<Parser>())
 {
+    m_parser->request.input = &input;
     CLI::App& app = m_parser->app;
     app.footer(HelpFooter());
     app.require_subcommand(0, 1); // so that an unknown one is named

@@ -3,6 +3,7 @@
 
 #include "output/ExitStatus.h"
 
+#include <iosfwd>
 #include <memory>
 #include <string>
 #include <vector>
@@ -13,7 +14,8 @@ class Report;
 class CommandLine
 {
 public:
-    CommandLine();
+    /** @param input  standard input. */
+    explicit CommandLine(std::istream& input);
     ~CommandLine();
     CommandLine(const CommandLine&) = delete;
     CommandLine& operator=(const CommandLine&) = delete;

@@ -31,15 +31,36 @@ CLI::App* AddCommand(CLI::App& app, const char* name, const char* description,
                      Request& request)
 {
     CLI::App* const command = app.add_subcommand(name, description);
-    command->add_option("FILE", arguments.file, "an XML file")
-        ->required()
-        ->check(CLI::Validator(StandardStreamError, ""));
+    command->add_option("FILE", arguments.file, "an XML file")->required();
     command->callback(
         [run, &arguments, &request]
         {
             request.file = arguments.file;
             request.command = [run, &arguments](Report& report) { return run(arguments, report); };
         });
+    return command;
+}
+
+/** The same of a command that changes the file, or needs its name. */
+template <class Arguments>
+CLI::App* AddFileCommand(CLI::App& app, const char* name, const char* description,
+                         ExitStatus (*run)(const Arguments&, Report&), Arguments& arguments,
+                         Request& request)
+{
+    CLI::App* const command = AddCommand(app, name, description, run, arguments, request);
+    command->get_option("FILE")->check(CLI::Validator(StandardStreamError, ""));
+    return command;
+}
+
+/** The same of a command that only reads: the file "-" is standard input. */
+template <class Arguments>
+CLI::App* AddReader(CLI::App& app, const char* name, const char* description,
+                    ExitStatus (*run)(const Arguments&, Report&), Arguments& arguments,
+                    Request& request)
+{
+    arguments.input = request.input;
+    CLI::App* const command = AddCommand(app, name, description, run, arguments, request);
+    command->get_option("FILE")->description("an XML file; - is standard input");
     return command;
 }
 
@@ -50,17 +71,22 @@ void AddKey(CLI::App& command, std::string& key)
 
 void AddGet(CLI::App& app, Request& request)
 {
-    CLI::App* const get = AddCommand(app, "get", "print the value or values under a key path", Get,
-                                     request.get, request);
-    AddKey(*get, request.get.key);
+    GetArguments& arguments = request.get;
+    CLI::App* const get =
+        AddReader(app, "get", "print the value or values under key paths", Get, arguments, request);
+    get->add_option("KEY", arguments.keys, "a key path: root.element@attribute=value.element")
+        ->required();
+    get->add_option("--default", arguments.defaultValue, "the value of a key that has none")
+        ->type_name("TEXT");
+    get->add_flag("-z,--null", arguments.endWithNul, "end each value with NUL, not a line end");
 }
 
 void AddSet(CLI::App& app, Request& request)
 {
     SetArguments& arguments = request.set;
-    CLI::App* const set =
-        AddCommand(app, "set", "replace the text under a key path, print what changed, and save",
-                   Set, arguments, request);
+    CLI::App* const set = AddFileCommand(
+        app, "set", "replace the text under a key path, print what changed, and save", Set,
+        arguments, request);
     AddKey(*set, arguments.key);
     set->add_option("VALUE", arguments.value, "the new text, as XML: write & as &amp;")->required();
     set->add_flag("--dry-run", arguments.dryRun, "show what would change and save nothing");
@@ -80,8 +106,8 @@ void AddSet(CLI::App& app, Request& request)
 void AddExplain(CLI::App& app, Request& request)
 {
     CLI::App* const explain =
-        AddCommand(app, "explain", "explain level by level what a lookup of a key path finds",
-                   Explain, request.explain, request);
+        AddReader(app, "explain", "explain level by level what a lookup of a key path finds",
+                  Explain, request.explain, request);
     AddKey(*explain, request.explain.key);
     explain->add_flag("--set", request.explain.isUpdate,
                       "explain what an update would reach; changes nothing");
@@ -117,8 +143,8 @@ void AddKinds(CLI::App& command, const char* name, std::set<Kind>& kinds, const 
 void AddCheck(CLI::App& app, Request& request)
 {
     Selection& selection = request.check.selection;
-    CLI::App* const check = AddCommand(app, "check", "report pitfalls for lookups and updates",
-                                       Check, request.check, request);
+    CLI::App* const check = AddFileCommand(app, "check", "report pitfalls for lookups and updates",
+                                           Check, request.check, request);
     check->add_option("KEY", request.check.keys, "key paths to check instead of the whole file");
     check->add_flag("--notes", selection.notes, "also print notes, which are not warnings");
     AddKinds(*check, "--only", selection.only, "print this kind only, be it a warning or a note");
@@ -128,15 +154,15 @@ void AddCheck(CLI::App& app, Request& request)
 
 void AddKeys(CLI::App& app, Request& request)
 {
-    AddCommand(app, "keys", "print every key path that has a value in the file", Keys, request.keys,
-               request)
+    AddReader(app, "keys", "print every key path that has a value in the file", Keys, request.keys,
+              request)
         ->add_flag("--all", request.keys.all, "print all values of a key, not only the first ten");
 }
 
 void AddFind(CLI::App& app, Request& request)
 {
-    AddCommand(app, "find", "print the nodes that an XPath expression selects, or its value", Find,
-               request.find, request)
+    AddReader(app, "find", "print the nodes that an XPath expression selects, or its value", Find,
+              request.find, request)
         ->add_option("XPATH", request.find.expression, "an XPath 1.0 expression")
         ->required();
 }

@@ -25,6 +25,7 @@ struct Request
     CheckArguments check;
     KeysArguments keys;
     FindArguments find;
+    std::istream* input = nullptr; ///< standard input
     std::string logMask;
     bool trace = false;
     std::string file;                           ///< of the command

@@ -11,9 +11,10 @@
 namespace
 {
 
-ExitStatus RunCommand(const std::vector<std::string>& arguments, Report& report)
+ExitStatus RunCommand(const std::vector<std::string>& arguments, std::istream& input,
+                      Report& report)
 {
-    CommandLine commandLine;
+    CommandLine commandLine(input);
     if (!commandLine.Parse(arguments, report))
     {
         return ExitStatus::Done;
@@ -23,11 +24,12 @@ ExitStatus RunCommand(const std::vector<std::string>& arguments, Report& report)
     return commandLine.RunCommand(report);
 }
 
-ExitStatus RunOrComplain(const std::vector<std::string>& arguments, Report& report)
+ExitStatus RunOrComplain(const std::vector<std::string>& arguments, std::istream& input,
+                         Report& report)
 {
     try
     {
-        return RunCommand(arguments, report);
+        return RunCommand(arguments, input, report);
     }
     catch (const Failure& failure)
     {
@@ -38,13 +40,13 @@ ExitStatus RunOrComplain(const std::vector<std::string>& arguments, Report& repo
 
 } // namespace
 
-int Run(const std::vector<std::string>& arguments, std::istream& /*input*/, std::ostream& output,
+int Run(const std::vector<std::string>& arguments, std::istream& input, std::ostream& output,
         std::ostream& errors)
 {
     Report report(output, errors);
     try
     {
-        return static_cast<int>(report.Finish(RunOrComplain(arguments, report)));
+        return static_cast<int>(report.Finish(RunOrComplain(arguments, input, report)));
     }
     catch (const std::bad_alloc&)
     {

@@ -47,8 +47,9 @@ std::string CompareRoot(const xmlNode* root, const std::string& key)
     }
     if (!kx::SameText(root->name, split.First()))
     {
-        return "the key starts with " + Quoted(Text(split.First())) + ", not with the root's name " +
-               Quoted(Text(root->name)) + ": nothing is searched, which counts as success";
+        return "the key starts with " + Quoted(Text(split.First())) +
+               ", not with the root's name " + Quoted(Text(root->name)) +
+               ": nothing is searched, which counts as success";
     }
     return "the key starts with the root's name";
 }
@@ -149,7 +150,7 @@ ExitStatus ExplainUpdate(CXMLReader& reader, const std::string& key, Report& rep
 
 ExitStatus Explain(const ExplainArguments& arguments, Report& report)
 {
-    const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file);
+    const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file, arguments.input);
     const xmlNode* const root = RootOf(*reader);
     report.Add(RootEvent{root, CompareRoot(root, arguments.key)});
     return arguments.isUpdate ? ExplainUpdate(*reader, arguments.key, report)

@@ -3,6 +3,7 @@
 
 #include "output/ExitStatus.h"
 
+#include <iosfwd>
 #include <string>
 
 class Report;
@@ -10,6 +11,7 @@ class Report;
 struct ExplainArguments
 {
     std::string file;
+    std::istream* input = nullptr; ///< what the file "-" stands for
     std::string key;
     bool isUpdate = false; ///< explain an update, not a lookup
 };

@@ -193,7 +193,7 @@ Result Evaluate(CXmlParser& document, const std::string& expression)
 ExitStatus Find(const FindArguments& arguments, Report& report)
 {
     CXmlParser document;
-    LoadDocument(arguments.file, document);
+    LoadDocument(arguments.file, document, arguments.input);
     const Result result = Evaluate(document, arguments.expression);
     if (result->type != XPATH_NODESET)
     {

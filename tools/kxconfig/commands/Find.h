@@ -3,6 +3,7 @@
 
 #include "output/ExitStatus.h"
 
+#include <iosfwd>
 #include <string>
 
 class Report;
@@ -10,7 +11,8 @@ class Report;
 struct FindArguments
 {
     std::string file;
-    std::string expression; ///< XPath 1.0
+    std::istream* input = nullptr; ///< what the file "-" stands for
+    std::string expression;        ///< XPath 1.0
 };
 
 /** kxconfig find: prints each node that an expression selects, or the value that it has. */

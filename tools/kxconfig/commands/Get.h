@@ -3,17 +3,23 @@
 
 #include "output/ExitStatus.h"
 
+#include <iosfwd>
+#include <optional>
 #include <string>
+#include <vector>
 
 class Report;
 
 struct GetArguments
 {
     std::string file;
-    std::string key;
+    std::istream* input = nullptr; ///< what the file "-" stands for
+    std::vector<std::string> keys;
+    std::optional<std::string> defaultValue; ///< of a key that gives nothing
+    bool endWithNul = false;                 ///< end each value with NUL, not with a line end
 };
 
-/** kxconfig get: prints the value or values under a key, one on a line. */
+/** kxconfig get: prints the value or values under keys, one on a line. */
 ExitStatus Get(const GetArguments& arguments, Report& report);
 
 #endif

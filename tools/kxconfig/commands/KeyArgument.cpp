@@ -4,6 +4,7 @@
 #include "file/Nodes.h"
 #include "output/Failure.h"
 #include "output/Quoting.h"
+#include "walk/Trail.h"
 
 #include "config/KeyPath.h"
 
@@ -17,15 +18,19 @@ void RequireWellFormedKey(const std::string& key)
     }
 }
 
+std::string CompareWithRoot(const std::string& key, const std::string& file, CXMLReader& reader)
+{
+    const kx::TextView first = kx::KeySplit(kx::TextView(key)).First();
+    return "the key starts with " + Quoted(Text(first)) + ", but the root element of " + file +
+           " is " + Quoted(Text(RootOf(reader)->name));
+}
+
 void RequireKey(const std::string& key, const std::string& file, CXMLReader& reader)
 {
     RequireWellFormedKey(key);
-    const xmlNode* const root = RootOf(reader);
-    const kx::TextView first = kx::KeySplit(kx::TextView(key)).First();
-    if (!kx::SameText(root->name, first))
+    if (!StartsAtRoot(DocumentOf(reader), key))
     {
         throw Failure(ExitStatus::NothingFound,
-                      "nothing found: the key starts with " + Quoted(Text(first)) +
-                          ", but the root element of " + file + " is " + Quoted(Text(root->name)));
+                      "nothing found: " + CompareWithRoot(key, file, reader));
     }
 }

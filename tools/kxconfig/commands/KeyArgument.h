@@ -8,6 +8,9 @@ class CXMLReader;
 /** Throws a Failure unless @p key names the root element and at least one more. */
 void RequireWellFormedKey(const std::string& key);
 
+/** @return that @p key starts with another name than the root of @p reader, which is @p file. */
+std::string CompareWithRoot(const std::string& key, const std::string& file, CXMLReader& reader);
+
 /**
  * The same, and requires that @p key starts with the name of the root of @p reader: to the library
  * itself another name is success.

@@ -71,7 +71,7 @@ KeyAndValue Describe(const std::string& key, Elements elements, bool all)
 
 ExitStatus Keys(const KeysArguments& arguments, Report& report)
 {
-    const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file);
+    const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file, arguments.input);
     const xmlNode* const root = RootOf(*reader);
     Levels levels(root->doc);
     KeyValues values(root, levels);

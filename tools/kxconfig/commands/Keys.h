@@ -3,6 +3,7 @@
 
 #include "output/ExitStatus.h"
 
+#include <iosfwd>
 #include <string>
 
 class Report;
@@ -10,7 +11,8 @@ class Report;
 struct KeysArguments
 {
     std::string file;
-    bool all = false; ///< print every value under a key that has many
+    std::istream* input = nullptr; ///< what the file "-" stands for
+    bool all = false;              ///< print every value under a key that has many
 };
 
 /** kxconfig keys: prints every key path under which a file holds a value, with that value. */

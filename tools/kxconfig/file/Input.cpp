@@ -1,6 +1,7 @@
 #include "file/Input.h"
 
 #include <cstdio>
+#include <istream>
 
 #include <fcntl.h>
 #include <sys/mman.h>
@@ -45,7 +46,18 @@ std::string ReadSome(int file)
     return bytes;
 }
 
-Descriptor CopyToMemory(int file, size_t most)
+/** The same of a stream. */
+std::string ReadSome(std::istream& stream)
+{
+    std::string bytes(65536, '\0');
+    stream.read(bytes.data(), static_cast<std::streamsize>(bytes.size()));
+    bytes.resize(static_cast<size_t>(stream.gcount()));
+    return bytes;
+}
+
+/** @param source  a descriptor or a stream. */
+template <class Source>
+Descriptor CopyToMemory(Source& source, size_t most)
 {
     Descriptor copy(memfd_create("kxconfig", MFD_CLOEXEC));
     if (!copy)
@@ -53,7 +65,7 @@ Descriptor CopyToMemory(int file, size_t most)
         ThrowSystemError();
     }
     size_t size = 0;
-    for (std::string bytes = ReadSome(file); !bytes.empty(); bytes = ReadSome(file))
+    for (std::string bytes = ReadSome(source); !bytes.empty(); bytes = ReadSome(source))
     {
         size += bytes.size();
         if (size > most)
@@ -84,7 +96,13 @@ Input::Input(const std::string& path, size_t most) : m_path(AsFileName(path))
     }
     if (S_ISFIFO(status.st_mode))
     {
-        m_copy = CopyToMemory(file.Get(), most);
+        const int pipe = file.Get();
+        m_copy = CopyToMemory(pipe, most);
         m_path = m_copy.NameInProc();
     }
+}
+
+Input::Input(std::istream& stream, size_t most)
+    : m_copy(CopyToMemory(stream, most)), m_path(m_copy.NameInProc())
+{
 }

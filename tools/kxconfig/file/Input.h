@@ -3,6 +3,7 @@
 
 #include "file/Descriptor.h"
 
+#include <iosfwd>
 #include <string>
 
 /**
@@ -23,11 +24,14 @@ public:
      */
     explicit Input(const std::string& path, size_t most = kMostFromPipe);
 
+    /** The same of a stream, such as standard input. */
+    explicit Input(std::istream& stream, size_t most = kMostFromPipe);
+
     /** @return what the library is to load, valid while this object lives: never a URL. */
     const std::string& Path() const { return m_path; }
 
 private:
-    Descriptor m_copy; ///< in memory, of a pipe
+    Descriptor m_copy; ///< in memory, of a pipe or a stream
     std::string m_path;
 };
 

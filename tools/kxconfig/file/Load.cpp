@@ -29,11 +29,11 @@ Failure NotRead(const std::string& path, const std::error_code& error)
                   path + ":" + (error.IsNone() ? " not parsed" : error.Text()));
 }
 
-Input Open(const std::string& path)
+Input Open(const std::string& path, std::istream* standardInput)
 {
     try
     {
-        return Input(path);
+        return standardInput != nullptr && path == "-" ? Input(*standardInput) : Input(path);
     }
     catch (const std::system_error& error)
     {
@@ -43,9 +43,9 @@ Input Open(const std::string& path)
 
 } // namespace
 
-std::unique_ptr<CXMLReader> LoadFile(const std::string& path)
+std::unique_ptr<CXMLReader> LoadFile(const std::string& path, std::istream* standardInput)
 {
-    const Input input = Open(path);
+    const Input input = Open(path, standardInput);
     const FirstEngineError error;
     std::unique_ptr<CXMLReader> reader(GetCXMLReaderObject(input.Path().c_str()));
     if (reader == nullptr)
@@ -59,9 +59,9 @@ std::unique_ptr<CXMLReader> LoadFile(const std::string& path)
     return reader;
 }
 
-void LoadDocument(const std::string& path, CXmlParser& document)
+void LoadDocument(const std::string& path, CXmlParser& document, std::istream* standardInput)
 {
-    const Input input = Open(path);
+    const Input input = Open(path, standardInput);
     const FirstEngineError error;
     if (document.ParseXml(input.Path()) != 0)
     {

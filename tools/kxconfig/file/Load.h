@@ -5,6 +5,7 @@
 #include "CXMLWriter.h"
 #include "CXmlParser.h"
 
+#include <iosfwd>
 #include <memory>
 #include <string>
 
@@ -14,13 +15,16 @@ struct _xmlDoc;
  * Loads a file of this machine; URLs and other names that the engine would fetch are not files. A
  * pipe is read to its end.
  *
+ * @param standardInput  what the path "-" stands for; if null, it is a file's name.
  * @return a reader that holds a document.
  * @throws Failure with the line number if the file is not well-formed.
  */
-std::unique_ptr<CXMLReader> LoadFile(const std::string& path);
+std::unique_ptr<CXMLReader> LoadFile(const std::string& path,
+                                     std::istream* standardInput = nullptr);
 
 /** Loads a file in the same way into a document of the toolkit. */
-void LoadDocument(const std::string& path, CXmlParser& document);
+void LoadDocument(const std::string& path, CXmlParser& document,
+                  std::istream* standardInput = nullptr);
 
 /** @return the document that @p reader holds. */
 _xmlDoc* DocumentOf(CXMLReader& reader);

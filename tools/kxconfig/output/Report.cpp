@@ -80,6 +80,14 @@ void Report::AddLine(const std::string& line)
     }
 }
 
+void Report::AddBytes(const std::string& bytes)
+{
+    if (!m_isJson)
+    {
+        *m_output << bytes;
+    }
+}
+
 void Report::AddJson(Json result)
 {
     if (m_isJson)

@@ -56,6 +56,7 @@ public:
 
     /** For what exists in one form only: nothing happens if the other one was asked for. */
     void AddLine(const std::string& line);
+    void AddBytes(const std::string& bytes);
     void AddJson(Json result);
 
     /** Prints "kxconfig: " and @p message to the errors, on one line regardless of its content. */
