@@ -82,7 +82,8 @@ protected:
         return terminal >= 0;
     }
 
-    const std::set<std::string> m_verbs = {"check", "explain", "find", "get", "keys", "set"};
+    const std::set<std::string> m_verbs = {"check", "diff", "explain", "find",
+                                           "get",   "keys", "set"};
     kxtest::TemporaryFolder m_folder;
 };
 

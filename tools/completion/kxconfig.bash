@@ -135,8 +135,8 @@ _kxconfig_offer_arguments()
         return
     fi
     case $position-$verb in
-        0-*) _kxconfig_offer get set explain check keys find ;;
-        1-*) _kxconfig_offer_files "" ;;
+        0-*) _kxconfig_offer get set explain check keys find diff ;;
+        1-* | 2-diff) _kxconfig_offer_files "" ;;
         *-get | 2-set | 2-explain | *-check) _kxconfig_offer_keys "$file" ;;
     esac
 }

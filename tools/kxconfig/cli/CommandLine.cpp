@@ -134,7 +134,7 @@ bool CommandLine::Parse(const std::vector<std::string>& arguments, Report& repor
     }
     if (!m_parser->request.command)
     {
-        throw BadUsage("a command is required: get, set, explain, check, keys or find");
+        throw BadUsage("a command is required: get, set, explain, check, keys, find or diff");
     }
     report.SetSubject(app.get_subcommands().front()->get_name(), m_parser->request.file);
     return true;

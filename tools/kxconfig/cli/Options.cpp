@@ -167,6 +167,20 @@ void AddFind(CLI::App& app, Request& request)
         ->required();
 }
 
+void AddDiff(CLI::App& app, Request& request)
+{
+    DiffArguments& arguments = request.diff;
+    const auto onlyOneInput = [&arguments](const std::string& other)
+    {
+        return other == "-" && arguments.file == "-" ? "only one of two files can be standard input"
+                                                     : std::string();
+    };
+    AddReader(app, "diff", "compare two files key by key", Diff, arguments, request)
+        ->add_option("OTHER", arguments.other, "the file to compare with")
+        ->required()
+        ->check(CLI::Validator(onlyOneInput, ""));
+}
+
 void AddGeneralOptions(CLI::App& app, Request& request)
 {
     app.set_version_flag("--version", "kxconfig " KX_VERSION);
@@ -189,4 +203,5 @@ void AddOptions(CLI::App& app, Request& request)
     AddCheck(app, request);
     AddKeys(app, request);
     AddFind(app, request);
+    AddDiff(app, request);
 }

@@ -2,6 +2,7 @@
 #define KX_TOOLS_OPTIONS_H
 
 #include "commands/Check.h"
+#include "commands/Diff.h"
 #include "commands/Explain.h"
 #include "commands/Find.h"
 #include "commands/Get.h"
@@ -25,6 +26,7 @@ struct Request
     CheckArguments check;
     KeysArguments keys;
     FindArguments find;
+    DiffArguments diff;
     std::istream* input = nullptr; ///< standard input
     std::string logMask;
     bool trace = false;

@@ -29,6 +29,7 @@ const Example kExamples[] = {
     {"set device.xml cfg.name box", "change it and save the file"},
     {"set device.xml cfg.offset -- -5", "a value that starts with a dash"},
     {"keys device.xml", "print all keys and values"},
+    {"diff old.xml new.xml", "print the keys whose values differ"},
     {"find device.xml '//net[@id]'", "print the nodes that XPath selects"},
     {"--json get device.xml cfg.name", "print JSON, for scripts"},
 };
