@@ -23,7 +23,7 @@ done
 positionals()
 {
     "$tool" "$1" --help |
-        sed -nE '/^Positionals:/,/^$/s/^  ([A-Z]+) TEXT (REQUIRED|\.\.\.) +(.*)/\1 \3/p'
+        sed -nE '/^Positionals:/,/^$/s/^  ([A-Z]+) TEXT( \.\.\.)?( REQUIRED)? +(.*)/\1 \4/p'
 }
 
 # What the page says of a command: up to the next one's heading.
