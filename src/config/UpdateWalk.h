@@ -43,7 +43,12 @@ public:
         {
             next = AfterLevel();
         }
-        return next != 0 && StandOn(next);
+        if (next == 0)
+        {
+            return false;
+        }
+        StandOn(next);
+        return true;
     }
 
     xmlNode* Element() const { return m_element; }
@@ -74,12 +79,11 @@ private:
         KX_LOG_OF(LogLevelValue, "XMLSetValue", "Key :: %s", key.data);
     }
 
-    bool StandOn(xmlNode* element)
+    void StandOn(xmlNode* element)
     {
         m_element = element;
         m_isNamed = m_wanted->Names(element);
         m_isSelected = m_isNamed && m_wanted->condition.Admits(element);
-        return true;
     }
 
     xmlNode* First()

@@ -269,6 +269,14 @@ TEST_F(LookupTest, TextNodeWithoutContentIsAnEmptyValue)
     EXPECT_EQ("old\n\n1", value); // the empty value is appended like any other
 }
 
+TEST_F(LookupTest, EmptyValueOfAnotherBranchIsNotSeparated)
+{
+    Load("<cfg><a><b>1</b></a><a><b>x</b></a><a><b>3</b></a></cfg>");
+    const xmlNodePtr second = Root()->children->next->children;
+    xmlNodeSetContent(second->children, nullptr);
+    EXPECT_EQ(Found("1\n3", "1\n\n3"), Ask("cfg.a.b"));
+}
+
 TEST_F(LookupTest, EmptyValueAloneCountsAsFound)
 {
     Load("<cfg><a>x</a></cfg>");
