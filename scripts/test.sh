@@ -8,12 +8,13 @@
 #   package  the Debian packages: installs them into a scratch root, uses and removes them
 #   abi98    all tests with the target's kind of standard library (shared strings, a linear list::size)
 #   engine   all tests with the newest libxml2 that Debian has as a source package
+#   engines  the library's suites with each libxml2-VERSION.tar.xz in the folder KX_ENGINE_ARCHIVES
 #   arm      all tests for ARMv7-A, in both calling conventions, under qemu-arm; the library's size
 #   proof    full coverage of lines and branches; Valgrind; ThreadSanitizer; a short run of each fuzz target
 #   speed    the instructions of key operations, compared with the accepted counts
 #   docs     the reference, without a warning of Doxygen; the recording of a new user's first steps
 #   host     fast and package; the default
-#   all      all stages; CI runs this
+#   all      all stages, engines only if KX_ENGINE_ARCHIVES is set; CI runs this
 . "$(dirname "$0")/common.sh"
 
 # run_preset NAME — configures, builds and tests with the preset; prints details only of failures.
@@ -62,6 +63,10 @@ stage_engine() {
     run_preset engine
 }
 
+stage_engines() {
+    scripts/test_engines.sh "${KX_ENGINE_ARCHIVES:?names a folder of libxml2-VERSION.tar.xz}"
+}
+
 stage_arm() {
     need "${build_packages[@]}" "${test_packages[@]}" googletest \
         g++-arm-linux-gnueabihf g++-arm-linux-gnueabi qemu-user
@@ -107,6 +112,7 @@ stage_all() {
     stage_proof
     stage_abi98
     stage_engine
+    [ -z "${KX_ENGINE_ARCHIVES:-}" ] || stage_engines
     stage_arm
 }
 
@@ -114,7 +120,7 @@ stage_all() {
 for stage in "$@"; do
     declare -F "stage_$stage" >/dev/null ||
         {
-            echo "$0: no stage \"$stage\"; there are fast, style, sanitize, package, abi98, engine, arm, proof," \
+            echo "$0: no stage \"$stage\"; there are fast, style, sanitize, package, abi98, engine, engines, arm, proof," \
                 "speed, docs, host, all" >&2
             exit 2
         }
