@@ -14,6 +14,7 @@ namespace
 struct Ledger
 {
     std::atomic<std::size_t> requests{0};
+    std::atomic<std::size_t> bytes{0};
     std::atomic<long> live{0};
     std::atomic<std::size_t> failAt{0}; // requests left until the one that fails; 0: none
     std::atomic<bool> failed{false};
@@ -31,6 +32,7 @@ struct Ledger
 
     void* Allocate(std::size_t size)
     {
+        bytes += size;
         void* const memory = Refuses() ? nullptr : std::malloc(size == 0 ? 1 : size);
         live += memory != nullptr;
         return memory;
@@ -124,7 +126,7 @@ void operator delete[](void* memory, const std::nothrow_t&) noexcept
 namespace kxtest
 {
 
-NewCounter::NewCounter() : m_requests(g_new.requests), m_live(g_new.live)
+NewCounter::NewCounter() : m_requests(g_new.requests), m_bytes(g_new.bytes), m_live(g_new.live)
 {
 }
 NewCounter::~NewCounter()
@@ -134,6 +136,10 @@ NewCounter::~NewCounter()
 std::size_t NewCounter::Requests() const
 {
     return g_new.requests - m_requests;
+}
+std::size_t NewCounter::Bytes() const
+{
+    return g_new.bytes - m_bytes;
 }
 long NewCounter::Live() const
 {

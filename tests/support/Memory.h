@@ -21,6 +21,9 @@ public:
     /** @return requests since construction, the failed one included. */
     std::size_t Requests() const;
 
+    /** @return the bytes that were requested since construction. */
+    std::size_t Bytes() const;
+
     /** @return requests since construction that were not given back, by delete. */
     long Live() const;
 
@@ -32,6 +35,7 @@ public:
 
 private:
     std::size_t m_requests;
+    std::size_t m_bytes;
     long m_live;
 };
 

@@ -41,6 +41,16 @@ void Update(CXMLWriter& writer, const SetArguments& arguments)
     }
 }
 
+/** Of an entity that contains itself, or multiplies, no text can be compared: the file would not
+ * load. */
+void RequireTexts(CXMLReader& reader, const SetArguments& arguments, const Destination& destination)
+{
+    if (arguments.value.find('&') != std::string::npos)
+    {
+        RequireLoadsAgain(SavedBytes(reader), destination.Path());
+    }
+}
+
 struct Change
 {
     const ChangedText& text;
@@ -120,6 +130,7 @@ ExitStatus Set(const SetArguments& arguments, Report& report)
     RequireXmlText(arguments.value);
     RequireDeclaredEntities(arguments.value, DocumentOf(*reader));
     Update(writer.Get(), arguments);
+    RequireTexts(*reader, arguments, destination);
     const std::vector<ChangedText> changes = texts.Changes();
     const bool isSaved = !changes.empty() || SavesElsewhere(arguments);
     const ExitStatus status =

@@ -6,6 +6,8 @@
 
 #include <algorithm>
 #include <iterator>
+#include <unordered_set>
+#include <utility>
 
 namespace
 {
@@ -28,32 +30,37 @@ void AddDefaulted(const xmlDtd* dtd, std::map<std::string, Names>& defaulted)
     }
 }
 
-void AddOnce(const std::string& name, Names& names)
+struct NamedValue
 {
-    if (std::find(names.begin(), names.end(), name) == names.end())
-    {
-        names.push_back(name);
-    }
-}
+    std::string name;
+    std::string value;
+};
 
-/** @return the names by which a condition finds attributes of @p element: without a prefix. */
-Names AttributeNames(const xmlNode* element, const std::map<std::string, Names>& defaulted)
+/** @return the attributes that a condition finds in @p element: the first of each name, without its
+ * prefix, and the defaults of the others. */
+std::vector<NamedValue> NamedValuesOf(const xmlNode* element,
+                                      const std::map<std::string, Names>& defaulted)
 {
-    Names names;
+    std::vector<NamedValue> attributes;
+    std::unordered_set<std::string> names;
     for (const xmlAttr* attribute = element->properties; attribute != nullptr;
          attribute = attribute->next)
     {
-        AddOnce(Text(attribute->name), names);
-    }
-    const auto more = defaulted.find(Text(element->name));
-    if (more != defaulted.end())
-    {
-        for (const std::string& name : more->second)
+        if (names.insert(Text(attribute->name)).second)
         {
-            AddOnce(name, names);
+            const auto node = reinterpret_cast<const xmlNode*>(attribute);
+            attributes.push_back({Text(attribute->name), ContentOf(node)});
         }
     }
-    return names;
+    const auto more = defaulted.find(Text(element->name));
+    for (const std::string& name : more == defaulted.end() ? Names() : more->second)
+    {
+        if (names.insert(name).second && HasAttribute(element, name))
+        {
+            attributes.push_back({name, AttributeOf(element, name)});
+        }
+    }
+    return attributes;
 }
 
 bool ComesFirst(const Sibling& one, const Sibling& other)
@@ -103,7 +110,7 @@ Level::Level(const xmlNode* parent, const std::map<std::string, Names>& defaulte
         }
         for (const std::string& condition : ConditionsOf(node))
         {
-            m_fulfilling[name + condition].push_back(sibling);
+            namesakes.fulfilling[condition].push_back(sibling);
         }
         before = node;
     }
@@ -112,13 +119,14 @@ Level::Level(const xmlNode* parent, const std::map<std::string, Names>& defaulte
 std::string Level::SegmentOf(const xmlNode* element) const
 {
     const std::string name = Text(element->name);
-    if (m_byName.at(name).all.size() == 1)
+    const Namesakes& namesakes = m_byName.at(name);
+    if (namesakes.all.size() == 1)
     {
         return name;
     }
     for (const std::string& condition : ConditionsOf(element))
     {
-        if (m_fulfilling.at(name + condition).size() == 1)
+        if (namesakes.fulfilling.at(condition).size() == 1)
         {
             return name + condition;
         }
@@ -138,7 +146,7 @@ Siblings Level::SelectedBy(const std::string& segment) const
     {
         return namesakes->second.all;
     }
-    const Siblings& fulfilling = Fulfilling(segment);
+    const Siblings& fulfilling = namesakes->second.Fulfilling(segment.substr(split.name.size));
     const Siblings& suspended = namesakes->second.suspended;
     Siblings selected;
     std::set_union(fulfilling.begin(), fulfilling.end(), suspended.begin(), suspended.end(),
@@ -146,16 +154,17 @@ Siblings Level::SelectedBy(const std::string& segment) const
     return selected;
 }
 
-const Siblings& Level::Fulfilling(const std::string& segment) const
+const Siblings& Level::Namesakes::Fulfilling(const std::string& condition) const
 {
     static const Siblings kNone;
-    const auto found = m_fulfilling.find(segment);
-    return found == m_fulfilling.end() ? kNone : found->second;
+    const auto found = fulfilling.find(condition);
+    return found == fulfilling.end() ? kNone : found->second;
 }
 
 Order Level::OrderFor(const std::string& segment) const
 {
-    const std::string name = Text(kx::Segment(kx::TextView(segment)).name);
+    const kx::Segment split((kx::TextView(segment)));
+    const std::string name = Text(split.name);
     Order order;
     order.other = FirstNotNamed(name);
     const auto found = m_byName.find(name);
@@ -164,7 +173,7 @@ Order Level::OrderFor(const std::string& segment) const
         return order;
     }
     const Namesakes& namesakes = found->second;
-    const Siblings& fulfilling = Fulfilling(segment);
+    const Siblings& fulfilling = namesakes.Fulfilling(segment.substr(split.name.size));
     if (const Sibling* const taken = FirstExcept(fulfilling, namesakes.suspended))
     {
         order.taken = taken->element;
@@ -200,10 +209,9 @@ const xmlNode* Level::SuspenderOf(const Sibling& suspended, const Namesakes& nam
 std::vector<std::string> Level::ConditionsOf(const xmlNode* element) const
 {
     std::vector<std::string> conditions;
-    for (const std::string& name : AttributeNames(element, m_defaulted))
+    for (const auto& [name, value] : NamedValuesOf(element, m_defaulted))
     {
-        const std::string value = AttributeOf(element, name);
-        if (IsFreeOf(".|&=@", name) && IsFreeOf(".|&\t\r\n", value) && HasAttribute(element, name))
+        if (IsFreeOf(".|&=@", name) && IsFreeOf(".|&\t\r\n", value))
         {
             conditions.push_back("@" + name + "=" + value);
         }
@@ -228,12 +236,9 @@ const Level& Levels::Below(const xmlNode* parent)
 std::map<std::string, std::string> Levels::AttributesOf(const xmlNode* element) const
 {
     std::map<std::string, std::string> attributes;
-    for (const std::string& name : AttributeNames(element, m_defaulted))
+    for (NamedValue& attribute : NamedValuesOf(element, m_defaulted))
     {
-        if (HasAttribute(element, name))
-        {
-            attributes[name] = AttributeOf(element, name);
-        }
+        attributes.emplace(std::move(attribute.name), std::move(attribute.value));
     }
     return attributes;
 }

@@ -52,12 +52,15 @@ public:
 private:
     struct Namesakes
     {
+        /** @return those that fulfil @p condition, "@name=value". */
+        const Siblings& Fulfilling(const std::string& condition) const;
+
         Siblings all;
         Siblings suspended; ///< right after an element of another name: no condition rejects them
+        std::map<std::string, Siblings> fulfilling; ///< by condition
     };
 
     std::vector<std::string> ConditionsOf(const xmlNode* element) const;
-    const Siblings& Fulfilling(const std::string& segment) const;
     const xmlNode* FirstNotNamed(const std::string& name) const;
     const xmlNode* SuspenderOf(const Sibling& suspended, const Namesakes& namesakes) const;
 
@@ -65,7 +68,6 @@ private:
     std::vector<const xmlNode*> m_elements;
     const xmlNode* m_otherThanFirst = nullptr; ///< the first with another name than the first has
     std::map<std::string, Namesakes> m_byName;
-    std::map<std::string, Siblings> m_fulfilling; ///< by name and condition
 };
 
 /** The levels of a document, each sorted when it is first asked for. */

@@ -1,0 +1,177 @@
+// What a hostile file can make kxconfig cost. The fuzz target feeds it more of them; here are the
+// shapes whose cost grows faster than the file if something is done anew for each node.
+
+#include "ToolTest.h"
+
+#include "support/Memory.h"
+
+using kxtest::Outcome;
+
+namespace
+{
+
+/** "&x;" is @p levels times ten times as long as the first entity. */
+std::string Multiplying(int levels)
+{
+    std::string xml = "<!DOCTYPE c [<!ENTITY l0 \"lol\">";
+    for (int level = 1; level <= levels; ++level)
+    {
+        xml += "<!ENTITY l" + std::to_string(level) + " \"";
+        for (int i = 0; i != 10; ++i)
+        {
+            xml += "&l" + std::to_string(level - 1) + ";";
+        }
+        xml += "\">";
+    }
+    return xml + "]><c><a>t</a></c>";
+}
+
+/** Two elements with @p count attributes each, which @p name is the name of. */
+std::string ManyAttributes(std::size_t count, const std::string& name)
+{
+    std::string element = "<" + name;
+    for (std::size_t i = 0; i != count; ++i)
+    {
+        element += " a" + std::to_string(i) + "=\"\"";
+    }
+    element += ">x</" + name + ">";
+    return "<c>" + element + element + "</c>";
+}
+
+std::string ManySiblings(std::size_t count, const std::string& name)
+{
+    std::string xml = "<c>";
+    for (std::size_t i = 0; i != count; ++i)
+    {
+        xml += "<" + name + " i=\"" + std::to_string(i) + "\">x</" + name + ">";
+    }
+    return xml + "</c>";
+}
+
+std::string Deep(std::size_t count, const std::string& name)
+{
+    std::string xml = "<c>";
+    const std::size_t depth = 250;
+    for (std::size_t i = 0; i < count; i += depth)
+    {
+        for (std::size_t level = 0; level != depth; ++level)
+        {
+            xml += "<" + name + ">";
+        }
+        for (std::size_t level = 0; level != depth; ++level)
+        {
+            xml += "</" + name + ">";
+        }
+    }
+    return xml + "<" + name + ">x</" + name + "></c>";
+}
+
+std::string ManyEntities(std::size_t count, const std::string& name)
+{
+    std::string xml = "<!DOCTYPE c [";
+    std::string elements;
+    for (std::size_t i = 0; i != count; ++i)
+    {
+        const std::string entity = "e" + std::to_string(i);
+        xml += "<!ENTITY " + entity + " \"v\">";
+        elements += "<" + name + ">&" + entity + ";</" + name + ">";
+    }
+    return xml + "]><c>" + elements + "<" + name + ">x</" + name + "></c>";
+}
+
+struct Shape
+{
+    const char* name;
+    std::string (*make)(std::size_t count, const std::string& name);
+};
+
+std::ostream& operator<<(std::ostream& out, const Shape& shape)
+{
+    return out << shape.name;
+}
+
+} // namespace
+
+class KxconfigHostileFile : public ToolTest
+{
+protected:
+    void ExpectValueIsRefused(const std::string& xml, const std::string& value)
+    {
+        const std::string file = m_folder.Write("hostile.xml", xml);
+        const Outcome outcome = Tool({"set", file, "c.a", value});
+        EXPECT_EQ(4, outcome.status);
+        EXPECT_THAT(outcome.err, testing::HasSubstr("would no longer load, line 1: "));
+        EXPECT_EQ(xml, kxtest::ReadFile(file));
+    }
+};
+
+TEST_F(KxconfigHostileFile, AnEntityThatContainsItselfIsNoValue)
+{
+    ExpectValueIsRefused("<!DOCTYPE c [<!ENTITY x \"&y;\"><!ENTITY y \"&x;\">]><c><a>t</a></c>",
+                         "&x;");
+}
+
+TEST_F(KxconfigHostileFile, AnEntityThatMultipliesIsNoValue)
+{
+    ExpectValueIsRefused(Multiplying(9), "&l9;");
+}
+
+/** What a run costs that does not depend on the machine. */
+struct Cost
+{
+    std::size_t requests; ///< for memory
+    std::size_t output;
+};
+
+class KxconfigCost : public KxconfigHostileFile, public testing::WithParamInterface<Shape>
+{
+protected:
+    Cost Of(const std::string& command, const std::string& xml)
+    {
+        const std::string file = m_folder.Write("hostile.xml", xml);
+        std::vector<std::string> arguments = {command, file};
+        if (command == "get" || command == "explain")
+        {
+            arguments.emplace_back("c.a");
+        }
+        const kxtest::NewCounter ours;
+        const kxtest::EngineMemory engines;
+        const Outcome outcome = Tool(arguments);
+        return {ours.Requests() + engines.Requests(), outcome.out.size()};
+    }
+};
+
+// With twice the file four times the cost would be quadratic: 5/2 tells them apart. The bounds per
+// byte are those that the handbook states.
+TEST_P(KxconfigCost, IsLinearInTheFile)
+{
+    const std::size_t count = 2000;
+    const std::string small = GetParam().make(count, "a");
+    const std::string large = GetParam().make(2 * count, "a");
+    for (const char* const command : {"get", "keys", "check", "explain"})
+    {
+        const Cost less = Of(command, small);
+        const Cost more = Of(command, large);
+        const std::size_t fixed = 5000; // of any run
+        EXPECT_LT(more.requests, less.requests * 5 / 2 + fixed) << command;
+        EXPECT_LT(more.requests, 4 * large.size() + fixed) << command;
+        EXPECT_LT(more.output, less.output * 5 / 2 + fixed) << command;
+        EXPECT_LT(more.output, 30 * large.size() + fixed) << command;
+    }
+}
+
+INSTANTIATE_TEST_SUITE_P(Shapes, KxconfigCost,
+                         testing::Values(Shape{"attributes", ManyAttributes},
+                                         Shape{"siblings", ManySiblings}, Shape{"deep", Deep},
+                                         Shape{"entities", ManyEntities}),
+                         [](const testing::TestParamInfo<Shape>& shape)
+                         { return shape.param.name; });
+
+TEST_F(KxconfigHostileFile, ALongNameIsNotCopiedForEachAttribute)
+{
+    const std::string file =
+        m_folder.Write("long.xml", ManyAttributes(1000, std::string(40000, 'n')));
+    const kxtest::NewCounter ours;
+    EXPECT_EQ(0, Tool({"keys", file}).status);
+    EXPECT_LT(ours.Bytes(), std::size_t(20) << 20);
+}
