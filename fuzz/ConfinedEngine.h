@@ -9,8 +9,10 @@ namespace kxfuzz
 /**
  * Called by LLVMFuzzerInitialize(). From then on the engine prints nothing, and the process aborts
  * if it is about to read anything but a file in memory: no document may make the library do that.
+ *
+ * @param allowsCurrentFolder  whether it may read files in the current folder, too.
  */
-void ConfineEngine();
+void ConfineEngine(bool allowsCurrentFolder = false);
 
 } // namespace kxfuzz
 

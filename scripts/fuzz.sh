@@ -5,7 +5,7 @@
 # usage: fuzz.sh [TARGET [SECONDS]]
 . "$(dirname "$0")/common.sh"
 
-targets=(keypath document loader)
+targets=(keypath document loader client)
 seconds=${2:-20}
 if [ "${1:-all}" != all ]; then
     targets=("$1")
@@ -19,11 +19,11 @@ build_preset fuzz
 
 # fuzz TARGET
 fuzz() {
-    local target=$1 corpus=$build/corpus/$1 log=$build/$1.log
+    local target=$1 corpus=$PWD/$build/corpus/$1 log=$build/$1.log
     mkdir -p "$corpus"
-    if ! $build/fuzz/fuzz_"$target" "$corpus" fuzz/corpus/"$target" \
+    if ! $build/fuzz/fuzz_"$target" "$corpus" "$PWD/fuzz/corpus/$target" \
         -dict=fuzz/xml.dict -max_len=4096 -timeout=10 -rss_limit_mb=1024 -max_total_time="$seconds" \
-        -artifact_prefix=$build/findings/"$target"- -print_final_stats=1 >"$log" 2>&1; then
+        -artifact_prefix="$PWD/$build/findings/$target-" -print_final_stats=1 >"$log" 2>&1; then
         tail -n 60 "$log" >&2
         exit 1
     fi

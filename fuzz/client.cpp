@@ -1,0 +1,240 @@
+// The client's core: a file and the arguments of one run, and then what must hold of every file
+// that loads. The input is the arguments, one on a line, an empty line, and the file. The argument
+// FILE stands for the file's name.
+
+#include "CXMLReader.h"
+
+#include "ClientRuns.h"
+#include "ConfinedEngine.h"
+
+#include "support/Files.h"
+#include "support/Log.h"
+
+#include <libxml/tree.h>
+
+#include <cstdint>
+#include <memory>
+#include <set>
+
+using kxfuzz::Arguments;
+using kxfuzz::Client;
+using kxfuzz::Json;
+using kxfuzz::Outcome;
+using kxfuzz::Require;
+
+namespace
+{
+
+constexpr std::size_t kMostKeys = 12;
+constexpr std::size_t kMostNodes = 12;
+
+const kxfuzz::ScratchFolder& Scratch()
+{
+    static const kxfuzz::ScratchFolder folder;
+    return folder;
+}
+
+/** `get` and the library give the same under @p key. @return whether there is a value. */
+bool RequireSameValue(CXMLReader& reader, const std::string& key)
+{
+    std::string value;
+    const bool found = reader.GetValue(key, value) == 0 && kxfuzz::StartsAtRoot(reader, key);
+    const Outcome outcome = Client({"get", "--", "f.xml", key});
+    if (outcome.status == 0)
+    {
+        Require(found && outcome.out == value + "\n", "get and GetValue differ", key);
+    }
+    else
+    {
+        Require(!found && outcome.out.empty(), "get finds nothing and GetValue does", key);
+    }
+    return found;
+}
+
+/** Each listed key gives the value beside it. */
+void RequireListedValues(CXMLReader& reader)
+{
+    const Json results = Client({"keys", "--all", "--json", "f.xml"}).Answer()["results"];
+    for (std::size_t i = 0; i != std::min(results.size(), kMostKeys); ++i)
+    {
+        const auto key = results[i]["key"].get<std::string>();
+        const auto value = results[i]["value"].get<std::string>();
+        Require(RequireSameValue(reader, key), "a key is listed and not found", key);
+        std::string looked;
+        reader.GetValue(key, looked);
+        Require(looked == value, "a key is listed with another value", key);
+    }
+}
+
+/** @return whether the location is one that the library can evaluate: it registers no prefixes. */
+bool IsUnmarked(const Json& node)
+{
+    if (!node.contains("location") || !node["location"].is_string() || !node.contains("line"))
+    {
+        return false;
+    }
+    auto location = node["location"].get<std::string>();
+    for (auto at = location.find("::"); at != location.npos; at = location.find("::"))
+    {
+        location.erase(at, 2);
+    }
+    return location.find(':') == location.npos;
+}
+
+/** Each location selects one node, the one that was printed with it. */
+void RequireLocationsFindTheirNodes(const std::string& expression)
+{
+    const Outcome outcome = Client({"find", "--json", "--", "f.xml", expression});
+    const Json results = outcome.Answer()["results"];
+    for (std::size_t i = 0; i != std::min(results.size(), kMostNodes); ++i)
+    {
+        if (IsUnmarked(results[i]))
+        {
+            const auto location = results[i]["location"].get<std::string>();
+            const Json again = Client({"find", "--json", "--", "f.xml", location}).Answer();
+            Require(again["results"] == Json::array({results[i]}), "a location finds another node",
+                    location);
+        }
+    }
+}
+
+/** The elements that `explain --set` shows as reached. */
+class Foretelling
+{
+public:
+    explicit Foretelling(const std::string& key)
+    {
+        const Json answer = Client({"explain", "--set", "--json", "--", "f.xml", key}).Answer();
+        for (const Json& event : answer["results"])
+        {
+            Add(event);
+        }
+    }
+
+    bool Has(const std::string& location) const
+    {
+        return m_isSummed || m_locations.count(location) == 1;
+    }
+
+private:
+    /** A location is spelled out as steps, one for each level of the walk. */
+    void Add(const Json& event)
+    {
+        const auto depth = event["depth"].get<std::size_t>();
+        m_isSummed = m_isSummed || event["event"] == "more";
+        if (!event.contains("step"))
+        {
+            return;
+        }
+        const bool isElement = event["event"] == "element";
+        const auto step = event["step"].get<std::string>();
+        m_paths.resize(depth + 1);
+        m_paths[depth] = depth == 0  ? step
+                         : isElement ? m_paths[depth - 1] + "/" + step
+                                     : m_paths[depth - 1];
+        if (isElement && event["value"].is_string())
+        {
+            m_locations.insert(m_paths[depth]);
+        }
+    }
+
+    std::vector<std::string> m_paths; ///< by depth
+    std::set<std::string> m_locations;
+    bool m_isSummed = false; ///< some are only counted
+};
+
+/** What `set` reports is what has changed in the file, and was foretold. */
+void RequireHonestUpdate(const std::string& key, const std::string& value)
+{
+    const kxfuzz::LeafTexts before(kxtest::ReadFile("f.xml"));
+    const std::string content = kxtest::ReadFile("f.xml");
+    const Foretelling foretelling(key);
+    const Outcome outcome = Client({"set", "--json", "--", "f.xml", key, value});
+    const Json results = outcome.Answer()["results"];
+    if (outcome.status != 0)
+    {
+        Require(kxtest::ReadFile("f.xml") == content, "a failed update changed the file", key);
+        return;
+    }
+    kxfuzz::Changes reported;
+    for (const Json& change : results)
+    {
+        const auto location = change["location"].get<std::string>();
+        reported[location] = {change["before"], change["after"]};
+        Require(foretelling.Has(location), "a change was not foretold", location);
+    }
+    const kxfuzz::LeafTexts after(kxtest::ReadFile("f.xml"));
+    Require(after.Loaded(), "what was saved does not load", key);
+    Require(before.ChangesTo(after) == reported, "the report is not the difference", key);
+    kxtest::WriteFile("f.xml", content);
+}
+
+/** The text and the JSON of a run that changes nothing are about the same. */
+void RequireSameInJson(const Arguments& arguments, const Outcome& text)
+{
+    const Outcome outcome = Client(kxfuzz::WithJson(arguments));
+    Require(outcome.status == text.status, "with --json the status is another", "");
+    if (text.out.empty() == outcome.Answer()["results"].empty())
+    {
+        return;
+    }
+    // "nothing changed" and an empty value are lines of text without a result, or the reverse.
+    Require(arguments.front() == "get" || arguments.front() == "set" || text.status == 0,
+            "text and JSON differ", text.out);
+}
+
+void UseArguments(Arguments arguments)
+{
+    const std::string before = kxtest::ReadFile("f.xml");
+    const Outcome outcome = Client(arguments);
+    if (!kxfuzz::AsksForJson(arguments) && !arguments.empty() && outcome.status != 2)
+    {
+        Scratch().Clear();
+        kxtest::WriteFile("f.xml", before);
+        RequireSameInJson(arguments, outcome);
+    }
+    Scratch().Clear();
+    kxtest::WriteFile("f.xml", before);
+}
+
+/** @return the argument at @p index, or @p otherwise. */
+std::string At(const Arguments& arguments, std::size_t index, const char* otherwise)
+{
+    return index < arguments.size() ? arguments[index] : otherwise;
+}
+
+void UseFile(const Arguments& arguments)
+{
+    const auto reader = std::make_unique<CXMLReader>();
+    if (reader->ParseFile("f.xml") != 0)
+    {
+        const int badFile = 3;
+        Require(Client({"keys", "f.xml"}).status == badFile, "a file loads only in the client", "");
+        return;
+    }
+    RequireListedValues(*reader);
+    const bool isFind = At(arguments, 0, "") == "find";
+    const std::string key = At(arguments, isFind ? 4 : 2, "cfg.a");
+    RequireSameValue(*reader, key);
+    RequireLocationsFindTheirNodes(isFind ? At(arguments, 2, "//node()") : "//node()|//@*");
+    RequireHonestUpdate(key, At(arguments, 3, "new"));
+}
+
+} // namespace
+
+extern "C" int LLVMFuzzerInitialize(int*, char***)
+{
+    Scratch().Enter();
+    kxfuzz::ConfineEngine(true);
+    return 0;
+}
+
+extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
+{
+    const kxtest::LogRecorder log;
+    const kxfuzz::ClientCase subject(std::string(reinterpret_cast<const char*>(data), size));
+    kxtest::WriteFile("f.xml", subject.file);
+    UseArguments(subject.arguments);
+    UseFile(subject.arguments);
+    return 0;
+}
