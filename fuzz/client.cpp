@@ -12,6 +12,7 @@
 
 #include <libxml/tree.h>
 
+#include <algorithm>
 #include <cstdint>
 #include <memory>
 #include <set>
@@ -74,10 +75,9 @@ bool IsUnmarked(const Json& node)
         return false;
     }
     auto location = node["location"].get<std::string>();
-    for (auto at = location.find("::"); at != location.npos; at = location.find("::"))
-    {
-        location.erase(at, 2);
-    }
+    const std::string axis = "/namespace::";
+    const auto at = location.find(axis);
+    location.erase(std::min(at, location.size()), at == location.npos ? 0 : axis.size());
     return location.find(':') == location.npos;
 }
 
