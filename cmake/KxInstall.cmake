@@ -50,5 +50,15 @@ if(KX_BUILD_TOOLS)
     install(TARGETS kxconfig DESTINATION ${CMAKE_INSTALL_BINDIR} COMPONENT tools)
     install(FILES tools/completion/kxconfig.bash
         DESTINATION ${CMAKE_INSTALL_DATADIR}/bash-completion/completions RENAME kxconfig COMPONENT tools)
+    # zsh itself looks below each prefix in site-functions, but the packages of Debian have a folder of their own.
+    if(CMAKE_INSTALL_PREFIX STREQUAL "/usr")
+        set(zsh_folder vendor-completions)
+    else()
+        set(zsh_folder site-functions)
+    endif()
+    install(FILES tools/completion/kxconfig.zsh
+        DESTINATION ${CMAKE_INSTALL_DATADIR}/zsh/${zsh_folder} RENAME _kxconfig COMPONENT tools)
+    install(FILES tools/completion/kxconfig.fish
+        DESTINATION ${CMAKE_INSTALL_DATADIR}/fish/vendor_completions.d COMPONENT tools)
     install(FILES ${PROJECT_BINARY_DIR}/kxconfig.1 DESTINATION ${CMAKE_INSTALL_MANDIR}/man1 COMPONENT tools)
 endif()

@@ -41,7 +41,7 @@ build_packages=(g++ cmake ninja-build libxml2-dev libcli11-dev nlohmann-json3-de
 
 # For the tests of any build. The tests read files of the packages in the last line.
 test_packages=(clang git python3 libgtest-dev libgmock-dev pkg-config groff-base bsdutils
-    strace fontconfig-config shared-mime-info xkb-data)
+    strace zsh fish fontconfig-config shared-mime-info xkb-data)
 
 # For the benchmarks: measuring, the compared libraries, the plots.
 bench_packages=(libbenchmark-dev valgrind python3-matplotlib pkg-config

@@ -17,6 +17,10 @@ cp -a "$stage/prefix" "$stage/moved"
 # A file that pointed back would find nothing.
 cp -a "$stage/prefix" "$stage/kept" && rm -rf "$stage/prefix"
 
+prefix_of_build=$(sed -n 's/^CMAKE_INSTALL_PREFIX:PATH=//p' "$build/CMakeCache.txt")
+zsh_folder=site-functions
+if [ "$prefix_of_build" = /usr ]; then zsh_folder=vendor-completions; fi
+
 expected() {
     echo bin/kxconfig
     local header
@@ -27,6 +31,8 @@ expected() {
     printf "$libdir/lib%s\n" KX_Platform.so{,.1,.1.0.0} KX_XMLConfigParser.so{,."${version%%.*}",."$version"}
     echo "$libdir/pkgconfig/KX_XMLConfigParser.pc"
     echo share/bash-completion/completions/kxconfig
+    echo share/fish/vendor_completions.d/kxconfig.fish
+    echo "share/zsh/$zsh_folder/_kxconfig"
     echo share/doc/KX_XMLConfigParser/CHANGELOG.md
     echo share/man/man1/kxconfig.1
 }
@@ -35,7 +41,6 @@ found() {
     find "$1" ! -type d -printf '%P\n' | sed -E 's/(Targets-)[a-z]+\.cmake$/\1CONFIGURATION.cmake/' | sort
 }
 
-prefix_of_build=$(sed -n 's/^CMAKE_INSTALL_PREFIX:PATH=//p' "$build/CMakeCache.txt")
 diff <(expected | sort) <(found "$stage/kept")
 diff <(expected | sort) <(found "$stage/destdir$prefix_of_build")
 

@@ -42,6 +42,10 @@ for binary in "$root/usr/bin/kxconfig" "$root/usr/$libdir"/lib*.so.1; do
     fi
 done
 MANPATH=$root/usr/share/man man --where kxconfig >/dev/null || { echo "man finds no page of kxconfig"; exit 1; }
+for completion in bash-completion/completions/kxconfig zsh/vendor-completions/_kxconfig \
+    fish/vendor_completions.d/kxconfig.fish; do
+    [ -f "$root/usr/share/$completion" ] || { echo "no shell finds $completion"; exit 1; }
+done
 cmp "$source/CHANGELOG.md" "$root/usr/share/doc/KX_XMLConfigParser/CHANGELOG.md"
 for package in "$packages"/*.deb; do
     dpkg-deb --field "$package" Package Version Depends

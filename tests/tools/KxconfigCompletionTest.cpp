@@ -1,6 +1,9 @@
 #include "ToolTest.h"
 
+#include <algorithm>
+
 #include <sys/stat.h>
+#include <unistd.h>
 
 using namespace kxtest;
 
@@ -201,4 +204,101 @@ TEST_F(KxconfigTyped, KeysOfAFileWithAQuotedNameAreOffered)
     m_folder.Write("sp ace.xml", "<cfg><name>box</name></cfg>");
     EXPECT_EQ("kxconfig get sp\\ ace.xml cfg.name ", Completed("kxconfig get sp\\ ace.xml c"));
     EXPECT_EQ("kxconfig get \"sp ace.xml\" cfg.name ", Completed("kxconfig get \"sp ace.xml\" c"));
+}
+
+namespace
+{
+
+/** The completions for the other shells, where these are installed. */
+class KxconfigOtherShells : public ToolTest
+{
+protected:
+    const std::string m_bin = m_folder.Path("bin");
+    const std::string m_file =
+        m_folder.Write("odd.xml", "<cfg><net id=\"it's $(touch evil)\"><ip>b</ip></net><net/></cfg>");
+
+    void SetUp() override
+    {
+        ASSERT_EQ(0, mkdir(m_bin.c_str(), 0700));
+        ASSERT_EQ(0, symlink(KX_CONFIG_TOOL, (m_bin + "/kxconfig").c_str()));
+    }
+
+    static bool IsInstalled(const std::string& shell)
+    {
+        return access(("/usr/bin/" + shell).c_str(), X_OK) == 0;
+    }
+
+    /** Runs a command with kxconfig in PATH, in the folder. */
+    std::string InFolder(const std::vector<std::string>& command) const
+    {
+        const std::string script = "cd \"$1\" && export HOME=$1 PATH=$1/bin:$PATH; shift; \"$@\"";
+        std::vector<std::string> words = {"/bin/bash", "-c", script, "bash", m_folder.Path("")};
+        words.insert(words.end(), command.begin(), command.end());
+        return RunProgram(words).out;
+    }
+
+    /** @return the line as it is after the tab key. */
+    std::string InZsh(const std::string& line) const
+    {
+        InFolder({"mkdir", "-p", "functions"});
+        InFolder({"cp", KX_COMPLETIONS "/kxconfig.zsh", "functions/_kxconfig"});
+        InFolder({"rm", "-f", "answer"});
+        return InFolder({"zsh", "-f", KX_TYPE_IN_ZSH, m_folder.Path("functions"),
+                         m_folder.Path("answer"), line});
+    }
+
+    /** @return the words that fish offers. */
+    std::string InFish(const std::string& line) const
+    {
+        return InFolder({"fish", "--no-config", "-c",
+                         "source $argv[1]; complete -C $argv[2] | string replace -r '\\t.*' ''",
+                         KX_COMPLETIONS "/kxconfig.fish", line});
+    }
+};
+
+} // namespace
+
+TEST_F(KxconfigOtherShells, ZshOffersAndQuotes)
+{
+    if (!IsInstalled("zsh") || !HasTerminals())
+    {
+        GTEST_SKIP() << "needs zsh and a terminal";
+    }
+    EXPECT_EQ("kxconfig explain \n", InZsh("kxconfig ex"));
+    EXPECT_EQ("kxconfig get odd.xml \n", InZsh("kxconfig get od"));
+    EXPECT_EQ("kxconfig set --output=odd.xml \n", InZsh("kxconfig set --output=od"));
+    EXPECT_EQ("kxconfig get odd.xml cfg.net@id=it\\'s\\ \\$\\(touch\\ evil\\).ip \n",
+              InZsh("kxconfig get odd.xml cfg"));
+    EXPECT_EQ("kxconfig get odd.xml 'cfg.net@id=it'\\''s $(touch evil).ip' \n",
+              InZsh("kxconfig get odd.xml 'cfg"));
+    EXPECT_NE(0, access(m_folder.Path("evil").c_str(), F_OK));
+}
+
+TEST_F(KxconfigOtherShells, FishOffers)
+{
+    if (!IsInstalled("fish"))
+    {
+        GTEST_SKIP() << "needs fish";
+    }
+    EXPECT_EQ("explain\n", InFish("kxconfig ex"));
+    EXPECT_EQ("odd.xml\n", InFish("kxconfig get od"));
+    EXPECT_EQ("--output=odd.xml\n", InFish("kxconfig set --output=od"));
+    EXPECT_EQ("cfg.net@id=it's $(touch evil).ip\n", InFish("kxconfig get odd.xml c"));
+    EXPECT_NE(0, access(m_folder.Path("evil").c_str(), F_OK));
+}
+
+TEST_F(KxconfigCompletion, OffersAFewOfManyKeysWithoutCompletingTooMuch)
+{
+    std::string xml = "<cfg><a>1</a>";
+    for (int i = 0; i != 1000; ++i)
+    {
+        xml += "<net id='" + std::to_string(i) + "'><ip>x</ip></net>";
+    }
+    const std::string file = m_folder.Write("many.xml", xml + "<b>2</b></cfg>");
+    const Outcome offered = Tool({"--complete", "get", file, "cfg."});
+    EXPECT_EQ(500, std::count(offered.out.begin(), offered.out.end(), '\n'));
+    EXPECT_THAT(offered.out, testing::StartsWith("cfg.a\n"));
+    const Outcome nets = Tool({"--complete", "get", file, "cfg.net"});
+    EXPECT_EQ(500, std::count(nets.out.begin(), nets.out.end(), '\n'));
+    EXPECT_EQ("cfg.b\n", Tool({"--complete", "get", file, "cfg.b"}).out);
 }

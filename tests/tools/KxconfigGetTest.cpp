@@ -85,7 +85,7 @@ TEST_F(KxconfigGet, RefusesBadUsage)
     ExpectComplaint(Tool({"frobnicate", kGateway, "a.b"}), 2,
                     "unknown command \"frobnicate\"" + kUsage);
     ExpectComplaint(Tool({"explain", kGateway, "a.b", "frobnicate"}), 2,
-                    "The following argument was not expected: frobnicate" + kUsage);
+                    "VALUE requires --set" + kUsage);
     ExpectComplaint(Tool({"--frobnicate"}), 2,
                     "The following argument was not expected: --frobnicate" + kUsage);
     ExpectComplaint(Tool({"get"}), 2, "FILE is required" + kUsage);

@@ -1,8 +1,12 @@
 #include "ToolTest.h"
 
+#include <libxml/parser.h>
+
+#include <algorithm>
 #include <sstream>
 
 using namespace kxtest;
+using testing::AnyOf;
 using testing::HasSubstr;
 using testing::Not;
 
@@ -51,7 +55,7 @@ TEST_F(KxconfigUsage, ManPageTellsAllThatHelpLists)
 
 TEST_F(KxconfigUsage, ExitStatusesAreToldAlikeByHelpManPageAndDocumentation)
 {
-    const std::string help = Tool({"--help"}).out;
+    const std::string help = Tool({"--help"}, {"COLUMNS=1000"}).out;
     const std::string page = Tool({"--man"}).out;
     const std::string documentation = ReadFile(KX_TOOL_DOCUMENTATION);
     std::istringstream lines(help.substr(help.find("Exit status:\n") + 13));
@@ -116,4 +120,102 @@ TEST_F(KxconfigUsage, OnlyCommandsThatReadTakeStandardInput)
     const std::string message = "FILE: \"-\" is not a file name (kxconfig --help shows the usage)";
     ExpectComplaint(Tool({"set", "-", "a.b", "c"}), 2, message);
     ExpectComplaint(Tool({"check", "-"}), 2, message);
+}
+
+TEST_F(KxconfigUsage, ColorsAreChosen)
+{
+    const std::vector<std::string> explain = {"explain", m_plain, "cfg.net.ip"};
+    const auto colored = [&](const std::string& when, const std::string& variable)
+    {
+        std::vector<std::string> arguments = {"--color=" + when};
+        arguments.insert(arguments.end(), explain.begin(), explain.end());
+        const Outcome outcome = Tool(arguments, {"TERM=xterm", variable});
+        EXPECT_EQ(0, outcome.status);
+        return outcome.out.find("\x1B[32maccepted\x1B[0m") != std::string::npos;
+    };
+    EXPECT_TRUE(colored("always", "NO_COLOR="));
+    EXPECT_TRUE(colored("always", "NO_COLOR=1"));
+    EXPECT_FALSE(colored("never", "NO_COLOR="));
+    EXPECT_FALSE(colored("auto", "NO_COLOR=")); // no terminal
+    ExpectComplaint(
+        Tool({"--color", "red", "keys", m_plain}), 2,
+        "--color: \"red\" is not auto, always or never (kxconfig --help shows the usage)");
+}
+
+TEST_F(KxconfigUsage, VersionNamesTheRunningEngine)
+{
+    const long number = std::stol(xmlParserVersion);
+    const std::string engine = std::to_string(number / 10000) + "." +
+                               std::to_string(number / 100 % 100) + "." +
+                               std::to_string(number % 100);
+    EXPECT_EQ("kxconfig " KX_VERSION "\nlibxml2 " + engine + "\n", Tool({"--version"}).out);
+}
+
+TEST_F(KxconfigUsage, HelpOfACommandShowsItsOwnOptionsAndExamples)
+{
+    const std::string help = Tool({"find", "--help"}).out;
+    EXPECT_THAT(help, testing::StartsWith("usage: kxconfig find [options] FILE XPATH\n"));
+    EXPECT_THAT(help, HasSubstr("\n  XPATH     an XPath 1.0 expression\n"));
+    EXPECT_THAT(help, HasSubstr("kxconfig find device.xml '//net[@id]'"));
+    EXPECT_THAT(help, Not(HasSubstr("--log-mask")));
+    EXPECT_THAT(help, Not(HasSubstr("kxconfig get")));
+    EXPECT_EQ(help, Tool({"--help", "find"}).out);
+}
+
+TEST_F(KxconfigUsage, HelpIsWrapped)
+{
+    const auto longest = [](const std::string& text)
+    {
+        size_t length = 0;
+        std::istringstream lines(text);
+        for (std::string line; std::getline(lines, line);)
+        {
+            length = std::max(length, line.size());
+        }
+        return length;
+    };
+    EXPECT_LE(longest(Tool({"--help"}, {"COLUMNS=80"}).out), 80u);
+    EXPECT_LE(longest(Tool({"set", "--help"}, {"COLUMNS=60"}).out), 60u);
+    EXPECT_GT(longest(Tool({"--help"}, {"COLUMNS=120"}).out), 80u);
+    EXPECT_LE(longest(ToolProcess({"--help"}, {"COLUMNS="}).out), 80u);
+}
+
+TEST_F(KxconfigUsage, BadArgumentsAreAnsweredWithWhatToType)
+{
+    const std::string see = " (kxconfig --help shows the usage)";
+    ExpectComplaint(Tool({"set", m_plain, "cfg.net.ip", "-a b"}), 2,
+                    "\"-a b\" is not an option; for an argument that starts with a dash, use --: "
+                    "kxconfig set " +
+                        m_plain + " cfg.net.ip -- '-a b'" + see);
+    ExpectComplaint(Tool({"keys", "--foo", m_plain}), 2,
+                    "unknown option \"--foo\"; kxconfig keys --help lists the options" + see);
+    ExpectComplaint(
+        Tool({"find", m_plain, "//a", "b"}), 2,
+        "surplus argument \"b\"; usage: kxconfig find [options] FILE XPATH; an argument "
+        "with spaces needs quotes" +
+            see);
+}
+
+TEST_F(KxconfigUsage, ExplainIgnoresTheValueOfAnUpdate)
+{
+    const Outcome without = Tool({"explain", "--set", m_plain, "cfg.net.ip"});
+    EXPECT_EQ(0, without.status);
+    EXPECT_EQ(without.out, Tool({"explain", "--set", m_plain, "cfg.net.ip", "a&"}).out);
+    ExpectComplaint(Tool({"explain", m_plain, "cfg.net.ip", "x"}), 2,
+                    "VALUE requires --set (kxconfig --help shows the usage)");
+}
+
+TEST_F(KxconfigUsage, ManPageHasTheSectionsOfAManPage)
+{
+    const std::string page = Tool({"--man"}).out;
+    for (const std::string section :
+         {"ENVIRONMENT", "FILES", "EXIT STATUS", "SEE ALSO", "EXAMPLES", "OPTIONS"})
+    {
+        EXPECT_THAT(page, AnyOf(HasSubstr("\n.SH " + section + "\n"),
+                                HasSubstr("\n.SH \"" + section + "\"\n")));
+    }
+    for (const std::string variable : {"KX_LOG_MASK", "NO_COLOR", "TERM", "COLUMNS"})
+    {
+        EXPECT_THAT(page, HasSubstr("\n\\fB" + variable + "\\fR\n"));
+    }
 }

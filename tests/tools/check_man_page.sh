@@ -3,6 +3,8 @@
 # usage: check_man_page.sh MAN_PAGE KXCONFIG
 set -euo pipefail
 
+export COLUMNS=1000 # a row of help is a line
+
 page=$1
 tool=$2
 
@@ -11,19 +13,19 @@ warnings=$(LC_ALL=C groff -man -Tascii -ww -z "$page" 2>&1)
 
 text=$(groff -man -Tascii -P -cbou "$page")
 help=$("$tool" --help)
-# "  -h,--help   ..." and, below "Subcommands:", "  get   ...".
-options=$(grep -oE '^ +(-[a-z],)?--[a-z-]+' <<<"$help" | grep -oE -- '--[a-z-]+')
-commands=$(sed -nE '/^Subcommands:/,/^$/s/^  ([a-z]+) .*/\1/p' <<<"$help")
+# "  -h, --help   ..." and, below "Commands:", "  get   ...".
+options=$(grep -oE '^ +(-[a-z], )?--[a-z-]+' <<<"$help" | grep -oE -- '--[a-z-]+')
+commands=$(sed -nE '/^Commands:/,/^$/s/^  ([a-z]+) .*/\1/p' <<<"$help")
 [ -n "$options" ] && [ -n "$commands" ]
 for word in $options $commands; do
     grep -qwF -e "$word" <<<"$text" || { echo "the man page does not tell of $word"; exit 1; }
 done
 
-# "NAME meaning" of each argument, from lines such as "  FILE TEXT REQUIRED   an XML file".
+# "NAME meaning" of each argument, from lines such as "  FILE      an XML file".
 positionals()
 {
     "$tool" "$1" --help |
-        sed -nE '/^Positionals:/,/^$/s/^  ([A-Z]+) TEXT( \.\.\.)?( REQUIRED)? +(.*)/\1 \4/p'
+        sed -nE '/^Arguments:/,/^$/s/^  ([A-Z]+) +(.*)/\1 \2/p'
 }
 
 # What the page says of a command: up to the next one's heading.

@@ -85,67 +85,11 @@ _kxconfig_offer_files()
     done < <(compgen -f -- "$name")
 }
 
-# Offers the levels of a log mask, of which several are joined by commas, after $1.
-_kxconfig_offer_levels()
-{
-    local levels=(warning error trace value xpath all none) given=${current#"$1"}
-    given=$1${given%"${given##*,}"}
-    _kxconfig_offer "${levels[@]/#/"$given"}"
-}
-
-_kxconfig_offer_options()
-{
-    local options=(--help --json --log-mask --trace)
-    case $1 in
-        "") options+=(--version) ;;
-        set) options+=(--drop-attributes --dry-run --output --wait) ;;
-        keys) options+=(--all) ;;
-        explain) options+=(--set) ;;
-        check) options+=(--notes --only --ignore --kinds) ;;
-        get) options+=(--default --null) ;;
-    esac
-    _kxconfig_offer "${options[@]}"
-}
-
-_kxconfig_offer_keys()
-{
-    local keys
-    if [[ -f $1 ]]; then # from a pipe there might be nothing to read
-        mapfile -t keys < <("${words[0]/#\~\//$HOME/}" keys -- "$1" 2>/dev/null | cut -f1)
-        _kxconfig_offer "${keys[@]}"
-    fi
-}
-
-_kxconfig_offer_arguments()
-{
-    local verb= file= position=0 i
-    for ((i = 1; i < ${#words[@]}; ++i)); do
-        case ${words[i]} in
-            --default | --log-mask | --output | --wait) ((++i)) ;;
-            -*) ;;
-            *)
-                ((++position))
-                if [ $position -eq 1 ]; then verb=${words[i]}; fi
-                if [ $position -eq 2 ]; then file=${words[i]/#\~\//$HOME/}; fi
-                ;;
-        esac
-    done
-    if [[ $current == -* ]]; then
-        _kxconfig_offer_options "$verb"
-        return
-    fi
-    case $position-$verb in
-        0-*) _kxconfig_offer get set explain check keys find diff ;;
-        1-* | 2-diff) _kxconfig_offer_files "" ;;
-        *-get | 2-set | 2-explain | *-check) _kxconfig_offer_keys "$file" ;;
-    esac
-}
-
 _kxconfig()
 {
     # Bash replaces $2, the end of the line, which can be less than the word: it breaks words at "=" and the like, and
     # leaves an open quote alone. What it keeps of the word must not be offered again.
-    local line=${COMP_LINE:0:COMP_POINT} words quote kept current
+    local line=${COMP_LINE:0:COMP_POINT} words quote kept current offered
     COMPREPLY=()
     if [[ $line != *"$2" ]]; then return; fi
     _kxconfig_split "$line"
@@ -153,15 +97,13 @@ _kxconfig()
     _kxconfig_split "${line%"$2"}"
     kept=${words[-1]}
     unset 'words[-1]'
-    case ${words[-1]} in
-        --log-mask) _kxconfig_offer_levels ""; return ;;
-        --output) _kxconfig_offer_files ""; return ;;
-    esac
-    case $current in
-        --log-mask=*) _kxconfig_offer_levels --log-mask= ;;
-        --output=*) _kxconfig_offer_files --output= ;;
-        *) _kxconfig_offer_arguments ;;
-    esac
+    # The program knows its commands, its options and the keys of a file.
+    mapfile -t offered < <("${words[0]/#\~\//$HOME/}" --complete "${words[@]:1}" "$current" 2>/dev/null)
+    if [[ ${offered[0]-} == $'\t'* ]]; then
+        _kxconfig_offer_files "${offered[0]#?}"
+    else
+        _kxconfig_offer "${offered[@]%%$'\t'*}"
+    fi
 }
 
 complete -F _kxconfig kxconfig

@@ -1,16 +1,17 @@
 #include "cli/CommandLine.h"
 
+#include "cli/Completion.h"
 #include "cli/Options.h"
 #include "cli/Usage.h"
 #include "output/Failure.h"
 #include "output/Quoting.h"
 #include "output/Report.h"
+#include "output/Terminal.h"
 
 #include <CLI/CLI.hpp>
 #include <nlohmann/json.hpp>
 
 #include <algorithm>
-#include <sstream>
 
 namespace
 {
@@ -68,6 +69,13 @@ std::string UnknownCommand(const CLI::App& app)
     return named ? "" : rest.front();
 }
 
+ColorChoice ColorChoiceOf(const std::string& when)
+{
+    return when == "auto"     ? ColorChoice::Auto
+           : when == "always" ? ColorChoice::Always
+                              : ColorChoice::Never;
+}
+
 /** The answer to --help and --version. */
 struct Information
 {
@@ -77,17 +85,111 @@ struct Information
     Json InJson() const { return {{"text", text}}; }
 };
 
+/** @return the command that was named; null if none was. */
+const CLI::App* NamedCommand(const CLI::App& app)
+{
+    const std::vector<CLI::App*> named = app.get_subcommands();
+    return named.empty() ? nullptr : named.front();
+}
+
+/** @return @p argument as it is typed into a shell. */
+std::string InShell(const std::string& argument)
+{
+    const char* const plain =
+        "0123456789abcdefghijklmnopqrstuvwxyzABCDEFGHIJKLMNOPQRSTUVWXYZ_.,:=@/+-";
+    if (!argument.empty() && argument.find_first_not_of(plain) == std::string::npos)
+    {
+        return argument;
+    }
+    std::string quoted = "'";
+    for (const char c : argument)
+    {
+        quoted += c == '\'' ? "'\\''" : std::string(1, c);
+    }
+    return quoted + "'";
+}
+
+/** @return the command line with "--" in front of @p dashed, which a dash makes an option. */
+std::string WithSeparator(const std::vector<std::string>& arguments, const std::string& dashed)
+{
+    std::string line = "kxconfig";
+    const auto end = std::find(arguments.begin(), arguments.end(), dashed);
+    for (auto argument = arguments.begin(); argument != end; ++argument)
+    {
+        line += " " + InShell(*argument);
+    }
+    line += " --";
+    for (auto argument = end; argument != arguments.end(); ++argument)
+    {
+        line += " " + InShell(*argument);
+    }
+    return line;
+}
+
+bool LacksArgument(const CLI::App& command)
+{
+    const std::vector<const CLI::Option*> options = command.get_options();
+    return std::any_of(options.begin(), options.end(),
+                       [](const CLI::Option* option) {
+                           return option->get_positional() && option->get_required() &&
+                                  option->empty();
+                       });
+}
+
+/** @return what is wrong with arguments that no option and no argument takes, and what to type. */
+std::string SurplusError(const CLI::App& command, const std::string& surplus,
+                         const std::vector<std::string>& arguments)
+{
+    const bool isDashed = surplus.size() > 1 && surplus[0] == '-';
+    if (isDashed && LacksArgument(command))
+    {
+        return Quoted(surplus) +
+               " is not an option; for an argument that starts with a dash, use --: " +
+               WithSeparator(arguments, surplus);
+    }
+    if (isDashed)
+    {
+        return "unknown option " + Quoted(surplus) + "; kxconfig " + command.get_name() +
+               " --help lists the options";
+    }
+    return "surplus argument " + Quoted(surplus) + "; usage: kxconfig " + command.get_name() +
+           " [options]" + Arguments(command) + "; an argument with spaces needs quotes";
+}
+
+bool IsError(const CLI::ParseError& error, CLI::ExitCodes code)
+{
+    return error.get_exit_code() == static_cast<int>(code);
+}
+
+Failure BadUsage(const CLI::App& app, const CLI::ParseError& error,
+                 const std::vector<std::string>& arguments)
+{
+    const std::string unknown = UnknownCommand(app);
+    if (!unknown.empty())
+    {
+        return BadUsage("unknown command " + Quoted(unknown));
+    }
+    const CLI::App* const command = NamedCommand(app);
+    const std::vector<std::string> surplus = app.remaining(true);
+    const bool isAboutNumber = IsError(error, CLI::ExitCodes::ExtrasError) ||
+                               IsError(error, CLI::ExitCodes::RequiredError);
+    return command == nullptr || surplus.empty() || !isAboutNumber
+               ? BadUsage(error.what())
+               : BadUsage(SurplusError(*command, surplus.front(), arguments));
+}
+
 /** @throws Failure unless @p error only means that the user asked for information. */
-void AnswerOrRefuse(const CLI::App& app, const CLI::ParseError& error, Report& report)
+void AnswerOrRefuse(const CLI::App& app, const CLI::ParseError& error,
+                    const std::vector<std::string>& arguments, Report& report)
 {
     if (error.get_exit_code() != 0)
     {
-        const std::string unknown = UnknownCommand(app);
-        throw BadUsage(unknown.empty() ? error.what() : "unknown command " + Quoted(unknown));
+        throw BadUsage(app, error, arguments);
     }
-    std::ostringstream text;
-    app.exit(error, text, text);
-    report.Add(Information{text.str().substr(0, text.str().size() - 1)});
+    const bool isHelp = error.get_name() == "CallForHelp";
+    const std::string text =
+        isHelp ? Help(app, NamedCommand(app), OutputWidth()) : error.what() + std::string("\n");
+    report.Add(Information{text.substr(0, text.size() - 1)});
 }
 
 } // namespace
@@ -102,7 +204,6 @@ CommandLine::CommandLine(std::istream& input) : m_parser(std::make_unique<Parser
 {
     m_parser->request.input = &input;
     CLI::App& app = m_parser->app;
-    app.footer(HelpFooter());
     app.require_subcommand(0, 1); // so that an unknown one is named
     app.fallthrough();
     AddOptions(app, m_parser->request);
@@ -118,6 +219,11 @@ bool CommandLine::Parse(const std::vector<std::string>& arguments, Report& repor
         report.AddLine(ManPage(app));
         return false;
     }
+    if (!arguments.empty() && arguments.front() == "--complete")
+    {
+        report.AddBytes(Complete(app, {arguments.begin() + 1, arguments.end()}).Lines());
+        return false;
+    }
     if (AsksForJson(arguments))
     {
         report.AnswerInJson();
@@ -129,13 +235,14 @@ bool CommandLine::Parse(const std::vector<std::string>& arguments, Report& repor
     }
     catch (const CLI::ParseError& error)
     {
-        AnswerOrRefuse(app, error, report);
+        AnswerOrRefuse(app, error, arguments, report);
         return false;
     }
     if (!m_parser->request.command)
     {
         throw BadUsage("a command is required: get, set, explain, check, keys, find or diff");
     }
+    report.ChooseColors(ColorChoiceOf(m_parser->request.color));
     report.SetSubject(app.get_subcommands().front()->get_name(), m_parser->request.file);
     return true;
 }

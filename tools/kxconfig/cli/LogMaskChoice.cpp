@@ -35,3 +35,8 @@ LogMaskChoice::~LogMaskChoice()
 {
     g_LumLogParams.xmlConfigParserMask = m_former;
 }
+
+bool LogMaskChoice::IsAny() const
+{
+    return g_LumLogParams.xmlConfigParserMask != 0;
+}

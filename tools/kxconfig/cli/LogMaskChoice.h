@@ -16,6 +16,9 @@ public:
     LogMaskChoice(const LogMaskChoice&) = delete;
     LogMaskChoice& operator=(const LogMaskChoice&) = delete;
 
+    /** @return whether the mask selects any records. */
+    bool IsAny() const;
+
 private:
     const unsigned int m_former;
 };

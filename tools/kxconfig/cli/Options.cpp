@@ -1,6 +1,8 @@
 #include "cli/Options.h"
 
 #include "cli/LogMaskChoice.h"
+#include "file/Engine.h"
+#include "output/Quoting.h"
 
 #include "LogMask.h"
 
@@ -22,6 +24,12 @@ std::string StandardStreamError(const std::string& file)
 std::string NewFileError(const std::string& file)
 {
     return file.empty() ? "\"\" is not a file name" : "";
+}
+
+std::string ColorError(const std::string& when)
+{
+    const bool isKnown = when == "auto" || when == "always" || when == "never";
+    return isKnown ? "" : Quoted(when) + " is not auto, always or never";
 }
 
 /** A command with the argument FILE, which @p run carries out. */
@@ -109,8 +117,10 @@ void AddExplain(CLI::App& app, Request& request)
         AddReader(app, "explain", "explain level by level what a lookup of a key path finds",
                   Explain, request.explain, request);
     AddKey(*explain, request.explain.key);
-    explain->add_flag("--set", request.explain.isUpdate,
-                      "explain what an update would reach; changes nothing");
+    CLI::Option* const update = explain->add_flag(
+        "--set", request.explain.isUpdate, "explain what an update would reach; changes nothing");
+    explain->add_option("VALUE", request.ignoredValue, "with --set: ignored, as in a call of set")
+        ->needs(update);
 }
 
 std::string KindError(const std::string& name)
@@ -183,8 +193,15 @@ void AddDiff(CLI::App& app, Request& request)
 
 void AddGeneralOptions(CLI::App& app, Request& request)
 {
-    app.set_version_flag("--version", "kxconfig " KX_VERSION);
+    app.set_version_flag(
+        "--version", [] { return "kxconfig " KX_VERSION "\nlibxml2 " + EngineVersion(); },
+        "print the versions of kxconfig and of the running libxml2");
     app.add_flag("--json", "print one JSON object");
+    app.add_option(
+           "--color", request.color,
+           "color the output: auto (on a terminal, unless NO_COLOR is set), always or never")
+        ->type_name("WHEN")
+        ->check(CLI::Validator(ColorError, ""));
     CLI::Option* const mask =
         app.add_option("--log-mask", request.logMask, std::string("log mask: ") + g_LogMaskHelp)
             ->type_name("MASK")

@@ -28,8 +28,10 @@ struct Request
     FindArguments find;
     DiffArguments diff;
     std::istream* input = nullptr; ///< standard input
+    std::string ignoredValue; ///< of explain --set: an update reaches the same with any
     std::string logMask;
     bool trace = false;
+    std::string color = "auto";
     std::string file;                           ///< of the command
     std::function<ExitStatus(Report&)> command; ///< empty if no command was named
 };

@@ -4,9 +4,11 @@
 #include "cli/LogMaskChoice.h"
 #include "file/Engine.h"
 #include "output/Failure.h"
+#include "output/Progress.h"
 #include "output/Report.h"
 
 #include <new>
+#include <optional>
 
 namespace
 {
@@ -21,6 +23,11 @@ ExitStatus RunCommand(const std::vector<std::string>& arguments, std::istream& i
     }
     const LogMaskChoice logMask(commandLine.LogMask());
     const EngineSettings engine;
+    std::optional<Progress> progress;
+    if (report.HasTerminalForErrors() && !logMask.IsAny())
+    {
+        progress.emplace();
+    }
     return commandLine.RunCommand(report);
 }
 

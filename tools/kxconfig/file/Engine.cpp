@@ -3,6 +3,7 @@
 #include <libxml/parser.h>
 
 #include <algorithm>
+#include <cstdlib>
 #include <new>
 
 namespace
@@ -89,4 +90,11 @@ void FirstEngineError::KeepText(EngineError error)
     {
         m_text = std::to_string(error->line) + ": " + m_text;
     }
+}
+
+std::string EngineVersion()
+{
+    const long number = std::strtol(xmlParserVersion, nullptr, 10); // 20914 is 2.9.14
+    return std::to_string(number / 10000) + "." + std::to_string(number / 100 % 100) + "." +
+           std::to_string(number % 100);
 }

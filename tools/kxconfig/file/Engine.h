@@ -47,6 +47,9 @@ private:
     const int m_formerKeepBlanks;
 };
 
+/** @return the version of the engine that runs, such as "2.9.14". */
+std::string EngineVersion();
+
 /** Keeps the first error that the engine reports during the object's life. */
 class FirstEngineError
 {

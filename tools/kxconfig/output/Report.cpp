@@ -1,15 +1,15 @@
 #include "output/Report.h"
 
+#include "output/Progress.h"
 #include "output/Quoting.h"
+#include "output/Terminal.h"
 
 #include <nlohmann/json.hpp>
 
 #include <cstdlib>
 #include <cstring>
-#include <iostream>
+#include <ostream>
 #include <utility>
-
-#include <unistd.h>
 
 namespace
 {
@@ -20,15 +20,12 @@ bool IsSet(const char* variable)
     return value != nullptr && *value != 0;
 }
 
-/** @return whether @p stream is one of the process's own, and that is a terminal. */
-bool IsTerminal(const std::ostream& stream)
+bool ShowsColors(const std::ostream& stream, ColorChoice choice)
 {
-    return (stream.rdbuf() == std::cout.rdbuf() && isatty(STDOUT_FILENO) == 1) ||
-           (stream.rdbuf() == std::cerr.rdbuf() && isatty(STDERR_FILENO) == 1);
-}
-
-bool ShowsColors(const std::ostream& stream)
-{
+    if (choice != ColorChoice::Auto)
+    {
+        return choice == ColorChoice::Always;
+    }
     const char* const terminal = std::getenv("TERM");
     const bool isDumb = terminal == nullptr || std::strcmp(terminal, "dumb") == 0;
     return IsTerminal(stream) && !isDumb && !IsSet("NO_COLOR");
@@ -74,16 +71,14 @@ void Report::SetSubject(const std::string& verb, const std::string& file)
 
 void Report::AddLine(const std::string& line)
 {
-    if (!m_isJson)
-    {
-        *m_output << line << '\n';
-    }
+    AddBytes(line + '\n');
 }
 
 void Report::AddBytes(const std::string& bytes)
 {
     if (!m_isJson)
     {
+        Progress::End();
         *m_output << bytes;
     }
 }
@@ -103,18 +98,25 @@ void Report::Complain(const std::string& message)
         m_messages.push_back(message);
         return;
     }
+    Progress::End();
     const std::string name = "kxconfig:";
-    m_errors << (ShowsColors(m_errors) ? Colored(Color::Bad, name) : name) + " " +
+    m_errors << (ShowsColors(m_errors, m_color) ? Colored(Color::Bad, name) : name) + " " +
                     OnOneLine(message) + "\n";
 }
 
 std::string Report::Paint(Color color, const std::string& text) const
 {
-    return !m_isJson && ShowsColors(*m_output) ? Colored(color, text) : text;
+    return !m_isJson && ShowsColors(*m_output, m_color) ? Colored(color, text) : text;
+}
+
+bool Report::HasTerminalForErrors() const
+{
+    return IsTerminal(m_errors);
 }
 
 std::ostream& Report::GiveOutput()
 {
+    Progress::End();
     std::ostream& output = *m_output;
     m_output = &m_errors;
     return output;
@@ -122,6 +124,7 @@ std::ostream& Report::GiveOutput()
 
 ExitStatus Report::Finish(ExitStatus status)
 {
+    Progress::End();
     if (m_isJson)
     {
         WriteAnswer(status);

@@ -19,6 +19,14 @@ enum class Color
     Faint
 };
 
+/** When colors are printed; Auto: on a terminal that shows them, unless NO_COLOR is set. */
+enum class ColorChoice
+{
+    Auto,
+    Always,
+    Never
+};
+
 /** What one run of kxconfig prints: lines for people, or one JSON object at the end. */
 class Report
 {
@@ -32,6 +40,8 @@ public:
     /** From now on results and messages are kept for the JSON object. */
     void AnswerInJson() { m_isJson = true; }
     bool IsJson() const { return m_isJson; }
+
+    void ChooseColors(ColorChoice choice) { m_color = choice; }
 
     /** Names the command and the file in the JSON object. */
     void SetSubject(const std::string& verb, const std::string& file);
@@ -62,8 +72,10 @@ public:
     /** Prints "kxconfig: " and @p message to the errors, on one line regardless of its content. */
     void Complain(const std::string& message);
 
-    /** @return @p text in color if the output is a terminal that shows colors. */
+    /** @return @p text in color if the output shows colors. */
     std::string Paint(Color color, const std::string& text) const;
+
+    bool HasTerminalForErrors() const;
 
     /**
      * Leaves the output to a document: from now on results and the JSON object go to the errors.
@@ -89,6 +101,7 @@ private:
     std::ostream& m_errors;
     ExitStatus m_failure = ExitStatus::NotSaved; ///< of a run whose output cannot be written
     bool m_isJson = false;
+    ColorChoice m_color = ColorChoice::Auto;
     std::optional<std::string> m_verb;
     std::optional<std::string> m_file;
     std::vector<Json> m_results;
