@@ -214,8 +214,8 @@ class KxconfigOtherShells : public ToolTest
 {
 protected:
     const std::string m_bin = m_folder.Path("bin");
-    const std::string m_file =
-        m_folder.Write("odd.xml", "<cfg><net id=\"it's $(touch evil)\"><ip>b</ip></net><net/></cfg>");
+    const std::string m_file = m_folder.Write(
+        "odd.xml", "<cfg><net id=\"it's $(touch evil)\"><ip>b</ip></net><net/></cfg>");
 
     void SetUp() override
     {
