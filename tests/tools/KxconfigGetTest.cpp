@@ -79,8 +79,10 @@ TEST_F(KxconfigGet, RefusesAMalformedKey)
 
 TEST_F(KxconfigGet, RefusesBadUsage)
 {
-    ExpectComplaint(Tool({}), 2,
-                    "a command is required: get, set, explain, check, keys, find or diff" + kUsage);
+    ExpectComplaint(
+        Tool({}), 2,
+        "a command is required: get, set, add, remove, explain, check, keys, find or diff" +
+            kUsage);
     ExpectComplaint(Tool({"frobnicate"}), 2, "unknown command \"frobnicate\"" + kUsage);
     ExpectComplaint(Tool({"frobnicate", kGateway, "a.b"}), 2,
                     "unknown command \"frobnicate\"" + kUsage);

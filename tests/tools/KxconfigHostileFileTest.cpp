@@ -98,10 +98,17 @@ protected:
     void ExpectValueIsRefused(const std::string& xml, const std::string& value)
     {
         const std::string file = m_folder.Write("hostile.xml", xml);
-        const Outcome outcome = Tool({"set", file, "c.a", value});
-        EXPECT_EQ(4, outcome.status);
-        EXPECT_THAT(outcome.err, testing::HasSubstr("would no longer load, line 1: "));
-        EXPECT_EQ(xml, kxtest::ReadFile(file));
+        for (const std::vector<std::string>& command :
+             std::vector<std::vector<std::string>>{{"set", file, "c.a", value},
+                                                   {"set", "--create", file, "c.b", value},
+                                                   {"set", "--node", file, "/c/a", value},
+                                                   {"add", file, "/c", "b", value}})
+        {
+            const Outcome outcome = Tool(command);
+            EXPECT_EQ(4, outcome.status);
+            EXPECT_THAT(outcome.err, testing::HasSubstr("would no longer load, line 1: "));
+            EXPECT_EQ(xml, kxtest::ReadFile(file));
+        }
     }
 };
 

@@ -68,7 +68,7 @@ protected:
             const auto at = line.find("--");
             if (line.compare(0, 3, "  -") == 0 && at != std::string::npos)
             {
-                options.insert(line.substr(at, line.find_first_of(" ,", at) - at));
+                options.insert(line.substr(at, line.find_first_of(" ,[", at) - at));
             }
         }
         return options;
@@ -82,8 +82,8 @@ protected:
         return terminal >= 0;
     }
 
-    const std::set<std::string> m_verbs = {"check", "diff", "explain", "find",
-                                           "get",   "keys", "set"};
+    const std::set<std::string> m_verbs = {"add", "check", "diff",   "explain", "find",
+                                           "get", "keys",  "remove", "set"};
     kxtest::TemporaryFolder m_folder;
 };
 

@@ -12,6 +12,7 @@
 #include <nlohmann/json.hpp>
 
 #include <algorithm>
+#include <utility>
 
 namespace
 {
@@ -52,6 +53,14 @@ void RefuseFlagsWithValues(const CLI::App& app, const std::vector<std::string>& 
             throw CLI::ArgumentMismatch(name + " takes no value");
         }
     }
+}
+
+/** Gives --backup the value that it may lack: CLI11 would take the next argument. */
+std::vector<std::string> WithBackupSuffix(std::vector<std::string> arguments)
+{
+    const auto end = std::find(arguments.begin(), arguments.end(), "--");
+    std::replace(arguments.begin(), end, std::string("--backup"), std::string("--backup=~"));
+    return arguments;
 }
 
 /** Found ahead of all else, since bad usage is reported in JSON, too. */
@@ -126,14 +135,18 @@ std::string WithSeparator(const std::vector<std::string>& arguments, const std::
     return line;
 }
 
+/** VALUE is not required beside --value-from. */
+bool IsRequired(const CLI::Option& option)
+{
+    return option.get_positional() && (option.get_required() || option.get_name(true) == "VALUE");
+}
+
 bool LacksArgument(const CLI::App& command)
 {
     const std::vector<const CLI::Option*> options = command.get_options();
     return std::any_of(options.begin(), options.end(),
-                       [](const CLI::Option* option) {
-                           return option->get_positional() && option->get_required() &&
-                                  option->empty();
-                       });
+                       [](const CLI::Option* option)
+                       { return IsRequired(*option) && option->empty(); });
 }
 
 /** @return what is wrong with arguments that no option and no argument takes, and what to type. */
@@ -231,7 +244,9 @@ bool CommandLine::Parse(const std::vector<std::string>& arguments, Report& repor
     try
     {
         RefuseFlagsWithValues(app, arguments);
-        app.parse(std::vector<std::string>(arguments.rbegin(), arguments.rend()));
+        std::vector<std::string> words = WithBackupSuffix(arguments);
+        std::reverse(words.begin(), words.end()); // as CLI11 takes them
+        app.parse(std::move(words));
     }
     catch (const CLI::ParseError& error)
     {
@@ -240,7 +255,8 @@ bool CommandLine::Parse(const std::vector<std::string>& arguments, Report& repor
     }
     if (!m_parser->request.command)
     {
-        throw BadUsage("a command is required: get, set, explain, check, keys, find or diff");
+        throw BadUsage(
+            "a command is required: get, set, add, remove, explain, check, keys, find or diff");
     }
     report.ChooseColors(ColorChoiceOf(m_parser->request.color));
     report.SetSubject(app.get_subcommands().front()->get_name(), m_parser->request.file);

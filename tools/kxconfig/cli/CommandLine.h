@@ -14,7 +14,7 @@ class Report;
 class CommandLine
 {
 public:
-    /** @param input  standard input. */
+    /** @param input  standard input, for the command; outlives this object. */
     explicit CommandLine(std::istream& input);
     ~CommandLine();
     CommandLine(const CommandLine&) = delete;

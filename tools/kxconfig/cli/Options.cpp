@@ -32,6 +32,17 @@ std::string ColorError(const std::string& when)
     return isKnown ? "" : Quoted(when) + " is not auto, always or never";
 }
 
+std::string ValueFileError(const std::string& file)
+{
+    return file.empty() ? "\"\" is not a file name" : "";
+}
+
+std::string SuffixError(const std::string& suffix)
+{
+    const bool isSuffix = !suffix.empty() && suffix.find('/') == std::string::npos;
+    return isSuffix ? "" : "\"" + suffix + "\" is not a suffix of a file name";
+}
+
 /** A command with the argument FILE, which @p run carries out. */
 template <class Arguments>
 CLI::App* AddCommand(CLI::App& app, const char* name, const char* description,
@@ -89,26 +100,97 @@ void AddGet(CLI::App& app, Request& request)
     get->add_flag("-z,--null", arguments.endWithNul, "end each value with NUL, not a line end");
 }
 
-void AddSet(CLI::App& app, Request& request)
+/** The options of all commands that change a file. */
+void AddSaving(CLI::App& command, SaveArguments& arguments)
 {
-    SetArguments& arguments = request.set;
-    CLI::App* const set = AddFileCommand(
-        app, "set", "replace the text under a key path, print what changed, and save", Set,
-        arguments, request);
-    AddKey(*set, arguments.key);
-    set->add_option("VALUE", arguments.value, "the new text, as XML: write & as &amp;")->required();
-    set->add_flag("--dry-run", arguments.dryRun, "show what would change and save nothing");
-    set->add_option(
-           "--output", arguments.output,
-           "save to this file instead; -: to standard output, and report to standard error")
+    command.add_flag("--dry-run", arguments.dryRun, "show what would change and save nothing");
+    command
+        .add_option(
+            "--output", arguments.output,
+            "save to this file instead; -: to standard output, and report to standard error")
         ->type_name("FILE")
         ->check(CLI::Validator(NewFileError, ""));
-    set->add_option("--wait", arguments.waitSeconds,
+    command
+        .add_option("--wait", arguments.waitSeconds,
                     "wait this long while another process has the file locked; default: 10")
         ->type_name("SECONDS")
         ->check(CLI::Validator(CLI::Range(0, g_longestWait)).description(""));
-    set->add_flag("--drop-attributes", arguments.dropAttributes,
-                  "save even if the owner, the ACL or the like would be lost");
+    command.add_flag("--drop-attributes", arguments.dropAttributes,
+                     "save even if the owner, the ACL or the like would be lost");
+    command
+        .add_option("--expect", arguments.expected,
+                    "save only if exactly this many elements or attributes change")
+        ->type_name("N")
+        ->check(CLI::Validator(CLI::NonNegativeNumber).description(""));
+    command.add_flag("--quiet", arguments.quiet, "print no changes");
+    command.add_flag("--diff", arguments.diff, "print a unified diff of the file");
+    command
+        .add_option("--backup", arguments.backupSuffix,
+                    "keep the file that is replaced under its name and SUFFIX; default: ~")
+        ->type_name("SUFFIX")
+        ->expected(0, 1)
+        ->check(CLI::Validator(SuffixError, ""));
+}
+
+void AddSet(CLI::App& app, Request& request)
+{
+    SetArguments& arguments = request.set;
+    arguments.input = request.input;
+    CLI::App* const set = AddFileCommand(
+        app, "set",
+        "replace the text under key paths, print what changed, and save. All keys or "
+        "none are updated. An update can reach more elements than get finds",
+        Set, arguments, request);
+    AddKey(*set, arguments.key);
+    set->add_option("VALUE", arguments.values,
+                    "the new text, as XML: write & as &amp;. More keys, each with its value, can "
+                    "follow")
+        ->expected(1, -1) // with a minimum of 0, "--" in front of it would end the command
+        ->type_name("");
+    set->add_option("--value-from", arguments.valueFile,
+                    "read VALUE from this file, without the last line end; -: standard input")
+        ->type_name("FILE")
+        ->check(CLI::Validator(ValueFileError, ""));
+    set->add_flag("--create", arguments.create,
+                  "make the elements of a key without conditions that are not there");
+    CLI::Option* const node = set->add_flag(
+        "--node", arguments.byNode,
+        "KEY is an XPath expression: replace the text of the one element or attribute it selects");
+    node->excludes("--create");
+    set->add_flag("--all", arguments.all, "with --node: of all that it selects")->needs(node);
+    AddSaving(*set, arguments.saving);
+}
+
+void AddExpression(CLI::App& command, std::string& expression, bool& all)
+{
+    command.add_option("XPATH", expression, "an XPath 1.0 expression that selects one node")
+        ->required();
+    command.add_flag("--all", all, "change all nodes that XPATH selects, not exactly one");
+}
+
+void AddAdd(CLI::App& app, Request& request)
+{
+    AddArguments& arguments = request.add;
+    CLI::App* const add = AddFileCommand(
+        app, "add", "add a child to the element that XPATH selects, print it, and save", Add,
+        arguments, request);
+    AddExpression(*add, arguments.expression, arguments.all);
+    add->add_option("NAME", arguments.name, "the name of what is added, without a prefix")
+        ->required();
+    add->add_option("CONTENT", arguments.content, "its text, as XML: write & as &amp;");
+    add->add_flag("--after", arguments.after, "add a sibling, right after the selected element")
+        ->excludes(add->add_flag("--attribute", arguments.attribute, "add an attribute"));
+    AddSaving(*add, arguments.saving);
+}
+
+void AddRemove(CLI::App& app, Request& request)
+{
+    RemoveArguments& arguments = request.remove;
+    CLI::App* const remove =
+        AddFileCommand(app, "remove", "remove the node that XPATH selects, print it, and save",
+                       Remove, arguments, request);
+    AddExpression(*remove, arguments.expression, arguments.all);
+    AddSaving(*remove, arguments.saving);
 }
 
 void AddExplain(CLI::App& app, Request& request)
@@ -216,6 +298,8 @@ void AddOptions(CLI::App& app, Request& request)
     AddGeneralOptions(app, request);
     AddGet(app, request);
     AddSet(app, request);
+    AddAdd(app, request);
+    AddRemove(app, request);
     AddExplain(app, request);
     AddCheck(app, request);
     AddKeys(app, request);

@@ -1,12 +1,14 @@
 #ifndef KX_TOOLS_OPTIONS_H
 #define KX_TOOLS_OPTIONS_H
 
+#include "commands/Add.h"
 #include "commands/Check.h"
 #include "commands/Diff.h"
 #include "commands/Explain.h"
 #include "commands/Find.h"
 #include "commands/Get.h"
 #include "commands/Keys.h"
+#include "commands/Remove.h"
 #include "commands/Set.h"
 
 #include <functional>
@@ -22,6 +24,8 @@ struct Request
 {
     GetArguments get;
     SetArguments set;
+    AddArguments add;
+    RemoveArguments remove;
     ExplainArguments explain;
     CheckArguments check;
     KeysArguments keys;

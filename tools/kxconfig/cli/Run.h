@@ -10,7 +10,7 @@
  * what they were before; it is for one thread at a time.
  *
  * @param arguments  those after the program's name.
- * @param input      standard input: the file "-" of commands that only read.
+ * @param input      standard input: the file "-" of commands that only read, and --value-from -.
  * @return the exit status.
  */
 int Run(const std::vector<std::string>& arguments, std::istream& input, std::ostream& output,

@@ -1,6 +1,6 @@
 #include "commands/Find.h"
 
-#include "file/Engine.h"
+#include "commands/Evaluation.h"
 #include "file/Load.h"
 #include "file/Locations.h"
 #include "file/Nodes.h"
@@ -8,21 +8,10 @@
 #include "output/Quoting.h"
 #include "output/Report.h"
 
-#include <libxml/xmlerror.h>
-#include <libxml/xpath.h>
-
 #include <nlohmann/json.hpp>
-
-#include <memory>
 
 namespace
 {
-
-struct FreeResult
-{
-    void operator()(xmlXPathObject* result) const { xmlXPathFreeObject(result); }
-};
-using Result = std::unique_ptr<xmlXPathObject, FreeResult>;
 
 const char* TypeName(const xmlNode* node)
 {
@@ -165,36 +154,13 @@ int AddNodes(const xmlNodeSet* nodes, Report& report)
     return count;
 }
 
-/** The library evaluates without prefixes, though the locations that find prints have them. */
-std::string AdviceOnPrefixes()
-{
-    const auto error = xmlGetLastError();
-    const bool isPrefix = error != nullptr && error->code == XML_XPATH_UNDEF_PREFIX_ERROR;
-    return isPrefix ? "; no prefixes are registered: write *[name()='p:a'] for p:a" : "";
-}
-
-Result Evaluate(CXmlParser& document, const std::string& expression)
-{
-    const CXmlNode top = document.FindNode("/", CXmlNode());
-    const FirstEngineError error;
-    // Not FindAllNodes(), which ends at 255 nodes.
-    Result result(document.GetNodeSet(expression, top));
-    if (result == nullptr)
-    {
-        const std::string reason = error.IsNone() ? "" : ": " + error.Text();
-        throw Failure(ExitStatus::BadUsage,
-                      "malformed expression " + Quoted(expression) + reason + AdviceOnPrefixes());
-    }
-    return result;
-}
-
 } // namespace
 
 ExitStatus Find(const FindArguments& arguments, Report& report)
 {
     CXmlParser document;
     LoadDocument(arguments.file, document, arguments.input);
-    const Result result = Evaluate(document, arguments.expression);
+    const XPathResult result = Evaluate(document, arguments.expression);
     if (result->type != XPATH_NODESET)
     {
         report.Add(Scalar{Taken(xmlXPathCastToString(result.get()))});

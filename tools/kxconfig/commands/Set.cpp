@@ -1,140 +1,193 @@
 #include "commands/Set.h"
 
+#include "commands/CreateElements.h"
 #include "commands/KeyArgument.h"
+#include "commands/SetNodes.h"
 #include "commands/ValueArgument.h"
-#include "file/Destination.h"
 #include "file/Engine.h"
 #include "file/Load.h"
-#include "file/RoundTrip.h"
-#include "file/Texts.h"
+#include "file/Nodes.h"
 #include "output/Failure.h"
 #include "output/Quoting.h"
 #include "output/Report.h"
+#include "walk/LookupReach.h"
+#include "walk/UpdateReach.h"
 
 #include "diag/Status.h"
 
-#include <nlohmann/json.hpp>
-
-#include <chrono>
+#include <algorithm>
 
 namespace
 {
 
-void Update(CXMLWriter& writer, const SetArguments& arguments)
+std::vector<KeyValue> PairsOf(const SetArguments& arguments)
+{
+    std::vector<std::string> words = {arguments.key};
+    words.insert(words.end(), arguments.values.begin(), arguments.values.end());
+    if (!arguments.valueFile.empty())
+    {
+        words.push_back(ReadValue(arguments.valueFile, *arguments.input));
+    }
+    std::vector<KeyValue> pairs;
+    for (size_t i = 0; i != words.size(); i += 2)
+    {
+        pairs.push_back({words[i], words[i + 1]});
+    }
+    return pairs;
+}
+
+/** Requires a value for each key. */
+void RequirePairs(const SetArguments& arguments)
+{
+    const bool hasFile = !arguments.valueFile.empty();
+    if (hasFile && !arguments.values.empty())
+    {
+        throw Failure(ExitStatus::BadUsage,
+                      "--value-from takes the place of VALUE: give one KEY only");
+    }
+    if (!hasFile && arguments.values.size() % 2 == 0)
+    {
+        const std::string& key = arguments.values.empty() ? arguments.key : arguments.values.back();
+        throw Failure(ExitStatus::BadUsage, "VALUE is required after the key " + Quoted(key) +
+                                                "; a value with spaces needs quotes");
+    }
+}
+
+void Update(CXMLWriter& writer, const KeyValue& pair, const std::string& file)
 {
     const FirstEngineError error;
-    const int status = writer.SetValue(arguments.key, arguments.value);
+    const int status = writer.SetValue(pair.key, pair.value);
     if (!error.IsNone())
     {
         RefuseValue(g_bareAmpersand);
     }
     if (status == kx::StatusNotFound)
     {
-        throw Failure(ExitStatus::NothingFound, "nothing found: no element of " + arguments.file +
+        throw Failure(ExitStatus::NothingFound, "nothing found: no element of " + file +
                                                     " has text that can be replaced under " +
-                                                    Quoted(arguments.key));
+                                                    Quoted(pair.key));
     }
     if (status != kx::StatusOk)
     {
         throw Failure(ExitStatus::BadUsage,
-                      "malformed key " + Quoted(arguments.key) + ": it ends in \".\"");
+                      "malformed key " + Quoted(pair.key) + ": it ends in \".\"");
     }
 }
 
-/** Of an entity that contains itself, or multiplies, no text can be compared: the file would not
- * load. */
-void RequireTexts(CXMLReader& reader, const SetArguments& arguments, const Destination& destination)
+/** An element and the text that it had. */
+struct ElementText
 {
-    if (arguments.value.find('&') != std::string::npos)
-    {
-        RequireLoadsAgain(SavedBytes(reader), destination.Path());
-    }
-}
-
-struct Change
-{
-    const ChangedText& text;
-
-    std::string Line() const
-    {
-        return text.location + ": " + Quoted(text.before) + " -> " + Quoted(text.after);
-    }
-
-    Json InJson() const
-    {
-        return {{"location", text.location}, {"before", text.before}, {"after", text.after}};
-    }
+    const xmlNode* element;
+    std::string text;
 };
 
-void AddChanges(const std::vector<ChangedText>& changes, Report& report)
+std::vector<ElementText> TextsOf(const std::vector<const xmlNode*>& elements)
 {
-    for (const ChangedText& change : changes)
+    std::vector<ElementText> texts;
+    texts.reserve(elements.size());
+    for (const xmlNode* const element : elements)
     {
-        report.Add(Change{change});
+        texts.push_back({element, ContentOf(element)});
     }
-    if (changes.empty())
-    {
-        report.AddLine("nothing changed: the text is already the same");
-    }
+    return texts;
 }
 
-bool SavesElsewhere(const SetArguments& arguments)
+/** @return those of @p texts that are not those of their elements any more. */
+std::vector<ElementText> Changed(const std::vector<ElementText>& texts)
 {
-    return !arguments.output.empty();
+    std::vector<ElementText> changed;
+    std::copy_if(texts.begin(), texts.end(), std::back_inserter(changed),
+                 [](const ElementText& text) { return ContentOf(text.element) != text.text; });
+    return changed;
 }
 
-Destination DestinationOf(const SetArguments& arguments)
+/** @return a warning if an update changed @p changed, and a lookup of the key finds only @p found.
+ */
+std::string ReachWarning(const std::string& key, const std::vector<ElementText>& changed,
+                         std::vector<const xmlNode*> found)
 {
-    const bool elsewhere = SavesElsewhere(arguments);
-    return Destination(elsewhere ? arguments.output : arguments.file,
-                       elsewhere ? Destination::Role::OtherFile : Destination::Role::LoadedFile,
-                       std::chrono::seconds(arguments.waitSeconds));
+    std::sort(found.begin(), found.end());
+    const auto isFound = [&found](const ElementText& text)
+    { return std::binary_search(found.begin(), found.end(), text.element); };
+    const auto count = static_cast<size_t>(std::count_if(changed.begin(), changed.end(), isFound));
+    return count == changed.size()
+               ? ""
+               : "warning: " + Quoted(key) + " changes " + std::to_string(changed.size()) +
+                     (changed.size() == 1 ? " element; get finds " : " elements; get finds ") +
+                     std::to_string(count) + " of them";
 }
 
-void Warn(const std::string& warning, Report& report)
+/** The updates of one document in memory. */
+class Updates
 {
-    if (!warning.empty())
+public:
+    Updates(CXMLReader& reader, const SetArguments& arguments, Edit& edit)
+        : m_reader(reader), m_writer(reader), m_arguments(arguments), m_edit(edit)
     {
-        report.Complain(warning);
     }
-}
 
-ExitStatus Save(CXMLReader& reader, Destination& destination, const SetArguments& arguments,
-                Report& report)
-{
-    const std::string bytes = SavedBytes(reader);
-    RequireLoadsAgain(bytes, destination.Path());
-    destination.Save(bytes, {arguments.dropAttributes, arguments.dryRun});
-    if (!arguments.dryRun)
+    void Apply(const KeyValue& pair)
     {
-        report.NoteSaved();
+        RequireKey(pair.key, m_arguments.file, m_reader);
+        RequireXmlText(pair.value);
+        RequireDeclaredEntities(pair.value, DocumentOf(m_reader));
+        m_changes.BeginUpdate();
+        const std::vector<const xmlNode*> found = ElementsOfLookup(DocumentOf(m_reader), pair.key);
+        if (m_arguments.create && found.empty())
+        {
+            CreateElements(DocumentOf(m_reader), pair.key, pair.value, m_changes);
+            m_edit.RequireTexts(DocumentOf(m_reader), pair.value);
+            return;
+        }
+        const auto texts = TextsOf(ElementsOfUpdate(DocumentOf(m_reader), pair.key));
+        Update(m_writer.Get(), pair, m_arguments.file);
+        m_edit.RequireTexts(DocumentOf(m_reader), pair.value);
+        const std::vector<ElementText> changed = Changed(texts);
+        m_edit.Warn(ReachWarning(pair.key, changed, found));
+        for (const ElementText& text : changed)
+        {
+            m_changes.NoteChanged(text.element, text.text);
+        }
     }
-    Warn(destination.SyncWarning(), report);
-    return destination.SyncWarning().empty() ? ExitStatus::Done : ExitStatus::NotReported;
-}
+
+    ExitStatus Finish()
+    {
+        xmlDoc* const document = DocumentOf(m_reader);
+        const ExitStatus status = m_edit.Finish(document, m_changes.List(document));
+        const size_t textless = m_changes.CountTextless();
+        if (textless != 0)
+        {
+            m_edit.Warn("warning: no later set reaches " + std::to_string(textless) +
+                        (textless == 1 ? " element, which has" : " elements, which have") +
+                        " no plain text any more");
+        }
+        return status;
+    }
+
+private:
+    CXMLReader& m_reader;
+    GuestWriter m_writer;
+    const SetArguments& m_arguments;
+    Edit& m_edit;
+    ElementChanges m_changes;
+};
 
 } // namespace
 
 ExitStatus Set(const SetArguments& arguments, Report& report)
 {
-    Destination destination = DestinationOf(arguments);
-    if (destination.IsStandardOutput())
+    RequirePairs(arguments);
+    const std::vector<KeyValue> pairs = PairsOf(arguments); // before the lock: input can be slow
+    Edit edit(arguments.file, arguments.saving, report);
+    if (arguments.byNode)
     {
-        destination.SetStream(report.GiveOutput());
+        return SetNodes(pairs, arguments, edit);
     }
-    Warn(destination.LockWarning(), report);
     const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file);
-    RequireKey(arguments.key, arguments.file, *reader);
-    const Texts texts(reader->GetDataPtr());
-    GuestWriter writer(*reader);
-    RequireXmlText(arguments.value);
-    RequireDeclaredEntities(arguments.value, DocumentOf(*reader));
-    Update(writer.Get(), arguments);
-    RequireTexts(*reader, arguments, destination);
-    const std::vector<ChangedText> changes = texts.Changes();
-    const bool isSaved = !changes.empty() || SavesElsewhere(arguments);
-    const ExitStatus status =
-        isSaved ? Save(*reader, destination, arguments, report) : ExitStatus::Done;
-    AddChanges(changes, report);
-    return status;
+    Updates updates(*reader, arguments, edit);
+    for (const KeyValue& pair : pairs)
+    {
+        updates.Apply(pair);
+    }
+    return updates.Finish();
 }

@@ -1,5 +1,6 @@
 #include "commands/ValueArgument.h"
 
+#include "file/Input.h"
 #include "output/Failure.h"
 #include "output/Quoting.h"
 
@@ -9,9 +10,42 @@
 
 #include <algorithm>
 #include <charconv>
+#include <fstream>
+#include <iterator>
+#include <system_error>
 
 namespace
 {
+
+std::string ReadAll(std::istream& stream)
+{
+    std::string text((std::istreambuf_iterator<char>(stream)), std::istreambuf_iterator<char>());
+    if (stream.bad())
+    {
+        throw std::system_error(EIO, std::generic_category());
+    }
+    return text;
+}
+
+std::string ReadFile(const std::string& path)
+{
+    const Input input(path);
+    std::ifstream stream(input.Path(), std::ios::binary);
+    return ReadAll(stream);
+}
+
+/** As the shell does with what a command prints, but for one line end only. */
+std::string WithoutLineEnd(std::string text)
+{
+    for (const char end : {'\n', '\r'})
+    {
+        if (!text.empty() && text.back() == end)
+        {
+            text.pop_back();
+        }
+    }
+    return text;
+}
 
 /** Requires that @p digits, a number of @p base, refer to a character. */
 void RequireCharacter(const std::string& digits, int base)
@@ -119,4 +153,17 @@ void RequireDeclaredEntities(const std::string& value, const xmlDoc* document)
                              RefuseValue("the file declares no entity " + Quoted(name));
                          }
                      });
+}
+
+std::string ReadValue(const std::string& file, std::istream& input)
+{
+    try
+    {
+        return WithoutLineEnd(file == "-" ? ReadAll(input) : ReadFile(file));
+    }
+    catch (const std::system_error& error)
+    {
+        throw Failure(ExitStatus::BadFile,
+                      "cannot read " + Quoted(file) + ": " + error.code().message());
+    }
 }

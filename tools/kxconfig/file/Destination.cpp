@@ -1,6 +1,7 @@
 #include "file/Destination.h"
 
 #include "file/Attributes.h"
+#include "file/Backup.h"
 #include "file/Debris.h"
 #include "file/Replacement.h"
 
@@ -163,6 +164,7 @@ void Destination::Replace(const std::string& bytes, const Options& options)
     RequireUnchanged();
     if (!options.dryRun)
     {
+        KeepBackup(options.backupSuffix);
         replacement->TakePlace();
         m_syncError = m_place->SyncFolder();
     }
@@ -214,5 +216,20 @@ void Destination::RequireUnchanged() const
     {
         throw Failure(ExitStatus::NotSaved,
                       "not saved: " + m_path + " was changed by another program in the meantime");
+    }
+}
+
+void Destination::KeepBackup(const std::string& suffix) const
+{
+    try
+    {
+        if (!suffix.empty() && m_status)
+        {
+            ::KeepBackup(*m_place, suffix);
+        }
+    }
+    catch (const std::system_error& error)
+    {
+        throw CannotSave("cannot keep " + m_path + suffix + ": " + error.code().message());
     }
 }

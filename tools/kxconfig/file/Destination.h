@@ -54,6 +54,7 @@ public:
     {
         bool dropAttributes = false; ///< save even if not all attributes can be kept
         bool dryRun = false;         ///< do everything but replace the file
+        std::string backupSuffix;    ///< of the name that keeps what is replaced; empty: none does
     };
 
     /** Saves @p bytes. @throws Failure if they are not saved, and all is as it was. */
@@ -71,6 +72,7 @@ private:
     std::unique_ptr<Replacement> MakeReplacement() const;
     void KeepAttributes(int file, const Options& options) const;
     void RequireUnchanged() const;
+    void KeepBackup(const std::string& suffix) const;
 
     std::string m_path;
     Role m_role;

@@ -1,39 +1,61 @@
 #include "file/RoundTrip.h"
 
-#include "file/Engine.h"
-#include "file/Load.h"
-#include "output/Failure.h"
+#include <libxml/xmlsave.h>
 
-#include <libxml/parser.h>
-
-#include <memory>
+#include <filesystem>
+#include <fstream>
 #include <new>
+#include <utility>
 
-// The engine has two calls for the same bytes: the writer uses the one that opens a file by its
-// name, and does not report why that failed.
-std::string SavedBytes(CXMLReader& reader)
+namespace
 {
-    xmlChar* bytes = nullptr;
-    int size = 0;
-    xmlDocDumpMemoryEnc(DocumentOf(reader), &bytes, &size, "UTF-8");
-    if (bytes == nullptr)
+
+/** Receives what the engine saves. */
+int AppendTo(void* bytes, const char* data, int size)
+{
+    try
+    {
+        static_cast<std::string*>(bytes)->append(data, static_cast<size_t>(size));
+    }
+    catch (const std::bad_alloc&)
+    {
+        return -1; // an exception must not pass through the engine
+    }
+    return size;
+}
+
+} // namespace
+
+std::optional<std::string> BytesOf(const std::string& path)
+{
+    std::error_code error;
+    if (!std::filesystem::is_regular_file(path, error))
+    {
+        return std::nullopt;
+    }
+    const auto size = std::filesystem::file_size(path, error);
+    std::string bytes;
+    if (error || size > bytes.max_size())
+    {
+        return std::nullopt;
+    }
+    bytes.resize(static_cast<size_t>(size));
+    std::ifstream file(path, std::ios::binary);
+    const bool isRead =
+        static_cast<bool>(file.read(bytes.data(), static_cast<std::streamsize>(bytes.size())));
+    return isRead ? std::optional(std::move(bytes)) : std::nullopt;
+}
+
+// The writer uses the call of the engine that opens a file by its name, and does not report why
+// that failed. This is the same call for an open file.
+std::string SavedBytes(xmlDoc* document)
+{
+    std::string bytes;
+    xmlOutputBuffer* const buffer =
+        xmlOutputBufferCreateIO(AppendTo, nullptr, &bytes, xmlFindCharEncodingHandler("UTF-8"));
+    if (buffer == nullptr || xmlSaveFileTo(buffer, document, "UTF-8") < 0)
     {
         throw std::bad_alloc();
     }
-    const auto release = [](xmlChar* owned) { xmlFree(owned); };
-    const std::unique_ptr<xmlChar, decltype(release)> owner(bytes, release);
-    return {reinterpret_cast<const char*>(bytes), static_cast<size_t>(size)};
-}
-
-void RequireLoadsAgain(const std::string& bytes, const std::string& target)
-{
-    const FirstEngineError error;
-    xmlDoc* const again =
-        xmlReadMemory(bytes.data(), static_cast<int>(bytes.size()), nullptr, nullptr, 0);
-    xmlFreeDoc(again);
-    if (again == nullptr)
-    {
-        throw Failure(ExitStatus::NotSaved,
-                      "not saved: " + target + " would no longer load, line " + error.Text());
-    }
+    return bytes;
 }

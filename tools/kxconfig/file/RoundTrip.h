@@ -1,19 +1,15 @@
 #ifndef KX_TOOLS_ROUNDTRIP_H
 #define KX_TOOLS_ROUNDTRIP_H
 
-#include "CXMLReader.h"
+#include <libxml/tree.h>
 
+#include <optional>
 #include <string>
 
-/** @return the bytes that CXMLWriter::SaveData() writes for @p reader's document. */
-std::string SavedBytes(CXMLReader& reader);
+/** @return the bytes that CXMLWriter::SaveData() writes for @p document. */
+std::string SavedBytes(xmlDoc* document);
 
-/**
- * Requires that @p bytes, which are about to be saved, load.
- *
- * @param target  the file to save to, for the message.
- * @throws Failure with the line and the engine's reason.
- */
-void RequireLoadsAgain(const std::string& bytes, const std::string& target);
+/** @return the bytes of the file at @p path; none of what is not a regular file, or not readable. */
+std::optional<std::string> BytesOf(const std::string& path);
 
 #endif

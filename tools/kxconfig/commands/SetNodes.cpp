@@ -1,0 +1,85 @@
+#include "commands/SetNodes.h"
+
+#include "commands/EditedDocument.h"
+#include "commands/ValueArgument.h"
+#include "file/Engine.h"
+#include "file/Locations.h"
+#include "file/Nodes.h"
+#include "output/Failure.h"
+#include "output/Quoting.h"
+
+#include <unordered_set>
+
+namespace
+{
+
+/** A node and the text that it had. */
+struct NodeText
+{
+    xmlNode* node;
+    std::string content;
+};
+
+/** Requires that @p node is an attribute, or an element of which no other element is lost. */
+void RequireReplaceable(const xmlNode* node, const std::string& expression)
+{
+    const bool isElement = node->type == XML_ELEMENT_NODE;
+    if (!isElement && node->type != XML_ATTRIBUTE_NODE)
+    {
+        throw Failure(ExitStatus::BadUsage, Quoted(expression) + " selects " + KindName(node) +
+                                                "; --node changes elements and attributes");
+    }
+    if (isElement && kx::ElementFrom(node->children) != nullptr)
+    {
+        throw Failure(ExitStatus::NotSaved,
+                      "not saved: " + Quoted(expression) +
+                          " selects an element with elements in it, which would be removed");
+    }
+}
+
+std::vector<Change> ChangesOf(const std::vector<NodeText>& texts)
+{
+    std::vector<Change> changes;
+    std::unordered_set<const xmlNode*> seen;
+    Locations locations;
+    for (const NodeText& text : texts)
+    {
+        const std::string now = ContentOf(text.node);
+        if (seen.insert(text.node).second && now != text.content)
+        {
+            changes.push_back({locations.Of(text.node), text.content, now});
+        }
+    }
+    return changes;
+}
+
+void SetContent(xmlNode* node, const std::string& value)
+{
+    const FirstEngineError error;
+    CXmlNode(node).SetContent(value);
+    if (!error.IsNone())
+    {
+        RefuseValue(g_bareAmpersand);
+    }
+}
+
+} // namespace
+
+ExitStatus SetNodes(const std::vector<KeyValue>& pairs, const SetArguments& arguments, Edit& edit)
+{
+    EditedDocument document(arguments.file);
+    std::vector<NodeText> texts;
+    for (const KeyValue& pair : pairs)
+    {
+        RequireXmlText(pair.value);
+        RequireDeclaredEntities(pair.value, document.Get());
+        for (xmlNode* const node : document.Select(pair.key, arguments.all))
+        {
+            RequireReplaceable(node, pair.key);
+            texts.push_back({node, ContentOf(node)});
+            SetContent(node, pair.value);
+        }
+        edit.RequireTexts(document.Get(), pair.value);
+    }
+    return edit.Finish(document.Get(), ChangesOf(texts));
+}
