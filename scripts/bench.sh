@@ -19,7 +19,7 @@ $programs/kx_bench_allocations >$results/allocations.json
 mapfile -t workloads < <($programs/kx_bench --benchmark_list_tests | sed 's,/[^/]*$,,' | awk '!seen[$0]++')
 rm -f $results/time-*.json
 rounds=${KX_BENCH_ROUNDS:-9}
-for round in $(seq $rounds); do
+for round in $(seq "$rounds"); do
     echo "== time, round $round of $rounds"
     # shellcheck disable=SC2001  # a regular expression
     for i in "${!workloads[@]}"; do

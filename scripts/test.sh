@@ -120,8 +120,8 @@ stage_all() {
 for stage in "$@"; do
     declare -F "stage_$stage" >/dev/null ||
         {
-            echo "$0: no stage \"$stage\"; there are fast, style, sanitize, package, abi98, engine, engines, arm, proof," \
-                "speed, docs, host, all" >&2
+            echo "$0: no stage \"$stage\"; there are fast, style, sanitize, package, abi98, engine, engines, arm," \
+                "proof, speed, docs, host, all" >&2
             exit 2
         }
 done

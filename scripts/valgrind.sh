@@ -16,7 +16,7 @@ check() {
     local expected=$1 log status=0
     shift
     log=$(mktemp -p $logs)
-    timeout 900 valgrind --quiet --error-exitcode=99 --leak-check=full \
+    timeout 900 valgrind --quiet --error-exitcode=99 --leak-check=full --num-callers=30 \
         --errors-for-leak-kinds=definite,indirect,possible --show-leak-kinds=definite,indirect,possible \
         --soname-synonyms=somalloc=nouserintercepts --suppressions=tests/valgrind.supp \
         "$@" >"$log" 2>&1 || status=$?

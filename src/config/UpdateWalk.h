@@ -39,7 +39,7 @@ public:
     bool Next()
     {
         xmlNode* next = m_element == 0 ? First() : IsRejected() ? AfterRejection() : FirstBelow();
-        while (next == 0 && !m_levels.IsTop())
+        while (next == 0 && m_element != 0 && !m_levels.IsTop())
         {
             next = AfterLevel();
         }

@@ -47,7 +47,15 @@ inline const xmlChar* NameOf(const xmlNode* node)
     return node != 0 && node->type != XML_NAMESPACE_DECL ? node->name : 0;
 }
 
-/** @return the namespace of @p node, or null; only elements and attributes have one. */
+/** @return whether @p node is an element or an XInclude mark, which was one and keeps its fields.
+ */
+inline bool HasElementFields(const xmlNode* node)
+{
+    return node->type == XML_ELEMENT_NODE || node->type == XML_XINCLUDE_START ||
+           node->type == XML_XINCLUDE_END;
+}
+
+/** @return the namespace of @p node, or null; only elements, marks and attributes have one. */
 inline xmlNs* NamespaceOf(const xmlNode* node)
 {
     // They have it at different places of the record.
@@ -55,13 +63,13 @@ inline xmlNs* NamespaceOf(const xmlNode* node)
     {
         return reinterpret_cast<const xmlAttr*>(node)->ns;
     }
-    return IsElement(node) ? node->ns : 0;
+    return HasElementFields(node) ? node->ns : 0;
 }
 
-/** @return the first attribute of @p node, which may be null; only elements have attributes. */
+/** @return the first attribute of @p node, which may be null; only elements and marks have any. */
 inline xmlAttr* AttributesOf(const xmlNode* node)
 {
-    return IsElement(node) ? node->properties : 0;
+    return node != 0 && HasElementFields(node) ? node->properties : 0;
 }
 
 /** @return whether a child linked under @p node, which may be null, is freed with it. */

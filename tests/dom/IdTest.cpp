@@ -314,6 +314,19 @@ TEST_F(IdTest, ElementWhoseContentIsReplacedKeepsItsId)
     EXPECT_NE(nullptr, NodeOf(document, "id('plain')"));
 }
 
+TEST_F(IdTest, AttributesOfAnXIncludeMarkAreForgottenToo)
+{
+    // The mark is the element that it replaces, with all its fields.
+    const xmlDocPtr document = Parse(kXml);
+    const xmlNodePtr mark = NodeOf(document, "id('plain')");
+    mark->type = XML_XINCLUDE_START;
+    EXPECT_EQ(0, CXmlNode(AttributeOf(mark)).SetContent("other"));
+    EXPECT_EQ(1u, CXmlNode(mark).GetAttributeItems().size());
+    EXPECT_EQ(0, RemoveNode(mark->parent));
+    ExpectSoundIds(document);
+    EXPECT_EQ(nullptr, xmlGetID(document, reinterpret_cast<const xmlChar*>("plain")));
+}
+
 TEST_F(IdTest, NodesWithoutADocumentHaveNone)
 {
     const auto name = reinterpret_cast<const xmlChar*>("b");

@@ -4,7 +4,8 @@
 zmodload zsh/zpty
 zpty shell zsh -f -i
 zpty -w shell "PROMPT='>'; TERM=dumb; fpath=(${(q)1} \$fpath); autoload -Uz compinit; compinit -u -D
-show() { print -r -- \"\$BUFFER\" >${(q)2}.new; mv ${(q)2}.new ${(q)2} }; zle -N show; bindkey '^T' show; print READY\$((1 + 1))"
+show() { print -r -- \"\$BUFFER\" >${(q)2}.new; mv ${(q)2}.new ${(q)2} }
+zle -N show; bindkey '^T' show; print READY\$((1 + 1))"
 zpty -r -m shell shown '*READY2*'
 zpty -w -n shell "$3"$'\t\x14'
 for i in {1..600}; do

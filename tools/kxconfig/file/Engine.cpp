@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <cstring>
 #include <new>
 
 namespace
@@ -11,6 +12,15 @@ namespace
 
 void IgnoreError(void*, EngineError)
 {
+}
+
+/** Engines up to 2.13 report a text above their limit of 10 MB with the code of a lack of memory.
+ */
+bool IsLackOfMemory(EngineError error)
+{
+    const bool isLimit =
+        error->message != nullptr && std::strstr(error->message, "huge text node") != nullptr;
+    return error->code == XML_ERR_NO_MEMORY && !isLimit;
 }
 
 void PrintNothing(void*, const char*, ...)
@@ -67,7 +77,7 @@ void FirstEngineError::Keep(void* self, EngineError error)
     FirstEngineError& errors = *static_cast<FirstEngineError*>(self);
     try
     {
-        errors.m_isOutOfMemory = errors.m_isOutOfMemory || error->code == XML_ERR_NO_MEMORY;
+        errors.m_isOutOfMemory = errors.m_isOutOfMemory || IsLackOfMemory(error);
         errors.KeepText(error);
     }
     catch (const std::bad_alloc&)

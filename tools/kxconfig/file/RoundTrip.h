@@ -9,7 +9,8 @@
 /** @return the bytes that CXMLWriter::SaveData() writes for @p document. */
 std::string SavedBytes(xmlDoc* document);
 
-/** @return the bytes of the file at @p path; none of what is not a regular file, or not readable. */
+/** @return the bytes of the file at @p path; none of what is not a regular file, or not readable.
+ */
 std::optional<std::string> BytesOf(const std::string& path);
 
 #endif

@@ -21,7 +21,8 @@ struct ExitStatusMeaning
 /** The one table of them: --help, the man page and the documentation show it. */
 const ExitStatusMeaning kExitStatuses[] = {
     {ExitStatus::Done, "success: found, changed, or no warnings"},
-    {ExitStatus::NothingFound, "nothing found; check: there are warnings; diff: there are differences"},
+    {ExitStatus::NothingFound,
+     "nothing found; check: there are warnings; diff: there are differences"},
     {ExitStatus::BadUsage, "usage error, malformed key or expression"},
     {ExitStatus::BadFile, "the file cannot be read, or is not well-formed XML"},
     {ExitStatus::NotSaved,
