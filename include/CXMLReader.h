@@ -69,8 +69,8 @@ public:
     /// the earlier GetDataPtr() and free it with xmlFreeDoc().
     virtual int ParseFile(const std::string& path);
 
-    /// Returns the values that key finds, or "" without a reason: no document, an empty key, a key
-    /// without ".", another root name and no match look the same.
+    /// Returns the values that key finds, or "". It does not distinguish no document, an empty key,
+    /// a key without ".", another root name and no match.
     ///
     /// Values under one parent on the last level run together, values from different branches are
     /// separated by "\n": for cfg.net.ip, the ip texts 1 and 2 in one net give "12", in two nets

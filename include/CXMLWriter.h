@@ -56,8 +56,8 @@ public:
     /// attributes, and never fills an empty element. Can change several elements, among them some
     /// that a lookup with the same key does not find: see docs/handbook/updates.md.
     ///
-    /// value is XML text up to its first NUL byte: write an ampersand as an entity reference, for a
-    /// bare one loses text. With an undefined reference or a control character a file can be saved
+    /// value is XML text up to its first NUL byte. Write an ampersand as an entity reference: a
+    /// bare one drops text. With an undefined reference or a control character a file can be saved
     /// that does not load. After an empty value no later update reaches the element. Short of
     /// memory, an element can be left empty although it counts as changed. Returns
     /// - 0 if an element was changed,

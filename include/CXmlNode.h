@@ -17,7 +17,7 @@
 /// refuses are listed in docs/handbook/document-toolkit.md.
 ///
 /// Strings are UTF-8. Names are compared as whole byte strings. Content that is set or added is XML
-/// text: write an ampersand as an entity reference, for a bare one loses text. Short of memory, new
+/// text. Write an ampersand as an entity reference: a bare one drops text. Short of memory, new
 /// content can be missing although an operation reports success. Operations throw only what strings
 /// and lists throw: std::bad_alloc and std::length_error.
 ///

@@ -20,28 +20,28 @@ Term TermCursor::Next()
 
 size_t TermCursor::FindSeparator()
 {
-    if (m_tookOr)
+    if (m_termEndsWithOr)
     {
         const size_t separator = m_remaining.Find('|');
         if (separator != m_remaining.size)
         {
             return separator;
         }
-        m_tookOr = false;
+        m_termEndsWithOr = false;
     }
     return m_remaining.Find('&');
 }
 
 bool ConditionTest::Next()
 {
-    const bool joinedByOr = m_others.TookOr();
+    const bool joinedByOr = m_others.TermEndsWithOr();
     if (m_others.AtEnd() || !(joinedByOr || m_accepted))
     {
         return false;
     }
     m_term = m_others.Next();
     m_termHolds = HasAttribute(m_element, m_term);
-    // Whatever a "&" joins a term to has been accepted, or it would have rejected.
+    // Reached by "&" only if the terms so far are accepted.
     m_accepted = (joinedByOr && m_accepted) || m_termHolds;
     return true;
 }

@@ -22,23 +22,23 @@ typedef AttributeView Term;
 class TermCursor
 {
 public:
-    explicit TermCursor(TextView condition) : m_remaining(condition), m_tookOr(true) {}
+    explicit TermCursor(TextView condition) : m_remaining(condition), m_termEndsWithOr(true) {}
 
     bool AtEnd() const { return m_remaining.IsEmpty(); }
     Term Next();
 
     /** @return whether "|" follows the term taken last: it decides how the next one is joined. */
-    bool TookOr() const { return m_tookOr; }
+    bool TermEndsWithOr() const { return m_termEndsWithOr; }
 
 private:
     size_t FindSeparator();
 
     TextView m_remaining;
-    bool m_tookOr; ///< once false, no "|" is left
+    bool m_termEndsWithOr; ///< once false, no "|" is left
 };
 
 /**
- * What the attributes of an element must fulfil; without a text, nothing.
+ * What the attributes of an element must fulfill; without a text, nothing.
  *
  * The first term is split once for all elements of a level: most conditions have no other.
  */
@@ -70,7 +70,7 @@ struct Condition
  * Tests a condition, which is not empty, on an element: term by term, from left to right, without
  * precedence of one separator over the other.
  *
- * A test stands on a term that has been tested, from its construction on.
+ * The constructor tests the first term.
  */
 class ConditionTest
 {
@@ -88,7 +88,7 @@ public:
     bool Next();
 
     const Term& GetTerm() const { return m_term; }
-    bool TermEndsWithOr() const { return m_others.TookOr(); }
+    bool TermEndsWithOr() const { return m_others.TermEndsWithOr(); }
     bool TermHolds() const { return m_termHolds; }
 
     /** @return what all terms so far amount to. */

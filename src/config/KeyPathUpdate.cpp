@@ -16,8 +16,7 @@ int UpdateValues(xmlNode* top, TextView key, const char* value, unsigned int& up
     UpdateWalk walk(top, key);
     while (walk.Next())
     {
-        // Also in the middle of a path: an element that holds only text is meant.
-        if (walk.IsSelected() && OnlyTextChild(walk.Element()) != 0)
+        if (walk.ReplacesText())
         {
             SetContent(walk.Element(), reinterpret_cast<const xmlChar*>(value));
             updated = 1;

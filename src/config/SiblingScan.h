@@ -12,7 +12,7 @@ namespace kx
  * which of them a segment selects.
  *
  * An element of another name suspends the condition: the next element of the name is selected
- * whatever its attributes, and only then is the condition in force again. Clients rely on it.
+ * regardless of its attributes, and only then is the condition in force again. Clients rely on it.
  */
 class SiblingScan
 {
@@ -47,7 +47,10 @@ public:
     /** @return whether the element bears the segment's name. */
     bool IsNamed() const { return m_isNamed; }
 
-    /** @return whether the element is selected by its name alone, whatever the condition. */
+    /**
+     * @return whether a named element is selected regardless of the condition, because the element
+     *         before it has another name; also true without a condition.
+     */
     bool IsSuspended() const { return m_isSuspended; }
 
     bool IsSelected() const

@@ -6,7 +6,12 @@
 namespace kx
 {
 
-/** What the elements on one level of an update are compared with. */
+/**
+ * What the elements on one level of an update are compared with.
+ *
+ * A key without a "." is its own rest: the levels below are compared with the same segment again.
+ * docs/handbook/updates.md has the rules.
+ */
 struct UpdateLevel
 {
     explicit UpdateLevel(TextView itsKey)
@@ -17,11 +22,11 @@ struct UpdateLevel
     {
     }
 
-    /** @return whether the key has no ".". */
+    /** @return whether the key has no ".": then its rest is the same segment again. */
     bool IsLast() const { return rest.data == key.data; }
 
     TextView key;  ///< what this level was entered with
-    TextView rest; ///< what the level below is entered with: without a ".", the same key again
+    TextView rest; ///< what the level below is entered with; the key itself if that has no "."
     Segment first; ///< for the first element child
     Segment later; ///< for the siblings after it: all of the rest, cut at its first "@" only
 };
@@ -37,7 +42,7 @@ class UpdateLevels
 public:
     explicit UpdateLevels(TextView key)
         : m_key(key),
-          m_repeats(0),
+          m_levelsBelowLast(0),
           m_current(&m_one),
           m_neighbor(&m_other),
           m_one(key),
@@ -47,13 +52,13 @@ public:
 
     const UpdateLevel& Current() const { return *m_current; }
 
-    bool IsTop() const { return m_repeats == 0 && m_current->key.data == m_key.data; }
+    bool IsTop() const { return m_levelsBelowLast == 0 && m_current->key.data == m_key.data; }
 
     void Descend()
     {
         if (m_current->IsLast())
         {
-            ++m_repeats;
+            ++m_levelsBelowLast;
             return;
         }
         GoTo(m_current->rest);
@@ -61,9 +66,9 @@ public:
 
     void Ascend()
     {
-        if (m_repeats != 0)
+        if (m_levelsBelowLast != 0)
         {
-            --m_repeats;
+            --m_levelsBelowLast;
             return;
         }
         const bool isAbove = m_neighbor->rest.data == m_current->key.data;
@@ -85,7 +90,7 @@ private:
         m_neighbor = left;
     }
 
-    /** @return the key whose rest begins at @p rest: it reaches back to the "." before the last. */
+    /** @return the key of the level above, found by stepping back one segment from @p rest. */
     TextView KeyAbove(const char* rest) const
     {
         const char* begin = rest - 1;
@@ -97,7 +102,7 @@ private:
     }
 
     const TextView m_key;
-    size_t m_repeats; ///< levels below the key's last segment that are compared with it again
+    size_t m_levelsBelowLast; ///< levels below the last segment that are compared with it again
     UpdateLevel* m_current;
     UpdateLevel* m_neighbor;
     UpdateLevel m_one;

@@ -12,9 +12,9 @@ namespace kx
  * The walk of an update: stands on the elements below a node in turn, in document order, and
  * answers which of them the key addresses.
  *
- * It goes below every element that no condition rejects, whatever its name. It finds its way back
- * by the elements' parents, and the status to return is always that of the level left last: without
- * recursion, a document of any depth costs no stack.
+ * It goes below every element that no condition rejects, including those of another name. It finds
+ * its way back by the elements' parents, and the status to return is always that of the level left
+ * last: without recursion, a document of any depth costs no stack.
  */
 class UpdateWalk
 {
@@ -60,6 +60,9 @@ public:
     bool IsNamed() const { return m_isNamed; }
 
     bool IsSelected() const { return m_isSelected; }
+
+    /** @return whether an update replaces the element's text: also in the middle of a path. */
+    bool ReplacesText() const { return m_isSelected && OnlyTextChild(m_element) != 0; }
 
     /** @return whether a condition keeps the walk from the element and all that is below it. */
     bool IsRejected() const { return m_isNamed && !m_isSelected; }

@@ -148,7 +148,7 @@ std::string CXmlNode::Name()
     return name;
 }
 
-// --- Navigation, from element to element: whatever lies between them is stepped over
+// --- Navigation, from element to element: everything between them is stepped over
 
 CXmlNode CXmlNode::Parent()
 {

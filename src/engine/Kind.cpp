@@ -111,7 +111,7 @@ bool CanBeRemoved(const xmlNode* node)
     }
     switch (node->type)
     {
-    case XML_ENTITY_REF_NODE: // nothing points to it, whatever its child
+    case XML_ENTITY_REF_NODE: // nothing points to it, regardless of its child
         return true;
     case XML_DTD_NODE:
         return !HasChild(node, IsGeneralEntity);

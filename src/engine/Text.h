@@ -35,7 +35,7 @@ struct TextView
     /** @return the bytes before @p position. */
     TextView Before(size_t position) const { return TextView(data, position); }
 
-    /** @return the bytes after @p position; empty if the view ends there or before. */
+    /** @return the bytes behind @p position, without the byte at it; empty if there are none. */
     TextView After(size_t position) const
     {
         const size_t begin = position + (position < size);

@@ -28,7 +28,7 @@ TEXT
     exit 1
 fi
 
-# Of the allowed symbols that tell their version, those of a version above the oldest engine's.
+# Of the allowed symbols that have a version, those of a version above the oldest engine's.
 newer=$(join <(echo "$allowed") <(echo "$provided") | while read -r symbol version; do
     [[ $version == "$oldest".* ]] || [ "$(printf '%s\n' "$version" $oldest | sort -V | tail -n 1)" = $oldest ] ||
         echo "$symbol came with $version"
@@ -39,4 +39,4 @@ if [ -n "$newer" ]; then
     exit 1
 fi
 echo "$(wc -l <<<"$imported") imports, of $(wc -l <<<"$allowed") allowed;" \
-    "$(grep -c . <<<"$provided" || true) symbols of the engine tell their version"
+    "$(grep -c . <<<"$provided" || true) symbols of the engine have a version"

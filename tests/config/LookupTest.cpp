@@ -768,7 +768,7 @@ TEST_F(LookupTest, RecursionSearchesBelowAnyNode)
     EXPECT_EQ("", m_reader->XMLGetValue(Root()->children->children->children, "ip"));
 }
 
-TEST_F(LookupTest, AppendingRecursionTellsByFoundAndNotByItsStatus)
+TEST_F(LookupTest, AppendingRecursionReportsByFoundAndNotByItsStatus)
 {
     std::string value;
     unsigned found = 0;

@@ -266,7 +266,7 @@ TEST_F(UpdateTest, RejectedByTheLastSegmentMeansNoSiblingIsFound)
               Set("<cfg><p n=\"1\">v</p><p n=\"2\">w</p><p n=\"2\">u</p></cfg>", "cfg.p@n=2", "x"));
 }
 
-TEST_F(UpdateTest, LastSegmentIsSoughtBelowTheSiblingOfARejectedElement)
+TEST_F(UpdateTest, LastSegmentIsMatchedBelowTheSiblingOfARejectedElement)
 {
     EXPECT_EQ((Result{0, "<cfg><p n=\"1\">v</p><q><p n=\"2\">x</p></q></cfg>"}),
               Set("<cfg><p n=\"1\">v</p><q><p n=\"2\">w</p></q></cfg>", "cfg.p@n=2", "x"));
@@ -481,7 +481,7 @@ TEST_F(UpdateTest, RecursionAnswersANullNodeOrAnEmptyKeyAtOnce)
     EXPECT_EQ(5u, updated);
 }
 
-TEST_F(UpdateTest, RecursionTellsByUpdatedAndNeverResetsIt)
+TEST_F(UpdateTest, RecursionReportsByUpdatedAndNeverResetsIt)
 {
     Load("<cfg><a>1</a><b><a>1</a></b></cfg>");
     CXMLWriter writer;

@@ -38,7 +38,7 @@ protected:
     const std::string m_other = m_folder.Write("other.xml", "<cfg><name>lid</name></cfg>");
     const std::string m_missing = m_folder.Path("missing.xml");
 
-    /** A document that nobody holds yet. */
+    /** A document without an owner yet. */
     static xmlDocPtr Loose() { return ParseText("<cfg><name>loose</name></cfg>"); }
 };
 

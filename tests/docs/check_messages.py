@@ -144,14 +144,14 @@ def listed(page):
 
 def main():
     source, headers, page = map(pathlib.Path, sys.argv[1:])
-    logged, told = set(Sources(source, headers).records()), set(listed(page))
+    logged, documented = set(Sources(source, headers).records()), set(listed(page))
     logged |= {(text, 11, None) for text in TRACE}
-    for text, level, operation in sorted(logged - told, key=str):
+    for text, level, operation in sorted(logged - documented, key=str):
         print(f'{page}: missing: "{text}" at level {level} from {operation}')
-    for text, level, operation in sorted(told - logged, key=str):
+    for text, level, operation in sorted(documented - logged, key=str):
         print(f'{page}: not in the sources: "{text}" at level {level} from {operation}')
     print(f"{len(logged)} records, by text, level and operation")
-    return 0 if logged == told else 1
+    return 0 if logged == documented else 1
 
 
 sys.exit(main())

@@ -104,7 +104,7 @@ TEST_F(HandleTest, DestroyingEveryHandleLeavesTheTreeUntouched)
 
 // --- Type and name
 
-TEST_F(HandleTest, TypeTellsTheKindOfNode)
+TEST_F(HandleTest, TypeIsTheKindOfNode)
 {
     EXPECT_EQ(0, m_null.Type());
     EXPECT_EQ(1, CXmlNode(Node("//net")).Type());
@@ -341,7 +341,7 @@ TEST_F(HandleTest, ClearNodeRemovesChildrenBeforeAttributes)
     g_freed.clear();
     EXPECT_EQ(0, CXmlNode(document->children).ClearNode());
     xmlDeregisterNodeDefault(before);
-    // An attribute is told before its text.
+    // An attribute is reported before its text.
     EXPECT_EQ((std::vector<xmlElementType>{XML_ELEMENT_NODE, XML_ELEMENT_NODE, XML_ATTRIBUTE_NODE,
                                            XML_TEXT_NODE, XML_ATTRIBUTE_NODE, XML_TEXT_NODE}),
               g_freed);

@@ -56,7 +56,7 @@ protected:
     /**
      * Expects that @p change, given the element @p xpath, answers 0 and leaves @p left IDs of that
      * element and below, with memory to spare and with any of the engine's requests failing. The
-     * engine tells which are IDs: newer ones leave out the value with a reference.
+     * engine decides which are IDs: newer ones leave out the value with a reference.
      */
     void ExpectIds(const std::string& xpath, int (*change)(xmlNodePtr),
                    const std::function<std::size_t(xmlNodePtr)>& left)

@@ -705,7 +705,7 @@ TEST_P(NodeKindTest, IsInTheTableOnceForEachOperation)
     }
 }
 
-TEST_P(NodeKindTest, IsToldByTypeAndName)
+TEST_P(NodeKindTest, IsRecognizedByTypeAndName)
 {
     ASSERT_NE(nullptr, m_subject->Node());
     EXPECT_FALSE(Handle().IsNull());
@@ -850,7 +850,7 @@ TEST_P(NodeKindTest, StaysSafeAfterAnyTwoChanges)
     }
 }
 
-// --- What the kind alone does not tell
+// --- What the kind alone does not decide
 
 class NodeTest : public DomTest
 {

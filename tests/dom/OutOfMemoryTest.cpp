@@ -346,7 +346,7 @@ TEST_F(OutOfMemoryTest, QueryAnswersOrSaysWhyNot)
                                records == Records({noAnswer, noResult}));
         return right && calls.LiveContexts() == 0 ? (failed ? 0 : 1) : 2;
     };
-    // Some engines end the process when one of these requests fails, whoever asks.
+    // Some engines end the process when one of these requests fails, regardless of the caller.
     const auto engineSurvives = [&](std::size_t n)
     {
         return InAProcess(

@@ -10,7 +10,7 @@
 namespace kxmodel
 {
 
-/** What the comparisons met, to tell whether they were worth the time. */
+/** What the comparisons met, to show whether they were worth the time. */
 struct Tally
 {
     std::size_t documents = 0; ///< that were parsed

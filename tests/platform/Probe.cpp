@@ -71,7 +71,7 @@ int LogWithoutMemory()
     return 0;
 }
 
-/** Logs into a broken pipe while a SIGPIPE of somebody else's is pending: that one stays. */
+/** Logs into a broken pipe while a SIGPIPE from another source is pending: that one stays. */
 int LogWithPendingSignal()
 {
     sigset_t pipeSignal;
@@ -157,7 +157,7 @@ int LogPiecemeal()
     return 0;
 }
 
-/** Logs with nobody to read it, in the way @p how says; the process must live on unchanged. */
+/** Logs without a reader, in the way that @p how names; the process must live on unchanged. */
 int LogIntoTheVoid(const std::string& how)
 {
     if (how == "closed")

@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # Shows what the QNX toolchain file makes of an SDK: there is none here, so that a stand-in for qcc takes its place,
-# which notes how it was called and lets this machine's compiler do the work. What the SDK's own compiler says to
-# the code is for docs/development/building-for-qnx.md to tell.
+# which notes how it was called and lets this machine's compiler do the work. For what the SDK's own compiler
+# says to the code, see docs/development/building-for-qnx.md.
 # usage: check_qnx_toolchain.sh SOURCE_FOLDER WORK_FOLDER LIBXML2_INCLUDE_FOLDER LIBXML2_LIBRARY
 set -euo pipefail
 

@@ -42,7 +42,7 @@ std::vector<std::string> EmulatorWords()
 
 void SetEnvironment(const std::vector<std::string>& settings)
 {
-    unsetenv("KX_LOG_MASK"); // whoever runs the tests may have set it
+    unsetenv("KX_LOG_MASK"); // the environment of the tests may have set it
     for (const std::string& setting : settings)
     {
         putenv(const_cast<char*>(setting.c_str()));

@@ -112,7 +112,7 @@ TEST_F(KxconfigCheck, WarnsOfAConditionThatIsSuspended)
 
 TEST_F(KxconfigCheck, NamesTheElementThatSuspendsTheCondition)
 {
-    // The first of another name suspends the condition only for one that fulfils it anyway.
+    // The first of another name suspends the condition only for one that fulfills it anyway.
     Write("<cfg>\n<z/>\n<a i=\"1\">1</a>\n<a i=\"2\"/>\n<y/>\n<x/>\n<a i=\"3\"/></cfg>");
     ExpectWarnings(
         {"8: /cfg/a[3] is accepted for \"a@i=1\" although it does not fulfill it: /cfg/y "
@@ -444,7 +444,7 @@ TEST_F(KxconfigCheck, WarnsOfARepeatedAttributeThatTheFirstElementLacks)
     ExpectWarnings({"5: /cfg/a[3] has the same i=\"1\" as /cfg/a[2] (line 4)"});
 }
 
-TEST_F(KxconfigCheck, TakesAllAttributesTogetherForWhatTellsElementsApart)
+TEST_F(KxconfigCheck, DistinguishesElementsByAllAttributesTogether)
 {
     Write("<cfg>\n<a c=\"1\" l=\"x\">v</a>\n<a c=\"1\" l=\"y\">v</a>\n<a c=\"2\" l=\"x\">v</a>\n"
           "<a c=\"2\" l=\"y\">v</a></cfg>");
@@ -454,7 +454,7 @@ TEST_F(KxconfigCheck, TakesAllAttributesTogetherForWhatTellsElementsApart)
     ExpectWarnings({"6: /cfg/a[4] has the same c=\"1\" l=\"y\" as /cfg/a[2] (line 4)"});
 }
 
-TEST_F(KxconfigCheck, TakesNoAttributeThatIsTheSameEverywhereForOneThatTellsElementsApart)
+TEST_F(KxconfigCheck, DistinguishesNoElementsByAnAttributeThatIsTheSameEverywhere)
 {
     Write("<cfg>\n<a u=\"C\">v</a>\n<a u=\"C\">v</a></cfg>");
     ExpectWarnings({});
@@ -508,7 +508,7 @@ TEST_F(KxconfigCheck, ListsThreeOfTheAttributesThatRepeat)
     ExpectWarnings({"5: /cfg/a[3] has the same i=\"1\" j=\"2\" k=\"3\" ... as /cfg/a[1] (line 3)"});
 }
 
-TEST_F(KxconfigCheck, TellsWhatSavingChangesFirst)
+TEST_F(KxconfigCheck, ReportsWhatSavingChangesFirst)
 {
     const auto expect = [this](const std::string& bytes, const std::vector<std::string>& warnings)
     {
@@ -563,7 +563,7 @@ TEST_F(KxconfigCheck, TellsWhatSavingChangesFirst)
            {"3: saving changes the end of the file: \"\\n\" is removed"});
 }
 
-TEST_F(KxconfigCheck, TellsThatSavingChangesAFileIfTheLibraryDoesChangeIt)
+TEST_F(KxconfigCheck, ReportsThatSavingChangesAFileIfTheLibraryDoesChangeIt)
 {
     const std::vector<std::string> documents = {
         "<cfg/>",
@@ -663,7 +663,7 @@ TEST_F(KxconfigCheck, EscapesTheBytesOfAFileInAnotherEncoding)
                   "\"\xC3\x83z</cfg>\""));
 }
 
-TEST_F(KxconfigCheck, TellsOfAFileOfOtherBytesThanItsCharacters)
+TEST_F(KxconfigCheck, ReportsAFileOfOtherBytesThanItsCharacters)
 {
     std::string utf16 = "\xFF\xFE";
     for (const char c : std::string("<cfg/>\n"))

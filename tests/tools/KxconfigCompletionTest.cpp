@@ -16,7 +16,7 @@ protected:
     const std::string m_plain = m_folder.Write(
         "plain.xml", "<cfg><net id='1'><ip>a</ip></net><net id='2'><ip>b</ip></net></cfg>");
 
-    /** @return what bash is offered when somebody types @p line, without quotes, and then the tab
+    /** @return what bash is offered when a user types @p line, without quotes, and then the tab
      * key. */
     static std::set<std::string> Completions(const std::string& line)
     {
@@ -38,7 +38,7 @@ protected:
     }
 };
 
-/** What somebody sees who types into a bash that works in the folder. */
+/** What a user sees who types into a bash that works in the directory. */
 class KxconfigTyped : public ToolTest
 {
 protected:

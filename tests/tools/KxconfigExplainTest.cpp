@@ -63,7 +63,7 @@ const std::string kRoot = "line 1: /cfg: the key starts with the root's name\n";
 
 } // namespace
 
-TEST_F(KxconfigExplain, TellsLevelByLevelWhatWasComparedWithWhat)
+TEST_F(KxconfigExplain, ExplainsLevelByLevelWhatWasComparedWithWhat)
 {
     ExpectExplained("cfg.net@id=1|id=2.ip", 0,
                     kRoot + "below /cfg: looking for \"net@id=1|id=2\"\n"
@@ -84,7 +84,7 @@ TEST_F(KxconfigExplain, TellsLevelByLevelWhatWasComparedWithWhat)
                             "\"10.0.0.1\\n10.0.0.2\\n10.0.0.3\"\n");
 }
 
-TEST_F(KxconfigExplain, TellsEachTermUntilOneRejects)
+TEST_F(KxconfigExplain, ExplainsEachTermUntilOneRejects)
 {
     const Outcome outcome = Tool({"explain", m_file, "cfg.net@on=y&id=9&x=1.ip"});
     EXPECT_EQ(0, outcome.status); // the third net is taken by its name alone
@@ -93,27 +93,27 @@ TEST_F(KxconfigExplain, TellsEachTermUntilOneRejects)
     EXPECT_THAT(outcome.out, HasSubstr("  line 3: net[2]: rejected: on is absent, not \"y\"\n"));
 }
 
-TEST_F(KxconfigExplain, TellsThatAnAmpersandAheadOfABarIsPartOfTheValue)
+TEST_F(KxconfigExplain, ExplainsThatAnAmpersandAheadOfABarIsPartOfTheValue)
 {
     EXPECT_THAT(Tool({"explain", m_file, "cfg.net@id=1&on=y|id=2.ip"}).out,
                 HasSubstr("  line 2: net[1]: rejected: id is \"1\", not \"1&on=y\" (\"&\" "
                           "before \"|\" is part of the value); or id is \"1\", not \"2\"\n"));
 }
 
-TEST_F(KxconfigExplain, TellsOfATermThatNamesNoAttribute)
+TEST_F(KxconfigExplain, ExplainsATermThatNamesNoAttribute)
 {
     EXPECT_THAT(
         Tool({"explain", m_file, "cfg.net@id.ip"}).out,
         HasSubstr("  line 2: net[1]: rejected: a term without an attribute name is never true\n"));
 }
 
-TEST_F(KxconfigExplain, TellsThatASuspendedConditionWouldHaveHeld)
+TEST_F(KxconfigExplain, ExplainsThatASuspendedConditionWouldHaveHeld)
 {
     EXPECT_THAT(Tool({"explain", m_file, "cfg.net@id=3.ip"}).out,
                 HasSubstr("suspended the condition \"id=3\", which it fulfills anyway\n"));
 }
 
-TEST_F(KxconfigExplain, TellsWhyAnAcceptedElementHasNoValue)
+TEST_F(KxconfigExplain, ExplainsWhyAnAcceptedElementHasNoValue)
 {
     EXPECT_EQ("  line 1: a: accepted; value \"x\"", LineAboutA("<a>x</a>"));
     EXPECT_EQ("  line 1: a: accepted; no value: it is empty", LineAboutA("<a/>"));
@@ -158,7 +158,7 @@ TEST_F(KxconfigExplain, SummarisesElementsThatAreAlike)
                 HasSubstr("  ... 999 more elements named x\n"));
 }
 
-TEST_F(KxconfigExplain, TellsThatAForeignRootCountsAsSuccess)
+TEST_F(KxconfigExplain, ExplainsThatAForeignRootCountsAsSuccess)
 {
     ExpectExplained("other.name", 1,
                     "line 1: /cfg: the key starts with \"other\", not with the root's name "
@@ -167,7 +167,7 @@ TEST_F(KxconfigExplain, TellsThatAForeignRootCountsAsSuccess)
                     "GetValue(key, value): status 0 (success), value \"\"\n");
 }
 
-TEST_F(KxconfigExplain, TellsOfKeysThatNameNothing)
+TEST_F(KxconfigExplain, ExplainsKeysThatNameNothing)
 {
     ExpectExplained("cfg", 2,
                     "line 1: /cfg: the key \"cfg\" has no \".\", so nothing is searched\n"
@@ -239,7 +239,7 @@ TEST_F(KxconfigExplain, UpdateByAKeyThatEndsInADotIsBadUsage)
     EXPECT_EQ(2, Tool({"explain", "--set", file, "cfg.a."}).status);
 }
 
-TEST_F(KxconfigExplain, TellsWhatAnUpdateReaches)
+TEST_F(KxconfigExplain, ExplainsWhatAnUpdateReaches)
 {
     ExpectUpdateExplained(
         "cfg.net@id=2.ip", 0,
@@ -257,7 +257,7 @@ TEST_F(KxconfigExplain, TellsWhatAnUpdateReaches)
                 "SetValue(key, value): status 0 (success)\n");
 }
 
-TEST_F(KxconfigExplain, TellsThatAnUpdateLosesTheLastSegmentAfterARejection)
+TEST_F(KxconfigExplain, ExplainsThatAnUpdateLosesTheLastSegmentAfterARejection)
 {
     const Outcome outcome = Tool({"explain", "--set", m_file, "cfg.net@id=2"});
     EXPECT_EQ(1, outcome.status);
@@ -265,7 +265,7 @@ TEST_F(KxconfigExplain, TellsThatAnUpdateLosesTheLastSegmentAfterARejection)
     EXPECT_THAT(outcome.out, HasSubstr("SetValue(key, value): status -2 (nothing found)\n"));
 }
 
-TEST_F(KxconfigExplain, TellsThatAnUpdateIgnoresAForeignRootAndATrailingDot)
+TEST_F(KxconfigExplain, ExplainsThatAnUpdateIgnoresAForeignRootAndATrailingDot)
 {
     EXPECT_THAT(Tool({"explain", "--set", m_file, "other.name"}).out,
                 HasSubstr("which counts as success\nSetValue(key, value): status 0 (success)\n"));
@@ -287,13 +287,13 @@ TEST_F(KxconfigExplain, NamesTheElementsThatSetChanges)
             const std::string step = location.substr(location.rfind('/') + 1);
             EXPECT_THAT(explained, HasSubstr(": " + step + ": accepted"));
         }
-        long told = 0;
+        long replaced = 0;
         for (auto at = explained.find(" is replaced\n"); at != std::string::npos;
              at = explained.find(" is replaced\n", at + 1))
         {
-            ++told;
+            ++replaced;
         }
-        EXPECT_EQ(count, told) << key;
+        EXPECT_EQ(count, replaced) << key;
     }
 }
 
@@ -305,9 +305,9 @@ TEST_F(KxconfigExplain, SaysWhereTheEngineStopsCountingLines)
     {
         std::vector<std::string> arguments = {"explain", file, "cfg.a"};
         arguments.insert(arguments.end(), update.empty() ? 0 : 1, update);
-        const std::string told = Tool(arguments).out;
-        EXPECT_THAT(told, HasSubstr("  line 65534: a[1]: accepted"));
-        EXPECT_THAT(told, HasSubstr("  line 65535 or later: a[2]: accepted"));
+        const std::string explained = Tool(arguments).out;
+        EXPECT_THAT(explained, HasSubstr("  line 65534: a[1]: accepted"));
+        EXPECT_THAT(explained, HasSubstr("  line 65535 or later: a[2]: accepted"));
     }
 }
 

@@ -118,7 +118,7 @@ TEST_F(KxconfigFind, NamespaceWithoutAPrefixHasALocationThatFindsIt)
     EXPECT_EQ(location, nlohmann::json::parse(outcome.out).at("results")[0].at("location"));
 }
 
-TEST_F(KxconfigFind, TellsHowToSelectByANameWithAPrefix)
+TEST_F(KxconfigFind, ExplainsHowToSelectByANameWithAPrefix)
 {
     const std::string file = m_folder.Write("ns.xml", "<p:a xmlns:p='urn:p'><p:b>1</p:b></p:a>");
     const Outcome outcome = Tool({"find", file, "/p:a/p:b"});
@@ -182,7 +182,7 @@ TEST_F(KxconfigFind, GivesTheLocationsOfTheEngine)
     EXPECT_EQ(PathsOfTheEngine(file), locations);
 }
 
-TEST_F(KxconfigFind, TellsAPrefixWithoutANamespaceFromOneWithIt)
+TEST_F(KxconfigFind, DistinguishesAPrefixWithoutANamespaceFromOneWithIt)
 {
     // To the engine the undeclared prefix is a part of the name.
     const std::string file =

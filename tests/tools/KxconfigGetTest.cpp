@@ -211,7 +211,7 @@ TEST_F(KxconfigGet, SaysThatAFileMustNotBeRead)
 {
     if (geteuid() != 0)
     {
-        GTEST_SKIP() << "needs to run as the superuser, to become somebody else";
+        GTEST_SKIP() << "needs to run as the superuser, to become another user";
     }
     const std::string secret = m_folder.Write("secret.xml", "<cfg/>");
     ASSERT_EQ(0, chmod(secret.c_str(), 0600));

@@ -148,7 +148,7 @@ protected:
     }
 };
 
-// With twice the file four times the cost would be quadratic: 5/2 tells them apart. The bounds per
+// With twice the file four times the cost would be quadratic: 5/2 separates the two. The bounds per
 // byte are those that the handbook states.
 TEST_P(KxconfigCost, IsLinearInTheFile)
 {

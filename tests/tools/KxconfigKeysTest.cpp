@@ -59,7 +59,7 @@ TEST_F(KxconfigKeys, LeavesOutWhatHasNoValue)
               Keys("<cfg><a>1</a><b/><c><![CDATA[2]]></c><d>3<!--x--></d></cfg>"));
 }
 
-TEST_F(KxconfigKeys, TellsElementsOfOneNameApartByAnAttribute)
+TEST_F(KxconfigKeys, DistinguishesElementsOfOneNameByAnAttribute)
 {
     EXPECT_EQ("cfg.net@id=1.ip\t\"a\"\ncfg.net@id=2.ip\t\"b\"\n",
               Keys("<cfg><net id='1'><ip>a</ip></net><net id='2'><ip>b</ip></net></cfg>"));
@@ -68,7 +68,7 @@ TEST_F(KxconfigKeys, TellsElementsOfOneNameApartByAnAttribute)
         Keys("<cfg><net a='x' b='1'><ip>a</ip></net><net a='x' b='2'><ip>b</ip></net></cfg>"));
 }
 
-TEST_F(KxconfigKeys, AddsNoConditionWhereTheNameTells)
+TEST_F(KxconfigKeys, AddsNoConditionWhereTheNameSuffices)
 {
     EXPECT_EQ("cfg.net.ip\t\"a\"\n", Keys("<cfg><net id='1'><ip>a</ip></net></cfg>"));
 }
@@ -142,7 +142,7 @@ TEST_F(KxconfigKeys, TakesTheTextsOnTheWayToAnElement)
     EXPECT_EQ("cfg.a\t\"1\"\ncfg.a.b\t\"1\\n2\"\n", Keys("<cfg><a>1</a><a><b>2</b></a></cfg>"));
 }
 
-TEST_F(KxconfigKeys, TellsApartByAnAttributeWithAPrefix)
+TEST_F(KxconfigKeys, DistinguishesByAnAttributeWithAPrefix)
 {
     // A condition finds it by its name without the prefix.
     EXPECT_EQ("cfg.a@i=1\t\"x\"\ncfg.a@i=2\t\"y\"\n",
@@ -152,12 +152,12 @@ TEST_F(KxconfigKeys, TellsApartByAnAttributeWithAPrefix)
               Keys("<cfg xmlns:p='urn:p'><a p:i='1' i='2'>x</a><a i='3' p:i='1'>y</a></cfg>"));
 }
 
-TEST_F(KxconfigKeys, TellsApartByTheDefaultOfAnAttribute)
+TEST_F(KxconfigKeys, DistinguishesByTheDefaultOfAnAttribute)
 {
     EXPECT_EQ("cfg.a@i=1\t\"x\"\ncfg.a@i=2\t\"y\"\n",
               Keys("<!DOCTYPE cfg [<!ATTLIST a i CDATA '1'>]>"
                    "<cfg><a>x</a><a i='2'>y</a></cfg>"));
-    // A default that another element bears as its own tells neither.
+    // A default that another element bears as its own distinguishes neither.
     EXPECT_EQ("cfg.a\t\"x\\ny\\nz\"\ncfg.a@i=2\t\"z\"\n",
               Keys("<!DOCTYPE cfg [<!ATTLIST a i CDATA '1'>]>"
                    "<cfg><a>x</a><a i='1'>y</a><a i='2'>z</a></cfg>"));

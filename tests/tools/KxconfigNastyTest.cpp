@@ -16,7 +16,7 @@ using testing::StartsWith;
 namespace
 {
 
-/** Every verb on files that nobody likes. */
+/** Every command on difficult files. */
 class KxconfigNasty : public ToolTest
 {
 protected:
@@ -66,7 +66,7 @@ TEST_F(KxconfigNasty, FilesThatCannotBeRead)
     ExpectBadFile(m_folder.Path(""), "cannot read " + m_folder.Path("") + ": Is a directory");
 }
 
-TEST_F(KxconfigNasty, FilesThatAreNoXmlAreToldWithTheLine)
+TEST_F(KxconfigNasty, FilesThatAreNoXmlAreReportedWithTheLine)
 {
     const auto expectOnLine = [this](int line, const std::string& bytes)
     {
@@ -119,7 +119,7 @@ TEST_F(KxconfigNasty, FilesThatOthersMustNotRead)
 {
     if (geteuid() != 0)
     {
-        GTEST_SKIP() << "needs to run as the superuser, to become somebody else";
+        GTEST_SKIP() << "needs to run as the superuser, to become another user";
     }
     const std::string file = m_folder.Write("cfg.xml", "<cfg><a>1</a></cfg>");
     ASSERT_EQ(0, chmod(m_folder.Path("").c_str(), 0755));

@@ -221,7 +221,7 @@ TEST_F(KxconfigSave, KeepsExtendedAttributes)
     EXPECT_EQ(4, getxattr(m_file.c_str(), "user.note", kept, sizeof kept));
 }
 
-TEST_F(KxconfigSave, RefusesToTakeAFileFromItsOwnerUnlessToldTo)
+TEST_F(KxconfigSave, RefusesToTakeAFileFromItsOwnerWithoutTheOption)
 {
     if (geteuid() != 0)
     {

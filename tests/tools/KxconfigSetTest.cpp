@@ -38,7 +38,7 @@ protected:
     }
 
     /**
-     * Sets the second net's ip to "x" while somebody else runs @p change, a script of the shell,
+     * Sets the second net's ip to "x" while another process runs @p change, a script of the shell,
      * after the file is loaded and before it is saved.
      *
      * The tool is asked for the record of the key, which is longer than a pipe can hold. So when
@@ -237,7 +237,7 @@ TEST_F(KxconfigSet, SaysThatSavingFailed)
 
 TEST_F(KxconfigSet, SaysThatADeviceIsFull)
 {
-    // A node of the test's own: whoever replaced the real one by a file would harm the machine.
+    // A node of the test's own: replacing the real one by a file would harm the machine.
     const std::string full = m_folder.Path("full");
     if (mknod(full.c_str(), S_IFCHR | 0666, makedev(1, 7)) != 0)
     {
@@ -321,7 +321,7 @@ TEST_F(KxconfigSet, RefusesAFileThatMustNotBeWritten)
 {
     if (geteuid() != 0)
     {
-        GTEST_SKIP() << "needs to run as the superuser, to become somebody else";
+        GTEST_SKIP() << "needs to run as the superuser, to become another user";
     }
     ASSERT_EQ(0, chmod(m_folder.Path("").c_str(), 0777));
     ASSERT_EQ(0, chmod(m_file.c_str(), 0444));
@@ -336,7 +336,7 @@ TEST_F(KxconfigSet, SaysThatItIsTheFolderThatMustNotBeWritten)
 {
     if (geteuid() != 0)
     {
-        GTEST_SKIP() << "needs to run as the superuser, to become somebody else";
+        GTEST_SKIP() << "needs to run as the superuser, to become another user";
     }
     ASSERT_EQ(0, chmod(m_folder.Path("").c_str(), 0755));
     ASSERT_EQ(0, chmod(m_file.c_str(), 0666));
@@ -376,7 +376,7 @@ TEST_F(KxconfigSet, DoesNotTakeAFileFromItsGroup)
 {
     if (geteuid() != 0)
     {
-        GTEST_SKIP() << "needs to run as the superuser, to become somebody else";
+        GTEST_SKIP() << "needs to run as the superuser, to become another user";
     }
     // Writable for all, but of a group that the other user is not in.
     ASSERT_EQ(0, chmod(m_folder.Path("").c_str(), 0777));

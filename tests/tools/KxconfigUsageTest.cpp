@@ -32,7 +32,7 @@ protected:
 
 } // namespace
 
-TEST_F(KxconfigUsage, ManPageTellsAllThatHelpLists)
+TEST_F(KxconfigUsage, ManPageContainsAllThatHelpLists)
 {
     const Outcome page =
         RunShell(InShell(KX_CONFIG_TOOL) + " --man | LC_ALL=C groff -man -Tascii -ww -P -cbou");
@@ -53,7 +53,7 @@ TEST_F(KxconfigUsage, ManPageTellsAllThatHelpLists)
     EXPECT_THAT(page.out, HasSubstr("kxconfig get device.xml 'cfg.net@id=2.ip'"));
 }
 
-TEST_F(KxconfigUsage, ExitStatusesAreToldAlikeByHelpManPageAndDocumentation)
+TEST_F(KxconfigUsage, ExitStatusesAreTheSameInHelpManPageAndDocumentation)
 {
     const std::string help = Tool({"--help"}, {"COLUMNS=1000"}).out;
     const std::string page = Tool({"--man"}).out;

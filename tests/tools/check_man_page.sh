@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Checks that the man page is well-formed and tells of each option, command and argument that --help lists.
+# Checks that the man page is well-formed and describes each option, command and argument that --help lists.
 # usage: check_man_page.sh MAN_PAGE KXCONFIG
 set -euo pipefail
 
@@ -18,7 +18,7 @@ options=$(grep -oE '^ +(-[a-z], )?--[a-z-]+' <<<"$help" | grep -oE -- '--[a-z-]+
 commands=$(sed -nE '/^Commands:/,/^$/s/^  ([a-z]+) .*/\1/p' <<<"$help")
 [ -n "$options" ] && [ -n "$commands" ]
 for word in $options $commands; do
-    grep -qwF -e "$word" <<<"$text" || { echo "the man page does not tell of $word"; exit 1; }
+    grep -qwF -e "$word" <<<"$text" || { echo "the man page does not describe $word"; exit 1; }
 done
 
 # "NAME meaning" of each argument, from lines such as "  FILE      an XML file".
@@ -36,11 +36,11 @@ section()
 
 for command in $commands; do
     arguments=$(positionals "$command")
-    [ -n "$arguments" ] || { echo "$command --help tells of no arguments"; exit 1; }
+    [ -n "$arguments" ] || { echo "$command --help describes no arguments"; exit 1; }
     while read -r argument; do
         grep -qF -e " $argument " <<<"$(section "$command")" ||
-            { echo "the man page does not tell of $command: $argument"; exit 1; }
+            { echo "the man page does not describe $command: $argument"; exit 1; }
     done <<<"$arguments"
 done
 # shellcheck disable=SC2086  # words
-echo "tells of" $options $commands
+echo "describes" $options $commands

@@ -19,7 +19,7 @@ from pathlib import Path
 
 SECONDS = 60
 
-# What the shell does is told by files, so that neither prompt nor echo has to be understood: the key ^T writes the
+# What the shell does is reported by files, so that neither prompt nor echo has to be understood: the key ^T writes the
 # line, and kxconfig its arguments. Only the completion calls it from a subshell, and gets the program.
 SETUP = """
 bind 'set bell-style none'
@@ -51,7 +51,7 @@ def ask(terminal, answer, keys):
         if time.monotonic() > end:
             sys.exit("bash does not answer")
         if select.select([terminal], [], [], 0.01)[0]:
-            os.read(terminal, 65536)  # or the shell would wait for somebody who reads
+            os.read(terminal, 65536)  # or the shell would wait for a reader
     text = answer.read_bytes()
     answer.unlink()
     return text

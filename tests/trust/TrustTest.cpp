@@ -142,7 +142,7 @@ TEST_F(TrustTest, NetworkAddressesAreTriedByReaderAndWriter)
         _exit(reader.GetValue("cfg.a") == "v" ? 0 : 1);
     }
     pollfd incoming = {listener, POLLIN, 0};
-    EXPECT_EQ(1, poll(&incoming, 1, 30000)) << "nobody calls";
+    EXPECT_EQ(1, poll(&incoming, 1, 30000)) << "no connection";
     const int connection = accept(listener, nullptr, nullptr);
     const std::string answer =
         "HTTP/1.0 200 OK\r\nContent-Type: text/xml\r\n\r\n<cfg><a>v</a></cfg>";

@@ -1,7 +1,7 @@
 #ifndef KX_BENCH_WITHOUT_GATES_LOG_H
 #define KX_BENCH_WITHOUT_GATES_LOG_H
 
-// Stands in front of src/diag/Log.h in the build that tells what the gates cost: every gate is
+// Replaces src/diag/Log.h in the build that measures what the gates cost: every gate is
 // checked by the compiler and left out.
 
 #include "../../../src/diag/Log.h"

@@ -73,29 +73,29 @@ void CheckText(const xmlNode* element, Findings& findings)
 using Group = std::vector<const xmlNode*>;             // siblings of one name
 using Attributes = std::map<std::string, std::string>; // values by name
 
-/** @return of each element of @p group the attributes that can tell it apart: those that do not
+/** @return of each element of @p group the attributes that can distinguish it: those that do not
  * have one and the same value in all of them. */
-std::vector<Attributes> TellingAttributes(const Group& group, const Levels& levels)
+std::vector<Attributes> DistinguishingAttributes(const Group& group, const Levels& levels)
 {
-    std::vector<Attributes> telling;
+    std::vector<Attributes> distinguishing;
     std::map<Attributes::value_type, size_t> bearers;
     for (const xmlNode* const element : group)
     {
-        telling.push_back(levels.AttributesOf(element));
-        for (const auto& attribute : telling.back())
+        distinguishing.push_back(levels.AttributesOf(element));
+        for (const auto& attribute : distinguishing.back())
         {
             ++bearers[attribute];
         }
     }
-    for (Attributes& attributes : telling)
+    for (Attributes& attributes : distinguishing)
     {
         for (auto attribute = attributes.begin(); attribute != attributes.end();)
         {
-            const bool tells = bearers[*attribute] != group.size();
-            attribute = tells ? std::next(attribute) : attributes.erase(attribute);
+            const bool distinguishes = bearers[*attribute] != group.size();
+            attribute = distinguishes ? std::next(attribute) : attributes.erase(attribute);
         }
     }
-    return telling;
+    return distinguishing;
 }
 
 /** @return the first of @p attributes as they stand in a tag. */
@@ -115,7 +115,7 @@ std::string Listed(const Attributes& attributes)
     return list;
 }
 
-/** An element that none of its telling attributes tells from one before it. */
+/** An element whose distinguishing attributes are those of one before it. */
 struct Repeat
 {
     const xmlNode* element;
@@ -123,11 +123,11 @@ struct Repeat
     const Attributes* attributes;
 };
 
-/** The elements of a group that bear the same telling attributes. */
+/** The elements of a group that bear the same distinguishing attributes. */
 using Bearers = std::map<Attributes, Group>;
 
 /** @return whether the attributes seem to identify elements, so that a repeat is a mistake: those
- * that do repeat are no more than the elements that are told apart. */
+ * that do repeat are no more than the elements that are distinguished. */
 bool Identify(const Bearers& bearers)
 {
     std::ptrdiff_t balance = 0;
@@ -139,18 +139,18 @@ bool Identify(const Bearers& bearers)
     return balance >= 0;
 }
 
-/** @param telling  what TellingAttributes() gives for @p group. */
-std::vector<Repeat> RepeatsIn(const Group& group, const std::vector<Attributes>& telling)
+/** @param distinguishing  what DistinguishingAttributes() gives for @p group. */
+std::vector<Repeat> RepeatsIn(const Group& group, const std::vector<Attributes>& distinguishing)
 {
     Bearers bearers;
     std::vector<Repeat> repeats;
     for (size_t i = 0; i != group.size(); ++i)
     {
-        Group& alike = bearers[telling[i]];
+        Group& alike = bearers[distinguishing[i]];
         alike.push_back(group[i]);
-        if (alike.size() > 1 && !telling[i].empty())
+        if (alike.size() > 1 && !distinguishing[i].empty())
         {
-            repeats.push_back({group[i], alike.front(), &telling[i]});
+            repeats.push_back({group[i], alike.front(), &distinguishing[i]});
         }
     }
     return Identify(bearers) ? repeats : std::vector<Repeat>();
@@ -162,8 +162,8 @@ void CheckGroup(const Group& group, const Levels& levels, Findings& findings)
     {
         return;
     }
-    const std::vector<Attributes> telling = TellingAttributes(group, levels);
-    const std::vector<Repeat> repeats = RepeatsIn(group, telling);
+    const std::vector<Attributes> distinguishing = DistinguishingAttributes(group, levels);
+    const std::vector<Repeat> repeats = RepeatsIn(group, distinguishing);
     if (repeats.empty())
     {
         return;

@@ -41,7 +41,7 @@ void CheckOrder(const Order& order, const xmlNode* parent, const std::string& se
     if (order.taken != nullptr)
     {
         if (findings.Want(Kind::SuspendedCondition) &&
-            findings.IsNew(Kind::SuspendedCondition, parent, name))
+            findings.MarkReported(Kind::SuspendedCondition, parent, name))
         {
             findings.Add(
                 order.taken, Kind::SuspendedCondition,
@@ -52,7 +52,7 @@ void CheckOrder(const Order& order, const xmlNode* parent, const std::string& se
     }
     else if (order.other != nullptr && order.rejected != nullptr &&
              findings.Want(Kind::ConditionDependsOnOrder) &&
-             findings.IsNew(Kind::ConditionDependsOnOrder, parent, name))
+             findings.MarkReported(Kind::ConditionDependsOnOrder, parent, name))
     {
         findings.Add(order.rejected, Kind::ConditionDependsOnOrder,
                      findings.LocationOf(order.rejected) + " would be accepted for " +
@@ -73,7 +73,7 @@ Order OrderOf(const TrailLevel& level)
         const bool isRejected = step.verdict == Verdict::Rejected;
         order.other = isOther && order.other == nullptr ? step.element : order.other;
         order.rejected = isRejected && order.rejected == nullptr ? step.element : order.rejected;
-        if (step.suspended && order.taken == nullptr && !Fulfils(step.element, step.condition))
+        if (step.suspended && order.taken == nullptr && !Fulfills(step.element, step.condition))
         {
             order.taken = step.element;
             order.suspender = suspender;

@@ -30,8 +30,8 @@ public:
     void Add(const xmlNode* node, Kind kind, const std::string& text);
     void Add(long line, Kind kind, const std::string& text);
 
-    /** @return true once for each @p kind, @p level and @p name: many keys share a finding. */
-    bool IsNew(Kind kind, const xmlNode* level, const std::string& name)
+    /** @return whether it was not marked before: many keys share a finding. */
+    bool MarkReported(Kind kind, const xmlNode* level, const std::string& name)
     {
         return m_reported.emplace(kind, level, name).second;
     }

@@ -22,7 +22,7 @@ enum class Kind
     ChangedBySaving
 };
 
-/** A warning is about what changes a lookup or an update; anything else is a note. */
+/** A warning marks a problem for lookups or updates; anything else is a note. */
 enum class Severity
 {
     Warning,

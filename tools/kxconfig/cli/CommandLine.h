@@ -21,7 +21,7 @@ public:
     CommandLine& operator=(const CommandLine&) = delete;
 
     /**
-     * Parses @p arguments and tells @p report the form and the subject of the answer.
+     * Parses @p arguments and gives @p report the form and the subject of the answer.
      *
      * @return whether there is a command to run; false after --help and the like, which are
      *         answered at once.

@@ -241,6 +241,7 @@ void AddCheck(CLI::App& app, Request& request)
     check->add_flag("--notes", selection.notes, "also print notes, which are not warnings");
     AddKinds(*check, "--only", selection.only, "print this kind only, be it a warning or a note");
     AddKinds(*check, "--ignore", selection.ignored, "do not print this kind");
+    // CLI11 prints the text of a version flag and ends the run.
     check->set_version_flag("--kinds", KindList(), "list the kinds of warnings and notes");
 }
 

@@ -19,8 +19,8 @@ struct Example
 const Example kExamples[] = {
     {"get device.xml cfg.name", "print a value"},
     {"get device.xml cfg.net.ip", "print the values of every net, one on a line"},
-    {"get device.xml 'cfg.net@id=2.ip'", "print that of the net whose attribute id is 2"},
-    {"get device.xml 'cfg.net@id=1|id=2.ip'", "print those of both"},
+    {"get device.xml 'cfg.net@id=2.ip'", "print the ip of the net with id 2"},
+    {"get device.xml 'cfg.net@id=1|id=2.ip'", "print the ip of both nets"},
     {"explain device.xml 'cfg.net@id=2.ip'", "explain what a key finds, and why"},
     {"explain --set device.xml cfg.name", "explain what an update would reach, and why"},
     {"check device.xml", "report pitfalls for lookups"},
@@ -68,7 +68,7 @@ const char* const kKeyPaths =
     "the condition for the next element that matches by name. An element has a value only if text "
     "is its only child.";
 
-/** @return @p text as the language of man has to have it to print it as it is. */
+/** @return @p text escaped for man. */
 std::string Escaped(const std::string& text)
 {
     std::string escaped;
@@ -106,7 +106,7 @@ bool IsHidden(const CLI::Option& option)
     return option.get_group().empty();
 }
 
-/** @return what --help tells of the arguments of @p command. */
+/** @return the lines of --help about the arguments of @p command. */
 std::string Positionals(const CLI::App& command)
 {
     std::string page;

@@ -9,7 +9,7 @@ namespace CLI
 class App;
 }
 
-// What --help and the man page tell beyond the list of commands and options, from one source.
+// What --help and the man page contain beyond the list of commands and options, from one source.
 
 /** @return what --help prints for @p command, or for the program if that is null, in lines of at
  * most @p width columns. */

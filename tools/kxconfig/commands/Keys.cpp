@@ -23,7 +23,7 @@ const size_t kMostBytes = 1000;
 struct KeyAndValue
 {
     const std::string& key;
-    std::string value; ///< of several elements where a key cannot tell them apart
+    std::string value; ///< of several elements that a key cannot distinguish
     size_t more;       ///< the number of values that are left out
 
     std::string Line() const

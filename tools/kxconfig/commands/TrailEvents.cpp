@@ -142,7 +142,7 @@ std::string StepEvent::DescribeAcceptance() const
 std::string StepEvent::DescribeSuspension() const
 {
     const std::string wouldHold =
-        Fulfils(step.element, step.condition) ? "fulfills anyway" : "does not fulfill";
+        Fulfills(step.element, step.condition) ? "fulfills anyway" : "does not fulfill";
     return " by name alone: " + narration.StepOf(suspender) + " (line " + LineOf(suspender) +
            ") suspended the condition " + Quoted(Text(step.condition)) + ", which it " + wouldHold;
 }

@@ -15,8 +15,8 @@ public:
     explicit Attributes(int file);
 
     /**
-     * Gives @p file the same, as far as the system allows. Where it does not, nobody gets more
-     * rights than before: a group that is not kept has none, special bits go with the owner, and
+     * Gives @p file the same, as far as the system allows. Where it does not, rights are only
+     * reduced: a group that is not kept has none, special bits go with the owner, and
      * without the ACL the group has what the ACL gave it.
      */
     void ApplyTo(int file) const;

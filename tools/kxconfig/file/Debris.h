@@ -3,7 +3,7 @@
 
 #include <string>
 
-// A save that is killed can leave one file. Its name tells whose it is, and its lock whether the
+// A save that is killed can leave one file. Its name identifies it, and its lock shows whether the
 // save is still running.
 
 /** @return a new name for a file that is about to replace another: ".kxconfig-", 16 digits, ".tmp".

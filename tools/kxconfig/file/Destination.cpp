@@ -178,7 +178,7 @@ void Destination::RequireWritable() const
     }
 }
 
-/** Whoever may write the file looks for the reason in the file, not in its folder. */
+/** A user who may write the file looks for the reason in the file, not in its directory. */
 std::unique_ptr<Replacement> Destination::MakeReplacement() const
 {
     const mode_t onlyOwner = 0600; // until the attributes of the old file are known to be kept

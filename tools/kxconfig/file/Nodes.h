@@ -27,10 +27,10 @@ inline std::string Text(const kx::TextView& view)
 /** The same of a text that the caller owns, which is freed. */
 std::string Taken(xmlChar* text);
 
-/** @return the line of the file that @p node stands on; negative for the document. */
+/** @return the line of the file that @p node is on; negative for the document. */
 long LineNumberOf(const xmlNode* node);
 
-/** The same as it is told: the engine counts up to 65535. */
+/** The same as it is printed: the engine counts up to 65535. */
 std::string LineOf(const xmlNode* node);
 
 /** @return the text of @p node and of all below it. */

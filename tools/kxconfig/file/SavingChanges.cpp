@@ -19,7 +19,7 @@ namespace
 /** Bytes after a difference that are read: more than are shown of a text. */
 const size_t kBytesAfter = 64;
 
-/** Bytes before a difference that tell what it is: of a character, or of a reference. */
+/** Bytes before a difference that identify it: of a character, or of a reference. */
 const size_t kBytesBefore = 16;
 
 bool IsBlank(char c)

@@ -5,7 +5,7 @@
 namespace
 {
 
-/** Of a text from a file, this many bytes tell people which one it is. */
+/** This many bytes identify a text from a file. */
 const size_t kShownBytes = 40;
 
 /** @return the byte at @p position; 0 behind the end. */

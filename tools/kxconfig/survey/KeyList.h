@@ -7,7 +7,7 @@
 #include <vector>
 
 /** @return the key path of each element with a value, in document order and each key once; with a
- * condition where others bear the same name and an attribute tells them apart. */
+ * condition where others bear the same name and an attribute distinguishes them. */
 std::vector<std::string> ListKeys(const xmlNode* root, Levels& levels);
 
 #endif

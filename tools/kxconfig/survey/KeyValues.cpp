@@ -80,7 +80,8 @@ void KeyValues::ReachFrom(const xmlNode* element, size_t depth)
     {
         return;
     }
-    // A lookup takes the text of every element on its way, and there is no way on below one.
+    // An element with a value counts for every deeper segment too: the lookup takes it on its way,
+    // and nothing is below it.
     if (kx::OnlyTextChild(element) != nullptr)
     {
         m_path[depth].reached.push_back(element);

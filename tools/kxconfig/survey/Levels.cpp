@@ -21,7 +21,7 @@ void AddDefaulted(const xmlDtd* dtd, std::map<std::string, Names>& defaulted)
     {
         const auto declaration = reinterpret_cast<const xmlAttribute*>(node);
         // One with a prefix would be the default of every element, for a condition asks for the
-        // whole name and finds no attribute that an element bears itself: it tells none apart.
+        // whole name and finds no attribute that an element bears itself: it distinguishes none.
         if (node->type == XML_ATTRIBUTE_DECL && declaration->defaultValue != nullptr &&
             declaration->prefix == nullptr)
         {
@@ -179,7 +179,7 @@ Order Level::OrderFor(const std::string& segment) const
         order.taken = taken->element;
         order.suspender = SuspenderOf(*taken, namesakes);
     }
-    // If none is taken like that, the condition rejects all the others that do not fulfil it.
+    // If none is taken like that, the condition rejects all the others that do not fulfill it.
     else if (const Sibling* const rejected = FirstExcept(fulfilling, namesakes.all))
     {
         order.rejected = rejected->element;
@@ -205,7 +205,7 @@ const xmlNode* Level::SuspenderOf(const Sibling& suspended, const Namesakes& nam
     return m_elements[at == all.begin() ? 0 : std::prev(at)->place + 1];
 }
 
-/** @return the conditions of one attribute, as "@name=value", that @p element fulfils. */
+/** @return the conditions of one attribute, as "@name=value", that @p element fulfills. */
 std::vector<std::string> Level::ConditionsOf(const xmlNode* element) const
 {
     std::vector<std::string> conditions;

@@ -25,7 +25,7 @@ struct Order
 {
     const xmlNode* other = nullptr;     ///< would suspend the condition if it came first
     const xmlNode* rejected = nullptr;  ///< would then be taken; matters only if none is
-    const xmlNode* taken = nullptr;     ///< is taken like that as the file stands
+    const xmlNode* taken = nullptr;     ///< is taken like that in the present order
     const xmlNode* suspender = nullptr; ///< suspended the condition for it
 };
 
@@ -38,7 +38,7 @@ public:
 
     /**
      * @return the segment for @p element: its name and, if others bear it too, the first condition
-     * with a single attribute that only this element fulfils; without such a condition its name.
+     * with a single attribute that only this element fulfills; without such a condition its name.
      */
     std::string SegmentOf(const xmlNode* element) const;
 
@@ -52,7 +52,7 @@ public:
 private:
     struct Namesakes
     {
-        /** @return those that fulfil @p condition, "@name=value". */
+        /** @return those that fulfill @p condition, "@name=value". */
         const Siblings& Fulfilling(const std::string& condition) const;
 
         Siblings all;

@@ -198,7 +198,7 @@ Trail RecordUpdate(const xmlDoc* document, const std::string& key)
     return Record(document, key, Update);
 }
 
-bool Fulfils(const xmlNode* element, std::string_view condition)
+bool Fulfills(const xmlNode* element, std::string_view condition)
 {
     return kx::Condition(kx::TextView(condition.data(), condition.size())).Admits(element);
 }

@@ -36,10 +36,10 @@ struct TrailStep
     std::string_view name;      ///< what its name was compared with
     std::string_view condition; ///< of the segment that it was compared with
     Verdict verdict = Verdict::OtherName;
-    bool suspended = false; ///< accepted by its name alone, whatever the condition
+    bool suspended = false; ///< accepted by its name alone, regardless of the condition
     std::vector<TestedTerm> terms;
     std::optional<std::string> text;   ///< the text that can be read or replaced
-    bool keyEnds = false;              ///< the key ends in ".": nothing is sought below
+    bool keyEnds = false;              ///< the key ends in ".": nothing is wanted below
     std::unique_ptr<TrailLevel> below; ///< null if the walk did not go on below
 };
 
@@ -70,6 +70,6 @@ Trail RecordLookup(const xmlDoc* document, const std::string& key);
 Trail RecordUpdate(const xmlDoc* document, const std::string& key);
 
 /** @return whether @p element fulfills @p condition, by the library's own evaluation. */
-bool Fulfils(const xmlNode* element, std::string_view condition);
+bool Fulfills(const xmlNode* element, std::string_view condition);
 
 #endif

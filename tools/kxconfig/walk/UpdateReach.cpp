@@ -17,7 +17,7 @@ std::vector<const xmlNode*> ElementsOfUpdate(const xmlDoc* document, const std::
     kx::UpdateWalk walk(xmlDocGetRootElement(document), rest);
     while (walk.Next())
     {
-        if (walk.IsSelected() && kx::OnlyTextChild(walk.Element()) != nullptr)
+        if (walk.ReplacesText())
         {
             elements.push_back(walk.Element());
         }
