@@ -201,7 +201,7 @@ int CXmlParser::SaveXml(std::string path)
     }
     else if (!IsReadable(target))
     {
-        // The path as it was given: clients tell by the empty one that the recorded path failed.
+        // The path as it was given: an empty one shows clients that the recorded path failed.
         KX_ERROR_OF("File not exists :: %s", path.c_str());
         status = StatusBadArgument;
     }

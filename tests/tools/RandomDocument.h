@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-/** Makes small documents in which names repeat, attributes do and do not tell, and orders vary. */
+/** Makes small documents in which names repeat, attributes may distinguish, and orders vary. */
 class RandomDocument
 {
 public:

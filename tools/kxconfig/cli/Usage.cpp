@@ -106,7 +106,7 @@ bool IsHidden(const CLI::Option& option)
     return option.get_group().empty();
 }
 
-/** @return the lines of --help about the arguments of @p command. */
+/** @return the man-page entries for the arguments of @p command. */
 std::string Positionals(const CLI::App& command)
 {
     std::string page;

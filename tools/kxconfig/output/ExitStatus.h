@@ -1,7 +1,7 @@
 #ifndef KX_TOOLS_EXITSTATUS_H
 #define KX_TOOLS_EXITSTATUS_H
 
-/** What kxconfig's exit status tells; a line on standard error says more, unless a warning does. */
+/** The exit status of kxconfig; a line on standard error says more, unless a warning does. */
 enum class ExitStatus
 {
     Done = 0,
