@@ -14,7 +14,7 @@
 #   speed    the instructions of key operations, compared with the accepted counts
 #   docs     the reference, without a warning of Doxygen; the recording of a new user's first steps
 #   host     fast and package; the default
-#   all      all stages, engines only if KX_ENGINE_ARCHIVES is set
+#   all      all stages, engines only if KX_ENGINE_ARCHIVES is set; CI runs this
 . "$(dirname "$0")/common.sh"
 
 # run_preset NAME — configures, builds and tests with the preset; prints details only of failures.
