@@ -14,11 +14,6 @@ using namespace kx;
 namespace
 {
 
-bool IsRootOf(const xmlNode* root, const KeySplit& key)
-{
-    return key.HasRest() && SameText(root->name, key.First());
-}
-
 int FindValues(xmlDoc* document, TextView key, std::string& value)
 {
     const xmlNode* const root = xmlDocGetRootElement(document);
@@ -33,7 +28,7 @@ int FindValues(xmlDoc* document, TextView key, std::string& value)
         return StatusBadArgument;
     }
     // Clients take a key of another document's for success with nothing in it.
-    if (!IsRootOf(root, split))
+    if (!SameText(root->name, split.First()))
     {
         return StatusOk;
     }
