@@ -514,11 +514,18 @@ MARKS = {LIBRARY: Mark("#c1121f", "D"), FRESH: Mark("#7fb3d5", "v"), COMPILED: M
 plt.rcParams.update({"svg.hashsalt": "fixed", "svg.fonttype": "none", "font.family": "sans-serif"})
 
 
+# A page with its plots loads at once over a slow line, and a change of a plot stays readable.
+LARGEST_PLOT = 60_000
+
+
 def save(figure, path):
     drawing = io.StringIO()
     figure.savefig(drawing, format="svg", metadata={"Date": None}, bbox_inches="tight")
     plt.close(figure)
-    path.write_text(compact(drawing.getvalue()))
+    svg = compact(drawing.getvalue())
+    if len(svg) > LARGEST_PLOT:
+        sys.exit(f"{path.name} would have {len(svg):,} bytes, more than {LARGEST_PLOT:,}")
+    path.write_text(svg)
 
 
 def compact(svg):
