@@ -124,6 +124,46 @@ TEST_F(KxconfigKeys, WhatItPrintsCanBeGivenToGet)
     }
 }
 
+TEST_F(KxconfigKeys, PrintsNamesWithoutValues)
+{
+    const std::string file =
+        m_folder.Write("cfg.xml", "<cfg><a>1</a><a>2</a><n i='1'>x</n><n i='2'>y</n></cfg>");
+    EXPECT_EQ("cfg.a\ncfg.n@i=1\ncfg.n@i=2\n", Tool({"keys", "--names", file}).out);
+    const nlohmann::json answer =
+        nlohmann::json::parse(Tool({"--json", "keys", "--names", file}).out);
+    const nlohmann::json names = {
+        {{"key", "cfg.a"}}, {{"key", "cfg.n@i=1"}}, {{"key", "cfg.n@i=2"}}};
+    EXPECT_EQ(names, answer.at("results"));
+    EXPECT_EQ(2, Tool({"keys", "--names", "--all", file}).status);
+}
+
+TEST_F(KxconfigKeys, PrintsThoseBelowAPrefix)
+{
+    const std::string file =
+        m_folder.Write("cfg.xml", "<cfg><net id='1'><ip>a</ip></net><net id='1@x'><ip>b</ip></net>"
+                                  "<network>c</network><n>d</n><n.o>e</n.o></cfg>");
+    const std::string first = "cfg.net@id=1.ip\t\"a\"\n";
+    const std::string second = "cfg.net@id=1@x.ip\t\"b\"\n";
+    EXPECT_EQ(first, Tool({"keys", file, "cfg.net@id=1"}).out);
+    EXPECT_EQ(first, Tool({"keys", file, "cfg.net@id=1.ip"}).out);
+    EXPECT_EQ(first + second, Tool({"keys", file, "cfg.net"}).out);
+    EXPECT_EQ("cfg.n\n", Tool({"keys", "--names", file, "cfg.n"}).out);
+    EXPECT_EQ(Tool({"keys", file}).out, Tool({"keys", file, "cfg"}).out);
+    EXPECT_EQ("cfg.n\n",
+              ToolWithInput({"keys", "--names", "-", "cfg.n"}, "<cfg><n>1</n></cfg>").out);
+}
+
+TEST_F(KxconfigKeys, ReportsThatNothingIsBelowAPrefix)
+{
+    const std::string file = m_folder.Write("cfg.xml", "<cfg><net>1</net></cfg>");
+    for (const std::string prefix : {"cfg.ne", "cfg.net.", "cfg.net@id=1", "other"})
+    {
+        ExpectComplaint(Tool({"keys", file, prefix}), 1,
+                        "nothing found: " + file +
+                            " has no value that a key path can name below \"" + prefix + "\"");
+    }
+}
+
 TEST_F(KxconfigKeys, GivesWhatTheLibraryGivesForEveryKey)
 {
     int keys = 0;

@@ -247,9 +247,13 @@ void AddCheck(CLI::App& app, Request& request)
 
 void AddKeys(CLI::App& app, Request& request)
 {
-    AddReader(app, "keys", "print every key path that has a value in the file", Keys, request.keys,
-              request)
-        ->add_flag("--all", request.keys.all, "print all values of a key, not only the first ten");
+    KeysArguments& arguments = request.keys;
+    CLI::App* const keys = AddReader(
+        app, "keys", "print every key path that has a value in the file", Keys, arguments, request);
+    keys->add_option("PREFIX", arguments.prefix,
+                     "print only this key and those below it, such as root.element");
+    keys->add_flag("--all", arguments.all, "print all values of a key, not only the first ten")
+        ->excludes(keys->add_flag("--names", arguments.namesOnly, "print the keys only"));
 }
 
 void AddFind(CLI::App& app, Request& request)

@@ -32,6 +32,7 @@ const Example kExamples[] = {
     {"add device.xml /cfg mode on", "add an element"},
     {"remove device.xml '//net[@id=3]'", "remove one"},
     {"keys device.xml", "print all keys and values"},
+    {"keys --names device.xml cfg.net", "print the keys below the element, without values"},
     {"diff old.xml new.xml", "print the keys whose values differ"},
     {"find device.xml '//net[@id]'", "print the nodes that XPath selects"},
     {"--json get device.xml cfg.name", "print JSON, for scripts"},

@@ -20,6 +20,14 @@ namespace
 const size_t kMostValues = 10;
 const size_t kMostBytes = 1000;
 
+struct Name
+{
+    const std::string& key;
+
+    std::string Line() const { return key; }
+    Json InJson() const { return {{"key", key}}; }
+};
+
 struct KeyAndValue
 {
     const std::string& key;
@@ -67,6 +75,41 @@ KeyAndValue Describe(const std::string& key, Elements elements, bool all)
     return {key, JoinedValues(elements), more};
 }
 
+/** @return whether @p key is @p prefix, or goes on with a segment or with the condition of its last
+ * one. */
+bool IsBelow(const std::string& prefix, const std::string& key)
+{
+    if (prefix.empty() || key == prefix)
+    {
+        return true;
+    }
+    const bool hasCondition = prefix.find('@', prefix.rfind('.') + 1) != std::string::npos;
+    const char next = key.compare(0, prefix.size(), prefix) == 0 ? key[prefix.size()] : '\0';
+    return next == '.' || (next == '@' && !hasCondition);
+}
+
+void KeepBelow(const std::string& prefix, std::vector<std::string>& keys)
+{
+    keys.erase(std::remove_if(keys.begin(), keys.end(),
+                              [&](const std::string& key) { return !IsBelow(prefix, key); }),
+               keys.end());
+}
+
+Failure NothingFound(const KeysArguments& arguments)
+{
+    const std::string below = arguments.prefix.empty() ? "" : " below " + Quoted(arguments.prefix);
+    return {ExitStatus::NothingFound,
+            "nothing found: " + arguments.file + " has no value that a key path can name" + below};
+}
+
+void AddNames(const std::vector<std::string>& keys, Report& report)
+{
+    for (const std::string& key : keys)
+    {
+        report.Add(Name{key});
+    }
+}
+
 } // namespace
 
 ExitStatus Keys(const KeysArguments& arguments, Report& report)
@@ -74,13 +117,18 @@ ExitStatus Keys(const KeysArguments& arguments, Report& report)
     const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file, arguments.input);
     const xmlNode* const root = RootOf(*reader);
     Levels levels(root->doc);
-    KeyValues values(root, levels);
-    const std::vector<std::string> keys = ListKeys(root, levels);
+    std::vector<std::string> keys = ListKeys(root, levels);
+    KeepBelow(arguments.prefix, keys);
     if (keys.empty())
     {
-        throw Failure(ExitStatus::NothingFound, "nothing found: " + arguments.file +
-                                                    " has no value that a key path can name");
+        throw NothingFound(arguments);
     }
+    if (arguments.namesOnly)
+    {
+        AddNames(keys, report);
+        return ExitStatus::Done;
+    }
+    KeyValues values(root, levels);
     for (const std::string& key : keys)
     {
         report.Add(Describe(key, values.BearersUnder(key), arguments.all));

@@ -12,6 +12,8 @@ struct KeysArguments
 {
     std::string file;
     std::istream* input = nullptr; ///< what the file "-" stands for
+    std::string prefix;            ///< print only the keys below it; empty: all
+    bool namesOnly = false;        ///< print the keys without their values
     bool all = false;              ///< print every value under a key that has many
 };
 
