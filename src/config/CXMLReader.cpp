@@ -89,7 +89,7 @@ std::string CXMLReader::GetValue(const std::string& key)
     }
     const xmlNode* const root = xmlDocGetRootElement(m_pXmlDoc);
     const KeySplit split((TextView(key)));
-    if (root != 0 && IsRootOf(root, split))
+    if (root != 0 && split.HasRest() && SameText(root->name, split.First()))
     {
         CollectValues(root, split.Rest(), result);
     }
