@@ -51,7 +51,7 @@ for target in keypath document loader; do
     start 0 $build/fuzz/replay_$target fuzz/corpus/$target
 done
 
-# The client as in a shell. Its output is tested elsewhere; check reports warnings for the sample.
+# The client as in a shell. Its output is tested elsewhere.
 sample=examples/data/gateway.xml
 for arguments in "get $sample gateway.name" "keys $sample" "find $sample //@*" "explain $sample gateway.log.level" \
     "explain --set $sample gateway.name" "set --dry-run $sample gateway.name crate" \
@@ -59,7 +59,7 @@ for arguments in "get $sample gateway.name" "keys $sample" "find $sample //@*" "
     # shellcheck disable=SC2086  # words without blanks in them
     start 0 $build/tools/kxconfig $arguments
 done
-start 1 $build/tools/kxconfig check $sample
+start 0 $build/tools/kxconfig check --notes $sample
 start 1 $build/tools/kxconfig check $sample gateway.name other.name
 
 while [ $running -gt 0 ]; do
