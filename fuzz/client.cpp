@@ -67,18 +67,12 @@ void RequireListedValues(CXMLReader& reader)
     }
 }
 
-/** @return whether the location is one that the library can evaluate: it registers no prefixes. */
-bool IsUnmarked(const Json& node)
+/** @return the expression that selects the node, by its own account; empty if there is none. */
+std::string ExpressionFor(const Json& node)
 {
-    if (!node.contains("location") || !node["location"].is_string() || !node.contains("line"))
-    {
-        return false;
-    }
-    auto location = node["location"].get<std::string>();
-    const std::string axis = "/namespace::";
-    const auto at = location.find(axis);
-    location.erase(std::min(at, location.size()), at == location.npos ? 0 : axis.size());
-    return location.find(':') == location.npos;
+    const bool isInTree = node.contains("line") && node["location"].is_string();
+    const Json none = "";
+    return node.value("expression", isInTree ? node["location"] : none).get<std::string>();
 }
 
 /** Each location selects one node, the one that was printed with it. */
@@ -88,9 +82,9 @@ void RequireLocationsFindTheirNodes(const std::string& expression)
     const Json results = outcome.Answer()["results"];
     for (std::size_t i = 0; i != std::min(results.size(), kMostNodes); ++i)
     {
-        if (IsUnmarked(results[i]))
+        const std::string location = ExpressionFor(results[i]);
+        if (!location.empty())
         {
-            const auto location = results[i]["location"].get<std::string>();
             const Json again = Client({"find", "--json", "--", "f.xml", location}).Answer();
             Require(again["results"] == Json::array({results[i]}), "a location finds another node",
                     location);

@@ -80,7 +80,7 @@ TEST_F(KxconfigFind, PrintsEveryKindOfNode)
               Find("//processing-instruction()"));
     EXPECT_EQ("/cfg/d/text() cdata \"<\"\n", Find("//d/text()"));
     EXPECT_EQ("/cfg/namespace::p namespace \"urn:p\"\n", Find("/cfg/namespace::p"));
-    EXPECT_EQ("/cfg/p:e element\n", Find("/cfg/*[3]"));
+    EXPECT_EQ("/cfg/*[name()='p:e'] element\n", Find("/cfg/*[3]"));
 }
 
 TEST_F(KxconfigFind, DescribesWhereANodeInADtdIs)
@@ -125,7 +125,7 @@ TEST_F(KxconfigFind, ExplainsHowToSelectByANameWithAPrefix)
     EXPECT_EQ(2, outcome.status);
     EXPECT_THAT(outcome.err,
                 testing::EndsWith("; no prefixes are registered: write *[name()='p:a'] for p:a\n"));
-    EXPECT_EQ("/p:a/p:b element \"1\"\n",
+    EXPECT_EQ("/*[name()='p:a']/*[name()='p:b'] element \"1\"\n",
               Tool({"find", file, "/*[name()='p:a']/*[name()='p:b']"}).out);
     EXPECT_THAT(Tool({"find", file, "//["}).err, testing::Not(testing::HasSubstr("prefix")));
 }
@@ -187,8 +187,39 @@ TEST_F(KxconfigFind, DistinguishesAPrefixWithoutANamespaceFromOneWithIt)
     // To the engine the undeclared prefix is a part of the name.
     const std::string file =
         m_folder.Write("undeclared.xml", "<a><p:b/><c xmlns:p='urn:p'><p:b/></c><p:b/></a>");
-    EXPECT_EQ("/a/p:b[1] element\n/a/c/p:b element\n/a/p:b[2] element\n",
+    EXPECT_EQ("/a/*[name()='p:b'][1] element\n/a/c/*[name()='p:b'] element\n"
+              "/a/*[name()='p:b'][2] element\n",
               Tool({"find", file, "//*[contains(name(), 'b')]"}).out);
+}
+
+TEST_F(KxconfigFind, EachLocationSelectsItsNode)
+{
+    const std::string file = m_folder.Write(
+        "prefixes.xml", "<p:a xmlns:p='urn:p' p:i='1' i='2'>t<p:b/><q:b/><b/><p:b xmlns:p='urn:r'/>"
+                        "<q:b xmlns:q='urn:q' r:i='3'/><:b/><c xmlns='urn:d'><d/></c></p:a>");
+    const Outcome all = Tool({"--json", "find", file, "//node() | //@*"});
+    const nlohmann::json results = nlohmann::json::parse(all.out).at("results");
+    EXPECT_EQ(13U, results.size());
+    for (const nlohmann::json& result : results)
+    {
+        const std::string location = result.at("location");
+        const std::string expression = result.value("expression", location);
+        const Outcome again = Tool({"--json", "find", file, expression});
+        EXPECT_EQ(nlohmann::json::array({result}), nlohmann::json::parse(again.out).at("results"))
+            << expression;
+        EXPECT_THAT(Tool({"find", file, expression}).out, testing::StartsWith(expression + " "));
+    }
+}
+
+TEST_F(KxconfigFind, MarksALocationThatIsNoExpressionInJson)
+{
+    const std::string file = m_folder.Write("prefix.xml", "<p:a xmlns:p='urn:p'><b/></p:a>");
+    const Outcome outcome = Tool({"--json", "find", file, "//b"});
+    const nlohmann::json result = nlohmann::json::parse(outcome.out).at("results").at(0);
+    EXPECT_EQ("/p:a/b", result.at("location"));
+    EXPECT_EQ("/*[name()='p:a']/b", result.at("expression"));
+    const Outcome plain = Tool({"--json", "find", m_file, "/cfg/net[1]"});
+    EXPECT_FALSE(nlohmann::json::parse(plain.out).at("results").at(0).contains("expression"));
 }
 
 TEST_F(KxconfigFind, GivesLongNamesWhole)
@@ -196,7 +227,7 @@ TEST_F(KxconfigFind, GivesLongNamesWhole)
     const std::string name(600, 'n');
     const std::string file =
         m_folder.Write("long.xml", "<a xmlns:p='urn:p'><p:" + name + "/><" + name + "/></a>");
-    EXPECT_EQ("/a/p:" + name + " element\n/a/" + name + " element\n",
+    EXPECT_EQ("/a/*[name()='p:" + name + "'] element\n/a/" + name + " element\n",
               Tool({"find", file, "/a/*"}).out);
 }
 

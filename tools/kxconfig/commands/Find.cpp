@@ -98,8 +98,26 @@ Json AttributesInJson(const xmlNode* element)
     return attributes;
 }
 
-Json InJson(const xmlNode* node, Locations& locations)
+/** Where locations of nodes are spelled in both ways. */
+struct Places
 {
+    Locations locations;
+    Locations expressions{Spelling::Expression};
+};
+
+/** Adds the expression that selects @p node to @p result, where its location does not. */
+void AddExpression(const xmlNode* node, Places& places, Json& result)
+{
+    const std::string expression = places.expressions.Of(node);
+    if (expression != result["location"])
+    {
+        result["expression"] = expression;
+    }
+}
+
+Json InJson(const xmlNode* node, Places& places)
+{
+    Locations& locations = places.locations;
     if (node->type == XML_NAMESPACE_DECL)
     {
         const auto space = reinterpret_cast<const xmlNs*>(node);
@@ -112,7 +130,11 @@ Json InJson(const xmlNode* node, Locations& locations)
                    {"line", line > 0 ? Json(line) : Json()},
                    {"type", TypeName(node)},
                    {"value", ShowsContent(node) ? Json(ContentOf(node)) : Json()}};
-    if (!HasLocation(node))
+    if (HasLocation(node))
+    {
+        AddExpression(node, places, result);
+    }
+    else
     {
         result["place"] = locations.Of(node);
     }
@@ -127,10 +149,10 @@ Json InJson(const xmlNode* node, Locations& locations)
 struct SelectedNode
 {
     const xmlNode* node;
-    Locations& locations;
+    Places& places;
 
-    std::string Line() const { return ::Line(node, locations); }
-    Json InJson() const { return ::InJson(node, locations); }
+    std::string Line() const { return ::Line(node, places.expressions); }
+    Json InJson() const { return ::InJson(node, places); }
 };
 
 /** What an expression evaluates to that selects no nodes. */
@@ -146,10 +168,10 @@ struct Scalar
 int AddNodes(const xmlNodeSet* nodes, Report& report)
 {
     const int count = nodes == nullptr ? 0 : nodes->nodeNr;
-    Locations locations;
+    Places places;
     for (int i = 0; i < count; ++i)
     {
-        report.Add(SelectedNode{nodes->nodeTab[i], locations});
+        report.Add(SelectedNode{nodes->nodeTab[i], places});
     }
     return count;
 }

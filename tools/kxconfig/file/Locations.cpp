@@ -53,13 +53,21 @@ bool IsNameless(const xmlNode* node)
     return node->type == XML_ELEMENT_NODE && space != nullptr && space->prefix == nullptr;
 }
 
+/** @return what selects the elements or attributes that are named like @p node. */
+std::string NameTest(const xmlNode* node, Spelling spelling)
+{
+    const std::string name = NameWithPrefix(node);
+    const bool isPlain = spelling == Spelling::Path || name.find(':') == std::string::npos;
+    return isPlain ? name : "*[name()='" + name + "']";
+}
+
 /** Appends a step without its position: nodes of one parent that share it are numbered. */
-void AppendStep(std::string& text, const xmlNode* node)
+void AppendStep(std::string& text, const xmlNode* node, Spelling spelling)
 {
     switch (node->type)
     {
     case XML_ATTRIBUTE_NODE:
-        text += "@" + NameWithPrefix(node);
+        text += "@" + NameTest(node, spelling);
         break;
     case XML_TEXT_NODE:
     case XML_CDATA_SECTION_NODE:
@@ -72,7 +80,7 @@ void AppendStep(std::string& text, const xmlNode* node)
         text += "processing-instruction('" + Text(node->name) + "')";
         break;
     default:
-        text += IsNameless(node) ? "*" : NameWithPrefix(node);
+        text += IsNameless(node) ? "*" : NameTest(node, spelling);
     }
 }
 
@@ -84,14 +92,27 @@ std::string_view View(const xmlChar* text)
     return kx::FromEngine(text);
 }
 
+Alike AlikeOfElement(const xmlNode* element)
+{
+    const xmlNs* const space = kx::NamespaceOf(element);
+    const std::string_view name = View(element->name);
+    if (space != nullptr)
+    {
+        return {element->type, name, View(space->prefix)};
+    }
+    // A prefix that is not declared is a part of the name.
+    const size_t colon = name.find(':');
+    const bool hasPrefix = colon != std::string_view::npos && colon != 0;
+    return hasPrefix ? Alike(element->type, name.substr(colon + 1), name.substr(0, colon))
+                     : Alike(element->type, name, "");
+}
+
 Alike AlikeOf(const xmlNode* node)
 {
-    const xmlNs* const space = kx::NamespaceOf(node);
     switch (node->type)
     {
     case XML_ELEMENT_NODE:
-        // A prefix that is not declared is a part of the name.
-        return {node->type, View(node->name), space == nullptr ? "" : View(space->prefix)};
+        return AlikeOfElement(node);
     case XML_CDATA_SECTION_NODE:
         return {XML_TEXT_NODE, "", ""};
     case XML_PI_NODE:
@@ -240,7 +261,7 @@ void Locations::Follow(const xmlNode* node, size_t depth)
 
 void Locations::AppendLastStep(std::string& text, const xmlNode* node)
 {
-    AppendStep(text, node);
+    AppendStep(text, node, m_spelling);
     if (const size_t position = PositionOf(node))
     {
         text += '[' + std::to_string(position) + ']';

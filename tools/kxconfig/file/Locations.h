@@ -6,17 +6,26 @@
 #include <string>
 #include <vector>
 
+/** How a location spells a name with a prefix. */
+enum class Spelling
+{
+    Path,      ///< p:a, as in the document
+    Expression ///< *[name()='p:a'], since the library evaluates without registered prefixes
+};
+
 /**
  * The location paths of many nodes of a document, which must not change meanwhile.
  *
- * They are what xmlGetNodePath() gives, which counts the siblings of a node anew for each path.
- * Here the children of a node are counted once. Their positions are kept in the field that the
- * engine's records have for applications (_private), until the object is destroyed.
+ * They are what xmlGetNodePath() gives, which counts the siblings of a node anew for each path; but
+ * no two nodes have the same one, where a prefix is declared for only some of its bearers. Here the
+ * children of a node are counted once. Their positions are kept in the field that the engine's
+ * records have for applications (_private), until the object is destroyed.
  */
 class Locations
 {
 public:
-    Locations() = default;
+    Locations() : Locations(Spelling::Path) {}
+    explicit Locations(Spelling spelling) : m_spelling(spelling) {}
     ~Locations();
     Locations(Locations&&) = default;
     Locations& operator=(Locations&&) = delete;
@@ -46,6 +55,7 @@ private:
     void AppendLastStep(std::string& text, const xmlNode* node);
     size_t PositionOf(const xmlNode* node);
 
+    const Spelling m_spelling;
     std::string m_path; ///< the last one: most paths begin like the one before
     std::vector<Step> m_steps;
     std::vector<const xmlNode*> m_below;   ///< of a path, the nodes that the last one does not have
