@@ -22,7 +22,7 @@ fuzz() {
     local target=$1 corpus=$PWD/$build/corpus/$1 log=$build/$1.log
     mkdir -p "$corpus"
     if ! $build/fuzz/fuzz_"$target" "$corpus" "$PWD/fuzz/corpus/$target" \
-        -dict=fuzz/xml.dict -max_len=4096 -timeout=10 -rss_limit_mb=1024 -max_total_time="$seconds" \
+        -dict="$PWD/fuzz/xml.dict" -max_len=4096 -timeout=10 -rss_limit_mb=1024 -max_total_time="$seconds" \
         -artifact_prefix="$PWD/$build/findings/$target-" -print_final_stats=1 >"$log" 2>&1; then
         tail -n 60 "$log" >&2
         exit 1
