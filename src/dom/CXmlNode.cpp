@@ -191,8 +191,7 @@ int CXmlNode::ClearNode()
     int status = StatusMissing;
     if (CanBeCleared(m_pXmlNode))
     {
-        RemoveChildren(m_pXmlNode);
-        RemoveAttributes(m_pXmlNode);
+        Clear(m_pXmlNode);
         status = StatusOk;
     }
     KX_LEAVE();

@@ -18,6 +18,29 @@ bool IsWhole(const xmlAttr* attribute, const std::string& value)
     return attribute->name != 0 && (value.empty() || (text != 0 && text->content != 0));
 }
 
+void UnlinkAndFree(xmlNode* node)
+{
+    xmlUnlinkNode(node);
+    xmlFreeNode(node);
+}
+
+/** Forgets the IDs of all that is freed when @p node is cleared. */
+void ForgetIdsOfContents(xmlNode* node)
+{
+    if (IsDocument(node))
+    {
+        ForgetAllIds(node->doc);
+    }
+    else if (IsAttribute(node))
+    {
+        ForgetIdsBelow(node); // it stays, and its ID too
+    }
+    else
+    {
+        ForgetIdsWithin(node);
+    }
+}
+
 } // namespace
 
 xmlNode* WholeElement(xmlNode* element)
@@ -46,10 +69,7 @@ void ReplaceContent(xmlNode* node, const std::string& text)
 {
     if (HasContent(node))
     {
-        for (xmlNode* child = node->children; child != 0; child = child->next)
-        {
-            ForgetIdsWithin(child);
-        }
+        ForgetIdsBelow(node);
     }
     // Some engines take this kind, which no document has, for a text.
     if (node->type != XML_ENTITY_NODE)
@@ -58,25 +78,17 @@ void ReplaceContent(xmlNode* node, const std::string& text)
     }
 }
 
-void RemoveChildren(xmlNode* node)
+void Clear(xmlNode* node)
 {
-    if (IsDocument(node))
-    {
-        ForgetAllIds(node->doc);
-    }
+    ForgetIdsOfContents(node);
     while (node->children != 0)
     {
-        FreeFromTree(node->children);
+        UnlinkAndFree(node->children);
     }
-}
-
-void RemoveAttributes(xmlNode* node)
-{
     // An attribute that the engine fails to remove would be met again and again.
     bool removed = true;
     while (removed && AttributesOf(node) != 0)
     {
-        ForgetIdsWithin(reinterpret_cast<xmlNode*>(AttributesOf(node)));
         removed = xmlRemoveProp(AttributesOf(node)) == 0;
     }
 }
@@ -88,8 +100,7 @@ void FreeFromTree(xmlNode* node)
         ForgetAllIds(node->doc);
     }
     ForgetIdsWithin(node);
-    xmlUnlinkNode(node);
-    xmlFreeNode(node);
+    UnlinkAndFree(node);
 }
 
 } // namespace kx

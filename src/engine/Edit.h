@@ -25,11 +25,8 @@ bool AddAttribute(xmlNode* node, const std::string& name, const std::string& val
 /** Replaces the content of @p node, which can take it; of a kind without content it has none. */
 void ReplaceContent(xmlNode* node, const std::string& text);
 
-/** Removes every child of @p node, which can be cleared. */
-void RemoveChildren(xmlNode* node);
-
-/** Removes every attribute of @p node. */
-void RemoveAttributes(xmlNode* node);
+/** Removes every child and every attribute of @p node, which can be cleared. */
+void Clear(xmlNode* node);
 
 /** Takes @p node, which can be removed, out of its tree and frees it with all that it holds. */
 void FreeFromTree(xmlNode* node);

@@ -5,73 +5,13 @@
 #include <libxml/hash.h>
 #include <libxml/valid.h>
 
+#include <stdlib.h>
+
 namespace kx
 {
 
 namespace
 {
-
-#if LIBXML_VERSION < 21400
-
-/** An attribute, and the value under which the engine's table of IDs has it. */
-struct TableEntry
-{
-    const xmlAttr* attribute;
-    const xmlChar* value;
-};
-
-// Called by the engine, whose older headers have the values writable.
-
-template <class Char>
-void FindEntry(void* id, void* wanted, Char* value)
-{
-    TableEntry* const entry = static_cast<TableEntry*>(wanted);
-    if (static_cast<const xmlID*>(id)->attr == entry->attribute)
-    {
-        entry->value = value;
-    }
-}
-
-template <class Char>
-void FreeId(void* id, Char* /*value*/)
-{
-    xmlFree(const_cast<xmlChar*>(static_cast<xmlID*>(id)->value));
-    xmlFree(id);
-}
-
-/** Takes the ID @p attribute out of the table, wherever it is. */
-void RemoveFromTable(xmlAttr* attribute)
-{
-    xmlHashTable* const ids = static_cast<xmlHashTable*>(attribute->doc->ids);
-    TableEntry entry = {attribute, 0};
-    xmlHashScan(ids, FindEntry, &entry);
-    xmlHashRemoveEntry(ids, entry.value, FreeId); // does nothing without a value
-    attribute->atype = XML_ATTRIBUTE_CDATA;
-}
-
-#endif
-
-/**
- * Takes @p attribute out of the table of IDs if it is there.
- *
- * Up to 2.13 the engine finds it by a copy of the value that it makes out of the attribute. It
- * finds none that has changed, nor one with blanks to strip or with a reference to an entity, nor
- * any when memory is short; it would then look at the attribute again after that is freed.
- */
-void ForgetId(xmlAttr* attribute)
-{
-    if (attribute->atype != XML_ATTRIBUTE_ID)
-    {
-        return;
-    }
-    xmlRemoveID(attribute->doc, attribute);
-#if LIBXML_VERSION < 21400
-    if (attribute->atype == XML_ATTRIBUTE_ID)
-    {
-        RemoveFromTable(attribute);
-    }
-#endif
-}
 
 /** @return the first node that is freed with @p node: an attribute, else a child; or null. */
 xmlNode* FirstWithin(xmlNode* node)
@@ -101,18 +41,150 @@ xmlNode* NextWithin(const xmlNode* top, xmlNode* node)
     return next;
 }
 
+bool IsId(const xmlNode* node)
+{
+    return IsAttribute(node) && reinterpret_cast<const xmlAttr*>(node)->atype == XML_ATTRIBUTE_ID;
+}
+
+/** Takes @p id out of the table as far as the engine can. @return the attribute. */
+xmlAttr* Leave(xmlNode* id)
+{
+    xmlAttr* const attribute = reinterpret_cast<xmlAttr*>(id);
+    xmlRemoveID(attribute->doc, attribute);
+    attribute->atype = XML_ATTRIBUTE_CDATA;
+    return attribute;
+}
+
+#if LIBXML_VERSION < 21400
+
+// Up to 2.12 the engine finds an attribute in the table by its present value: not if that has
+// changed, has blanks to strip, refers to an entity or cannot be copied for lack of memory. A
+// change by the library and one by the engine's own call leave two entries.
+
+/** Attributes to be taken out of the table, under whatever values it has them. */
+struct Leaving
+{
+    xmlHashTable* table;
+    const xmlAttr** attributes;
+    size_t count;
+};
+
+int CompareAddresses(const void* left, const void* right)
+{
+    const xmlAttr* const first = *static_cast<const xmlAttr* const*>(left);
+    const xmlAttr* const second = *static_cast<const xmlAttr* const*>(right);
+    return first < second ? -1 : first > second;
+}
+
+// Called by the engine, whose older headers have the values writable.
+
+template <class Char>
+void FreeId(void* id, Char* /*value*/)
+{
+    xmlFree(const_cast<xmlChar*>(static_cast<xmlID*>(id)->value));
+    xmlFree(id);
+}
+
+template <class Char>
+void RemoveIfLeaving(void* id, void* data, Char* value)
+{
+    // The attribute is not read: where a client has freed it past the library, it is gone.
+    const Leaving* const leaving = static_cast<const Leaving*>(data);
+    const xmlAttr* const attribute = static_cast<const xmlID*>(id)->attr;
+    if (bsearch(&attribute, leaving->attributes, leaving->count, sizeof attribute,
+                CompareAddresses) != 0)
+    {
+        xmlHashRemoveEntry(leaving->table, value, FreeId);
+    }
+}
+
+void RemoveFromTable(Leaving& leaving)
+{
+    qsort(leaving.attributes, leaving.count, sizeof *leaving.attributes, CompareAddresses);
+    // A scan permits the removal of the entry that it is at.
+    xmlHashScan(leaving.table, RemoveIfLeaving, &leaving);
+    leaving.count = 0;
+}
+
+size_t CountIds(xmlNode* first, const xmlNode* top)
+{
+    size_t count = 0;
+    for (xmlNode* node = first; node != 0; node = NextWithin(top, node))
+    {
+        count += IsId(node);
+    }
+    return count;
+}
+
+/** Takes the attributes from @p first to the end of @p top out of the table, @p capacity at once.
+ */
+void ForgetInSteps(xmlNode* first, const xmlNode* top, const xmlAttr** space, size_t capacity)
+{
+    Leaving leaving = {static_cast<xmlHashTable*>(top->doc->ids), space, 0};
+    for (xmlNode* node = first; node != 0; node = NextWithin(top, node))
+    {
+        if (IsId(node))
+        {
+            leaving.attributes[leaving.count++] = Leave(node);
+        }
+        if (leaving.count == capacity)
+        {
+            RemoveFromTable(leaving);
+        }
+    }
+}
+
+void ForgetIdsFrom(xmlNode* first, const xmlNode* top)
+{
+    const size_t count = CountIds(first, top);
+    const xmlAttr* one = 0;
+    void* const all = count > 1 ? xmlMalloc(count * sizeof one) : 0;
+    if (all != 0)
+    {
+        ForgetInSteps(first, top, static_cast<const xmlAttr**>(all), count);
+        xmlFree(all);
+    }
+    else if (count != 0)
+    {
+        ForgetInSteps(first, top, &one, 1);
+    }
+}
+
+#else
+
+void ForgetIdsFrom(xmlNode* first, const xmlNode* top)
+{
+    for (xmlNode* node = first; node != 0; node = NextWithin(top, node))
+    {
+        if (IsId(node))
+        {
+            Leave(node);
+        }
+    }
+}
+
+#endif
+
+bool HasIds(const xmlNode* node)
+{
+    return node->doc != 0 && node->doc->ids != 0;
+}
+
 } // namespace
 
 void ForgetIdsWithin(xmlNode* top)
 {
-    xmlNode* node = top->doc != 0 && top->doc->ids != 0 ? top : 0;
-    while (node != 0)
+    if (HasIds(top))
     {
-        if (IsAttribute(node))
-        {
-            ForgetId(reinterpret_cast<xmlAttr*>(node));
-        }
-        node = NextWithin(top, node);
+        ForgetIdsFrom(top, top);
+    }
+}
+
+void ForgetIdsBelow(const xmlNode* top)
+{
+    if (HasIds(top))
+    {
+        ForgetIdsFrom(top->children, top);
     }
 }
 

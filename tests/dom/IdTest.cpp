@@ -3,6 +3,8 @@
 #include "CXmlParser.h"
 #include "DomTest.h"
 
+#include <libxml/hash.h>
+
 using namespace kxtest;
 
 namespace
@@ -89,6 +91,49 @@ protected:
     {
         xmlNodeSetContent(NodeOf(document, xpath), reinterpret_cast<const xmlChar*>("changed"));
     }
+
+    /** Sets the attribute "id" of @p element by the engine's own call, which enters the value. */
+    static void SetId(xmlNodePtr element, const char* value)
+    {
+        xmlSetProp(element, reinterpret_cast<const xmlChar*>("id"),
+                   reinterpret_cast<const xmlChar*>(value));
+    }
+
+    using Call = std::function<void(xmlDocPtr)>;
+
+    /** @return a call that does @p operation to the first node that @p xpath selects, if any. */
+    static Call OnFirst(const char* xpath, const std::function<void(xmlNodePtr)>& operation)
+    {
+        return [=](xmlDocPtr document)
+        {
+            const xmlNodePtr node = NodeOf(document, xpath);
+            if (node != nullptr)
+            {
+                operation(node);
+            }
+        };
+    }
+
+    /**
+     * Makes every series of three of @p calls on a new document each, then clears its root: the
+     * IDs stay sound.
+     */
+    static void ExpectSoundIdsInAnyOrder(const std::string& xml, const std::vector<Call>& calls)
+    {
+        const Call clear = OnFirst("/*", [](xmlNodePtr root) { CXmlNode(root).ClearNode(); });
+        const std::size_t count = calls.size();
+        for (std::size_t i = 0; i != count * count * count; ++i)
+        {
+            const xmlDocPtr document = ParseText(xml);
+            for (const Call& call :
+                 {calls[i % count], calls[i / count % count], calls[i / count / count], clear})
+            {
+                call(document);
+                ExpectSoundIds(document);
+            }
+            xmlFreeDoc(document);
+        }
+    }
 };
 
 } // namespace
@@ -167,11 +212,12 @@ TEST_F(IdTest, AttributeOfAnElementThatHangsBelowAnAttributeIsForgottenToo)
         EXPECT_EQ(0, hung.AddNewAttribute("id", "old"));
         EXPECT_EQ(0, hung.AddChildNode("b", "").AddNewAttribute("id", "deeper"));
         ASSERT_EQ(3u, Ids(document));
-        xmlNodeSetContent(AttributeOf(a->properties->last), // the element's, by the bare call
-                          reinterpret_cast<const xmlChar*>("changed"));
+        const xmlNodePtr b = a->properties->last;
+        xmlNodeSetContent(AttributeOf(b), reinterpret_cast<const xmlChar*>("changed"));
+        SetId(b, "twice");
         EXPECT_EQ(0, change(a));
         EXPECT_EQ(1u, Ids(document));
-        EXPECT_EQ(nullptr, NodeOf(document, "id('old') | id('deeper')"));
+        EXPECT_EQ(nullptr, NodeOf(document, "id('old') | id('deeper') | id('twice')"));
         EXPECT_NE(nullptr, NodeOf(document, "id('kept')"));
     }
 }
@@ -211,32 +257,20 @@ TEST_F(IdTest, DtdWithoutADocumentIsRemoved)
 
 TEST_F(IdTest, NoOrderOfCallsLeavesAFreedAttributeInTheTable)
 {
-    using Call = std::function<void(xmlDocPtr)>;
-    const auto onFirst = [](const char* xpath, const std::function<void(xmlNodePtr)>& operation)
-    {
-        return [=](xmlDocPtr document)
-        {
-            const xmlNodePtr node = NodeOf(document, xpath);
-            if (node != nullptr)
-            {
-                operation(node);
-            }
-        };
-    };
     const auto clear = [](xmlNodePtr node) { CXmlNode(node).ClearNode(); };
     const auto set = [](xmlNodePtr node) { CXmlNode(node).SetContent("plain"); };
     const auto hang = [](xmlNodePtr node)
     { CXmlNode(node).AddChildNode("b", "").AddNewAttribute("id", "hung"); };
     const std::vector<Call> calls = {
-        onFirst("//b[. = 'one']/@id", set),
-        onFirst("//b[. = 'two']/@id", set),
-        onFirst("//b[. = 'two']/@id", hang),
-        onFirst("//b[. = 'two']", RemoveNode),
-        onFirst("//b[. = 'two']", clear),
-        onFirst("/r/a", clear),
-        onFirst("/r/a", hang),
-        onFirst("/r", clear),
-        onFirst("/", clear),
+        OnFirst("//b[. = 'one']/@id", set),
+        OnFirst("//b[. = 'two']/@id", set),
+        OnFirst("//b[. = 'two']/@id", hang),
+        OnFirst("//b[. = 'two']", RemoveNode),
+        OnFirst("//b[. = 'two']", clear),
+        OnFirst("/r/a", clear),
+        OnFirst("/r/a", hang),
+        OnFirst("/r", clear),
+        OnFirst("/", clear),
         [](xmlDocPtr document) { RemoveNode(reinterpret_cast<xmlNodePtr>(document->intSubset)); },
         [](xmlDocPtr document) { Change(document, "(//b)[last()]/@id"); }};
     // Without an entity the DTD can be removed.
@@ -244,17 +278,112 @@ TEST_F(IdTest, NoOrderOfCallsLeavesAFreedAttributeInTheTable)
          {kXml, "<!DOCTYPE r [<!ATTLIST b id ID #IMPLIED>]><r><b id='kept'/>"
                 "<a><b id='plain'>one</b><b id='i'>two</b></a></r>"})
     {
-        for (std::size_t i = 0; i != calls.size() * calls.size() * calls.size(); ++i)
+        ExpectSoundIdsInAnyOrder(xml, calls);
+    }
+}
+
+TEST_F(IdTest, AttributeThatIsInTheTableTwiceIsForgottenUnderBothValues)
+{
+    // Up to 2.12 the engine does not find the value that it replaces, and leaves it in the table.
+    const auto frees = {+[](xmlNodePtr b) { return RemoveNode(AttributeOf(b)); },
+                        +[](xmlNodePtr b) { return RemoveNode(b); },
+                        +[](xmlNodePtr b) { return RemoveNode(b->parent); },
+                        +[](xmlNodePtr b) { return CXmlNode(b).ClearNode(); },
+                        +[](xmlNodePtr b) { return CXmlNode(b->parent).ClearNode(); },
+                        +[](xmlNodePtr b) { return CXmlNode(b->parent).SetContent("text"); },
+                        +[](xmlNodePtr b) { return CXmlNode(b->parent).RemoveChildNode("b"); }};
+    for (const auto& change : kValueChanges)
+    {
+        for (const auto& free : frees)
         {
-            const xmlDocPtr document = ParseText(xml);
-            for (const std::size_t call : {i, i / calls.size(), i / calls.size() / calls.size()})
+            for (std::size_t failing = 0; failing <= kRequests; ++failing)
             {
-                calls[call % calls.size()](document);
+                const xmlDocPtr document = Parse(kXml);
+                const xmlNodePtr b = NodeOf(document, "//b[. = 'one']");
+                EXPECT_EQ(0, change(b));
+                SetId(b, "second");
+                EXPECT_EQ(0, change(b));
+                SetId(b, "third");
+                EngineMemory::FailAt(failing);
+                EXPECT_EQ(0, free(b));
+                const bool failed = EngineMemory::Failed();
+                EngineMemory::FailAt(0);
                 ExpectSoundIds(document);
+                EXPECT_NE(nullptr, NodeOf(document, "id('kept')"));
+                if (!failed)
+                {
+                    EXPECT_EQ(nullptr,
+                              NodeOf(document, "id('plain') | id('second') | id('third')"));
+                }
             }
-            xmlFreeDoc(document);
         }
     }
+}
+
+TEST_F(IdTest, NoOrderOfTheEnginesOwnChangesLeavesAFreedAttributeInTheTable)
+{
+    const auto setBare = [](const char* value)
+    { return [value](xmlNodePtr node) { SetId(node, value); }; };
+    const auto copy = [](xmlNodePtr node)
+    { xmlAddChild(xmlDocGetRootElement(node->doc), xmlDocCopyNode(node, node->doc, 1)); };
+    const std::vector<Call> calls = {
+        OnFirst("//b/@id", [](xmlNodePtr id) { CXmlNode(id).SetContent("other"); }),
+        OnFirst("(//b)[last()]/@id", [](xmlNodePtr id) { CXmlNode(id).ClearNode(); }),
+        OnFirst("//b", setBare("other")),
+        OnFirst("//b", setBare("third")),
+        OnFirst("(//b)[last()]", setBare("third")),
+        OnFirst("//b/@id", [](xmlNodePtr id)
+                { CXmlNode(id).AddChildNode("b", "").AddNewAttribute("id", "hung"); }),
+        OnFirst("//b", copy),
+        OnFirst("//b/@id", RemoveNode),
+        OnFirst("//b", RemoveNode)};
+    ExpectSoundIdsInAnyOrder("<!DOCTYPE r [<!ATTLIST b id ID #IMPLIED>]>"
+                             "<r><b id='first'/><b id='last'/></r>",
+                             calls);
+}
+
+TEST_F(IdTest, RemovalOfManyLeavesTheIdsOfAllOthers)
+{
+    // Enough for several entries in a row of the engine's table.
+    const std::size_t count = 100;
+    std::string xml = "<!DOCTYPE r [<!ATTLIST b id ID #IMPLIED>]><r>";
+    for (std::size_t i = 0; i != count; ++i)
+    {
+        const std::string number = std::to_string(i);
+        xml.append("<b id='i").append(number).append("'/>");
+        xml.append("<a><b id='j").append(number).append("'/></a>");
+    }
+    const xmlDocPtr document = Parse(xml + "</r>");
+    CXmlNode root(xmlDocGetRootElement(document));
+    ASSERT_EQ(2 * count, Ids(document));
+    for (std::size_t left = count; left != 0; --left)
+    {
+        EXPECT_EQ(0, CXmlNode(NodeOf(document, "/r/a/b/@id")).SetContent("changed"));
+        EXPECT_EQ(0, root.RemoveChildNode("a"));
+        EXPECT_EQ(count + left - 1, Ids(document));
+    }
+    ExpectSoundIds(document);
+}
+
+TEST_F(IdTest, AttributeThatAClientFreedIsNotRead)
+{
+    // Up to 2.12 the engine's own call leaves the former value in the table.
+    const xmlDocPtr document = Parse(kXml);
+    EXPECT_EQ(0, CXmlNode(NodeOf(document, "//b/@id")).SetContent("other"));
+    EXPECT_EQ(0, xmlRemoveProp(NodeOf(document, "//b")->properties));
+    EXPECT_EQ(0, CXmlNode(NodeOf(document, "/r/a")).ClearNode());
+    EXPECT_EQ(nullptr, NodeOf(document, "id('plain')"));
+}
+
+TEST_F(IdTest, EntryWithoutAnAttributeStays)
+{
+    // A reader that validates frees the attributes on its way, and keeps the values.
+    const xmlDocPtr document = Parse(kXml);
+    const auto kept = reinterpret_cast<const xmlChar*>("kept");
+    static_cast<xmlIDPtr>(xmlHashLookup(static_cast<xmlHashTablePtr>(document->ids), kept))->attr =
+        nullptr;
+    EXPECT_EQ(0, RemoveNode(NodeOf(document, "id('plain')")));
+    EXPECT_NE(nullptr, xmlHashLookup(static_cast<xmlHashTablePtr>(document->ids), kept));
 }
 
 TEST_F(IdTest, ValueWithBlanksToStripIsForgottenToo)
