@@ -67,7 +67,7 @@ std::string Named(std::string argument)
 
 std::string PathOf(const xmlNode* node)
 {
-    xmlChar* const path = xmlGetNodePath(node);
+    xmlChar* const path = xmlGetNodePath(const_cast<xmlNode*>(node));
     const std::string text = reinterpret_cast<const char*>(path);
     xmlFree(path);
     return text;
@@ -75,7 +75,7 @@ std::string PathOf(const xmlNode* node)
 
 std::string ContentOf(const xmlNode* node)
 {
-    xmlChar* const content = xmlNodeGetContent(node);
+    xmlChar* const content = xmlNodeGetContent(const_cast<xmlNode*>(node));
     const std::string text = content == nullptr ? "" : reinterpret_cast<const char*>(content);
     xmlFree(content);
     return text;

@@ -12,6 +12,7 @@
 
 #include "model/MemoryFile.h"
 #include "support/Log.h"
+#include "support/Signature.h"
 
 #include <libxml/parser.h>
 #include <libxml/xpath.h>
@@ -55,10 +56,10 @@ std::vector<xmlChar*> g_contents;
 
 } // namespace
 
-extern "C" xmlChar* xmlNodeGetContent(const xmlNode* node)
+extern "C" xmlChar* xmlNodeGetContent(kxtest::FirstOf<decltype(xmlNodeGetContent)> node)
 {
     static const auto engine =
-        reinterpret_cast<xmlChar* (*)(const xmlNode*)>(dlsym(RTLD_NEXT, "xmlNodeGetContent"));
+        reinterpret_cast<decltype(&xmlNodeGetContent)>(dlsym(RTLD_NEXT, "xmlNodeGetContent"));
     xmlChar* const content = engine(node);
     if (g_collectsContent && content != nullptr)
     {

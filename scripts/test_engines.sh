@@ -1,7 +1,8 @@
 #!/usr/bin/env bash
 # Runs the suites of the library with each libxml2-VERSION.tar.xz of a folder. They are compiled once, with the headers
 # of the installed engine, as clients on a machine with an older or newer engine are. A version whose library has
-# another file name, as from 2.14 on, cannot take its place and is left out.
+# another file name, as from 2.14 on, cannot take its place and is left out. Also checks that the library compiles with
+# the headers of each version, and everything with those of the oldest.
 # usage: test_engines.sh FOLDER
 versions=$("$(dirname "$0")/engines.sh" "${1:?usage: test_engines.sh FOLDER}")
 . "$(dirname "$0")/common.sh"
@@ -11,6 +12,14 @@ need "${build_packages[@]}" "${test_packages[@]}"
 suites=(config dom faults model seams trust threads)
 build_preset dev --target "${suites[@]/%/_tests}"
 name=$(readelf --dynamic build/dev/src/libKX_XMLConfigParser.so | sed -n 's/.*NEEDED.*\[\(libxml2[^]]*\)\].*/\1/p')
+
+# The headers differ too: the oldest declare less const than all that follow.
+first=${versions%%$'\n'*}
+for version in $versions; do
+    folders=(src platform)
+    [ "$version" != "$first" ] || folders=()
+    tests/portability/compile_with_headers.py build/dev "$PWD/build/libxml2/$version/include/libxml2" "${folders[@]}"
+done
 
 # run_suite VERSION SUITE — prints details only of failures.
 run_suite() {

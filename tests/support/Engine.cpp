@@ -3,6 +3,7 @@
 #include "support/EngineTranscript.h"
 #include "support/Log.h"
 #include "support/Memory.h"
+#include "support/Signature.h"
 
 #include <libxml/parser.h>
 #include <libxml/xmlerror.h>
@@ -63,6 +64,7 @@ void CollectError(void*, const char* format, ...)
 } // namespace
 
 using kxtest::Answer;
+using kxtest::FirstOf;
 using kxtest::Forward;
 
 extern "C" void xmlFreeDoc(xmlDocPtr document)
@@ -91,7 +93,7 @@ extern "C" xmlDocPtr xmlParseFile(const char* path)
     return Forward<&xmlParseFile>("xmlParseFile", path);
 }
 
-extern "C" xmlChar* xmlGetProp(const xmlNode* node, const xmlChar* name)
+extern "C" xmlChar* xmlGetProp(FirstOf<decltype(xmlGetProp)> node, const xmlChar* name)
 {
     if (g_noting)
     {

@@ -1,5 +1,7 @@
 #include "support/EngineTranscript.h"
 
+#include "support/Signature.h"
+
 #include <libxml/entities.h>
 #include <libxml/valid.h>
 #include <libxml/xmlmemory.h>
@@ -262,16 +264,8 @@ void Call::End(const std::string& result)
 
 } // namespace kxtest
 
+using kxtest::FirstOf;
 using kxtest::Forward;
-
-/** The type of a function's first argument, which older headers have without const. */
-template <class Function>
-struct FirstOf;
-template <class Result, class First, class... Others>
-struct FirstOf<Result(First, Others...)>
-{
-    using Type = First;
-};
 
 #if LIBXML_VERSION >= 21300
 using SetContentResult = int;
@@ -281,7 +275,7 @@ using SetContentResult = void;
 
 // The functions that Engine.cpp does not define.
 
-extern "C" xmlNodePtr xmlDocGetRootElement(const xmlDoc* document)
+extern "C" xmlNodePtr xmlDocGetRootElement(FirstOf<decltype(xmlDocGetRootElement)> document)
 {
     return Forward<&xmlDocGetRootElement>("xmlDocGetRootElement", document);
 }
@@ -323,7 +317,7 @@ extern "C" xmlAttrPtr xmlNewNsProp(xmlNodePtr node, xmlNsPtr space, const xmlCha
     return Forward<&xmlNewNsProp>("xmlNewNsProp", node, space, name, value);
 }
 
-extern "C" xmlChar* xmlNodeGetContent(const xmlNode* node)
+extern "C" xmlChar* xmlNodeGetContent(FirstOf<decltype(xmlNodeGetContent)> node)
 {
     xmlChar* const content = Forward<&xmlNodeGetContent>("xmlNodeGetContent", node);
     if (g_depth == 0)
@@ -376,19 +370,19 @@ extern "C" xmlNodePtr xmlAddChild(xmlNodePtr parent, xmlNodePtr child)
     return Forward<&xmlAddChild>("xmlAddChild", parent, child);
 }
 
-extern "C" xmlNodePtr xmlNewDocText(FirstOf<decltype(xmlNewDocText)>::Type document,
+extern "C" xmlNodePtr xmlNewDocText(FirstOf<decltype(xmlNewDocText)> document,
                                     const xmlChar* content)
 {
     return Forward<&xmlNewDocText>("xmlNewDocText", document, content);
 }
 
-extern "C" xmlEntityPtr xmlGetDocEntity(FirstOf<decltype(xmlGetDocEntity)>::Type document,
+extern "C" xmlEntityPtr xmlGetDocEntity(FirstOf<decltype(xmlGetDocEntity)> document,
                                         const xmlChar* name)
 {
     return Forward<&xmlGetDocEntity>("xmlGetDocEntity", document, name);
 }
 
-extern "C" xmlNodePtr xmlStringGetNodeList(FirstOf<decltype(xmlStringGetNodeList)>::Type document,
+extern "C" xmlNodePtr xmlStringGetNodeList(FirstOf<decltype(xmlStringGetNodeList)> document,
                                            const xmlChar* text)
 {
     return Forward<&xmlStringGetNodeList>("xmlStringGetNodeList", document, text);

@@ -2,6 +2,7 @@
 
 #include "file/Nodes.h"
 #include "output/Quoting.h"
+#include "walk/Trail.h"
 
 #include <iterator>
 #include <string_view>
@@ -21,7 +22,7 @@ std::string OwnText(const xmlNode* element)
             // A small file can refer to more than the memory holds, or to what is not there.
             text += "&" + Text(child->name) + ";";
         }
-        else if (isText && xmlIsBlankNode(child) != 1)
+        else if (isText && !IsBlankText(child))
         {
             text += Text(child->content);
         }
@@ -31,7 +32,7 @@ std::string OwnText(const xmlNode* element)
 
 bool IsRoot(const xmlNode* element)
 {
-    return element == xmlDocGetRootElement(element->doc);
+    return element == RootOf(element->doc);
 }
 
 void CheckName(const xmlNode* element, Findings& findings)

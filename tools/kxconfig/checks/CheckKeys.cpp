@@ -139,7 +139,7 @@ std::string WhyNoValueUnder(const std::string& key, const xmlNode* root, const x
 void AddNoValue(const Trail& trail, const xmlDoc* document, const std::string& key,
                 Findings& findings)
 {
-    const Accepted root = {xmlDocGetRootElement(document), 0};
+    const Accepted root = {RootOf(document), 0};
     const xmlNode* const end =
         trail.top == nullptr ? root.element : DeepestAccepted(*trail.top, root).element;
     findings.Add(end, Kind::KeyWithoutValue,

@@ -148,7 +148,8 @@ void RequireDeclaredEntities(const std::string& value, const xmlDoc* document)
                      [&](const std::string& name)
                      {
                          const auto* const entity = reinterpret_cast<const xmlChar*>(name.c_str());
-                         if (name[0] != '#' && xmlGetDocEntity(document, entity) == nullptr)
+                         if (name[0] != '#' &&
+                             xmlGetDocEntity(const_cast<xmlDoc*>(document), entity) == nullptr)
                          {
                              RefuseValue("the file declares no entity " + Quoted(name));
                          }

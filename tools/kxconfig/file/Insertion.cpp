@@ -1,6 +1,7 @@
 #include "file/Insertion.h"
 
 #include "CXmlNode.h"
+#include "file/Nodes.h"
 
 #include "engine/Node.h"
 
@@ -12,7 +13,7 @@ namespace
 
 bool IsBlankLine(const xmlNode* node)
 {
-    return node != nullptr && node->type == XML_TEXT_NODE && xmlIsBlankNode(node) == 1 &&
+    return node != nullptr && node->type == XML_TEXT_NODE && IsBlankText(node) &&
            std::strchr(kx::ContentOf(node), '\n') != nullptr;
 }
 

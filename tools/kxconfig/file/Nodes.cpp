@@ -15,7 +15,7 @@ std::string KindOf(const xmlNode* node)
     case XML_ELEMENT_NODE:
         return "element " + Text(node->name);
     case XML_TEXT_NODE:
-        return xmlIsBlankNode(node) == 1 ? "blank text" : "text";
+        return IsBlankText(node) ? "blank text" : "text";
     case XML_CDATA_SECTION_NODE:
         return "CDATA section";
     case XML_ENTITY_REF_NODE:
@@ -41,7 +41,7 @@ std::string Taken(xmlChar* text)
 long LineNumberOf(const xmlNode* node)
 {
     // For an element the engine would guess from its children, which an update replaces.
-    return node->type == XML_ELEMENT_NODE ? node->line : xmlGetLineNo(node);
+    return node->type == XML_ELEMENT_NODE ? node->line : xmlGetLineNo(const_cast<xmlNode*>(node));
 }
 
 std::string LineOf(const xmlNode* node)

@@ -8,6 +8,12 @@
 
 // What kxconfig shows of the engine's nodes.
 
+inline bool IsBlankText(const xmlNode* node)
+{
+    // Headers before 2.9.8 declare it without const.
+    return xmlIsBlankNode(const_cast<xmlNode*>(node)) == 1;
+}
+
 /** @return a copy of the engine's @p text; empty for null. */
 inline std::string Text(const xmlChar* text)
 {

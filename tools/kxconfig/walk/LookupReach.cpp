@@ -36,7 +36,7 @@ std::vector<const xmlNode*> ElementsOfLookup(const xmlDoc* document, const std::
     const kx::TextView rest = kx::KeySplit(kx::TextView(key)).Rest();
     if (StartsAtRoot(document, key) && !rest.IsEmpty())
     {
-        Collect(xmlDocGetRootElement(document), rest, elements);
+        Collect(RootOf(document), rest, elements);
     }
     return elements;
 }

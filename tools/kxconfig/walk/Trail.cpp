@@ -148,7 +148,7 @@ Trail Record(const xmlDoc* document, const std::string& key, Walk walk)
     Trail trail;
     if (StartsAtRoot(document, key))
     {
-        const xmlNode* const root = xmlDocGetRootElement(document);
+        const xmlNode* const root = RootOf(document);
         const kx::TextView rest = kx::KeySplit(kx::TextView(key)).Rest();
         trail.top = rest.IsEmpty() ? KeyEnd(root) : walk(root, rest);
     }
@@ -185,7 +185,7 @@ std::vector<const TrailStep*> Trail::StepsWithText() const
 bool StartsAtRoot(const xmlDoc* document, const std::string& key)
 {
     const kx::KeySplit split((kx::TextView(key)));
-    return split.HasRest() && kx::SameText(xmlDocGetRootElement(document)->name, split.First());
+    return split.HasRest() && kx::SameText(RootOf(document)->name, split.First());
 }
 
 Trail RecordLookup(const xmlDoc* document, const std::string& key)

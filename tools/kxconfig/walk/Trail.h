@@ -60,6 +60,12 @@ struct Trail
     std::vector<const TrailStep*> StepsWithText() const;
 };
 
+inline xmlNode* RootOf(const xmlDoc* document)
+{
+    // Headers before 2.9.8 declare it without const.
+    return xmlDocGetRootElement(const_cast<xmlDoc*>(document));
+}
+
 /** @return whether @p key has a "." and starts with the name of the root. */
 bool StartsAtRoot(const xmlDoc* document, const std::string& key);
 

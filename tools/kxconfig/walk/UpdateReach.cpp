@@ -14,7 +14,7 @@ std::vector<const xmlNode*> ElementsOfUpdate(const xmlDoc* document, const std::
     {
         return elements;
     }
-    kx::UpdateWalk walk(xmlDocGetRootElement(document), rest);
+    kx::UpdateWalk walk(RootOf(document), rest);
     while (walk.Next())
     {
         if (walk.ReplacesText())
