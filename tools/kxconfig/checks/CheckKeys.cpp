@@ -23,13 +23,13 @@ std::string Counted(size_t count)
     return std::to_string(count) + (count == 1 ? " element" : " elements");
 }
 
-void CheckMatches(const Elements& found, const std::string& key, Kind kind, Findings& findings)
+void CheckMatches(const Bearers& found, const std::string& key, Kind kind, Findings& findings)
 {
-    if (found.size() > 1 && findings.Want(kind))
+    if (found.count > 1 && findings.Want(kind))
     {
-        findings.Add(found[1], kind,
-                     Quoted(key) + " matches " + Counted(found.size()) + ", the first of them " +
-                         findings.Place(found[0]));
+        findings.Add(found.first[1], kind,
+                     Quoted(key) + " matches " + Counted(found.count) + ", the first of them " +
+                         findings.Place(found.first[0]));
     }
 }
 
@@ -187,7 +187,7 @@ Elements CheckLookup(const xmlDoc* document, const std::string& key, Findings& f
     {
         AddNoValue(trail, document, key, findings);
     }
-    CheckMatches(found, key, Kind::AmbiguousKey, findings);
+    CheckMatches({found.size(), found}, key, Kind::AmbiguousKey, findings);
     if (trail.top != nullptr)
     {
         CheckOrders(*trail.top, findings);
@@ -216,13 +216,10 @@ void CheckListedKeys(const xmlNode* root, Levels& levels, Findings& findings)
     KeyValues values(root, levels);
     for (const std::string& key : ListKeys(root, levels))
     {
-        CheckMatches(values.BearersUnder(key), key, Kind::SeveralValues, findings);
+        CheckMatches(values.BearersUnder(key, 2), key, Kind::SeveralValues, findings);
         for (const auto& [parent, segment] : values.NewComparisons())
         {
-            if (!IsFreeOf("@", segment))
-            {
-                CheckOrder(levels.Below(parent).OrderFor(segment), parent, segment, findings);
-            }
+            CheckOrder(levels.Below(parent).OrderFor(segment), parent, segment, findings);
         }
     }
 }

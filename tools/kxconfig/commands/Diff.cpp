@@ -27,7 +27,7 @@ public:
         m_keys = ListKeys(root, levels);
         for (const std::string& key : m_keys)
         {
-            m_values[key] = JoinedValues(values.BearersUnder(key));
+            m_values[key] = JoinedValues(values.BearersUnder(key).first);
         }
     }
 

@@ -51,28 +51,27 @@ struct KeyAndValue
     }
 };
 
-/** @return how many of the values of @p elements are printed. */
-size_t NumberShown(const Elements& elements)
+/** @return how many of the values of @p bearers are printed. */
+size_t NumberShown(const Bearers& bearers)
 {
     size_t shown = 0;
     size_t bytes = 0;
-    for (; shown != std::min(elements.size(), kMostValues); ++shown)
+    for (; shown != bearers.first.size(); ++shown)
     {
-        bytes += std::strlen(ValueOf(elements[shown]));
+        bytes += std::strlen(ValueOf(bearers.first[shown]));
         if (bytes > kMostBytes)
         {
             break;
         }
     }
-    return elements.size() == 1 ? 1 : shown;
+    return bearers.count == 1 ? 1 : shown;
 }
 
-KeyAndValue Describe(const std::string& key, Elements elements, bool all)
+KeyAndValue Describe(const std::string& key, KeyValues& values, bool all)
 {
-    const size_t shown = all ? elements.size() : NumberShown(elements);
-    const size_t more = elements.size() - shown;
-    elements.resize(shown);
-    return {key, JoinedValues(elements), more};
+    Bearers bearers = all ? values.BearersUnder(key) : values.BearersUnder(key, kMostValues);
+    bearers.first.resize(all ? bearers.count : NumberShown(bearers));
+    return {key, JoinedValues(bearers.first), bearers.count - bearers.first.size()};
 }
 
 /** @return whether @p key is @p prefix, or goes on with a segment or with the condition of its last
@@ -131,7 +130,7 @@ ExitStatus Keys(const KeysArguments& arguments, Report& report)
     KeyValues values(root, levels);
     for (const std::string& key : keys)
     {
-        report.Add(Describe(key, values.BearersUnder(key), arguments.all));
+        report.Add(Describe(key, values, arguments.all));
     }
     return ExitStatus::Done;
 }

@@ -5,7 +5,8 @@
 #include "config/KeyPath.h"
 
 #include <algorithm>
-#include <iterator>
+#include <cstddef>
+#include <utility>
 
 namespace
 {
@@ -22,6 +23,18 @@ std::vector<std::string> Segments(const std::string& key)
         hasRest = split.HasRest();
     }
     return segments;
+}
+
+/** @return the element that follows @p element in document order below @p root, or null. */
+const xmlNode* NextElement(const xmlNode* element, const xmlNode* root)
+{
+    const xmlNode* next = kx::ElementFrom(element->children);
+    while (next == nullptr && element != root)
+    {
+        next = kx::ElementFrom(element->next);
+        element = element->parent;
+    }
+    return next;
 }
 
 } // namespace
@@ -42,14 +55,37 @@ std::string JoinedValues(const Elements& elements)
     return joined;
 }
 
-KeyValues::KeyValues(const xmlNode* root, Levels& levels) : m_levels(levels)
+KeyValues::KeyValues(const xmlNode* root, Levels& levels) : m_root(root), m_start(levels, {root})
 {
-    m_path.push_back({Text(root->name), {root}});
+    m_path.push_back({Text(root->name), {&m_start}});
 }
 
-Elements KeyValues::BearersUnder(const std::string& key)
+Bearers KeyValues::BearersUnder(const std::string& key, size_t most)
 {
-    const std::vector<std::string> segments = Segments(key);
+    Follow(Segments(key));
+    Bearers bearers = {};
+    int parts = 0;
+    for (const Step& step : m_path)
+    {
+        for (const SelectedElements* const selection : step.selected)
+        {
+            const Elements& part = selection->Bearers();
+            const auto wanted = static_cast<std::ptrdiff_t>(std::min(part.size(), most));
+            bearers.first.insert(bearers.first.end(), part.begin(), part.begin() + wanted);
+            bearers.count += part.size();
+            parts += part.empty() ? 0 : 1;
+        }
+    }
+    if (parts > 1)
+    {
+        SortByPlace(bearers.first);
+        bearers.first.resize(std::min(bearers.first.size(), most));
+    }
+    return bearers;
+}
+
+void KeyValues::Follow(const std::vector<std::string>& segments)
+{
     size_t shared = 1; // the root
     while (shared < std::min(m_path.size(), segments.size()) &&
            m_path[shared].segment == segments[shared])
@@ -57,42 +93,41 @@ Elements KeyValues::BearersUnder(const std::string& key)
         ++shared;
     }
     m_path.resize(shared);
+    m_comparisons.clear();
     for (size_t i = shared; i != segments.size(); ++i)
     {
-        m_path.push_back({segments[i], {}});
+        Step step = {segments[i], {}};
+        for (SelectedElements* const selection : m_path.back().selected)
+        {
+            selection->Select(segments[i], step.selected, m_comparisons);
+        }
+        m_path.push_back(std::move(step));
     }
-    m_comparisons.clear();
-    for (const xmlNode* const element : m_path[shared - 1].reached)
-    {
-        ReachFrom(element, shared);
-    }
-    Elements bearers;
-    const Elements& reached = m_path.back().reached;
-    std::copy_if(reached.begin(), reached.end(), std::back_inserter(bearers),
-                 [](const xmlNode* element) { return kx::OnlyTextChild(element) != nullptr; });
-    return bearers;
 }
 
-/** Reaches what the steps from @p depth on select below @p element. */
-void KeyValues::ReachFrom(const xmlNode* element, size_t depth)
+const std::vector<Comparison>& KeyValues::NewComparisons()
 {
-    if (depth == m_path.size())
+    std::stable_sort(m_comparisons.begin(), m_comparisons.end(),
+                     [this](const Comparison& one, const Comparison& other)
+                     { return PlaceOf(one.parent) < PlaceOf(other.parent); });
+    return m_comparisons;
+}
+
+void KeyValues::SortByPlace(Elements& elements)
+{
+    std::sort(elements.begin(), elements.end(),
+              [this](const xmlNode* one, const xmlNode* other)
+              { return PlaceOf(one) < PlaceOf(other); });
+}
+
+size_t KeyValues::PlaceOf(const xmlNode* element)
+{
+    if (m_places.empty())
     {
-        return;
+        for (const xmlNode* node = m_root; node != nullptr; node = NextElement(node, m_root))
+        {
+            m_places.emplace(node, m_places.size());
+        }
     }
-    // An element with a value counts for every deeper segment too: the lookup takes it on its way,
-    // and nothing is below it.
-    if (kx::OnlyTextChild(element) != nullptr)
-    {
-        m_path[depth].reached.push_back(element);
-        ReachFrom(element, depth + 1);
-        return;
-    }
-    const std::string& segment = m_path[depth].segment;
-    m_comparisons.push_back({element, segment});
-    for (const Sibling& sibling : m_levels.Below(element).SelectedBy(segment))
-    {
-        m_path[depth].reached.push_back(sibling.element);
-        ReachFrom(sibling.element, depth + 1);
-    }
+    return m_places.at(element);
 }

@@ -1,12 +1,12 @@
 #ifndef KX_TOOLS_KEYVALUES_H
 #define KX_TOOLS_KEYVALUES_H
 
-#include "survey/Levels.h"
+#include "survey/SelectedElements.h"
 
+#include <limits>
 #include <string>
+#include <unordered_map>
 #include <vector>
-
-using Elements = std::vector<const xmlNode*>;
 
 /** @return the value of @p element, which has one. */
 const char* ValueOf(const xmlNode* element);
@@ -14,19 +14,18 @@ const char* ValueOf(const xmlNode* element);
 /** @return the values of @p elements as a lookup joins them. */
 std::string JoinedValues(const Elements& elements);
 
-/** A level that a key leads to, and the segment that a lookup compares the level's elements with.
- */
-struct Comparison
+/** The elements that give the values under a key. */
+struct Bearers
 {
-    const xmlNode* parent;
-    std::string segment;
+    size_t count;
+    Elements first; ///< in document order, as many as were asked for
 };
 
 /**
  * What is under many keys of one document: the values as GetValue() gives them.
  *
  * A lookup compares with every sibling on its way. This reaches the same elements by segments
- * (Levels), and what a key shares with the one before it is not walked again.
+ * (SelectedElements), and what a key shares with the one before it is not walked again.
  */
 class KeyValues
 {
@@ -36,27 +35,32 @@ public:
 
     /**
      * @param key  one that ListKeys() listed.
-     * @return the elements that give the values under @p key, in document order.
+     * @param most  the number of elements that are wanted.
      */
-    Elements BearersUnder(const std::string& key);
+    Bearers BearersUnder(const std::string& key, size_t most = std::numeric_limits<size_t>::max());
 
-    /** @return the levels that the last key led to and the one before it did not, in the order in
-     * which a lookup comes to them. */
-    const std::vector<Comparison>& NewComparisons() const { return m_comparisons; }
+    /** @return the levels that the last key led to and no key before it did with the same outcome,
+     * of the segments with a condition, in the order in which a lookup comes to them. */
+    const std::vector<Comparison>& NewComparisons();
 
 private:
-    /** A segment of the last key, and what the key selects up to it. */
+    /** A segment of the last key, and what the key selects with it: parts without an element in
+     * common. */
     struct Step
     {
         std::string segment;
-        Elements reached;
+        std::vector<SelectedElements*> selected;
     };
 
-    void ReachFrom(const xmlNode* element, size_t depth);
+    void Follow(const std::vector<std::string>& segments);
+    void SortByPlace(Elements& elements);
+    size_t PlaceOf(const xmlNode* element);
 
-    Levels& m_levels;
+    const xmlNode* const m_root;
+    SelectedElements m_start;
     std::vector<Step> m_path; ///< starts with the root
     std::vector<Comparison> m_comparisons;
+    std::unordered_map<const xmlNode*, size_t> m_places; ///< in document order, once it is needed
 };
 
 #endif

@@ -90,29 +90,40 @@ bool IsFreeOf(const char* separators, const std::string& text)
     return text.find_first_of(separators) == std::string::npos;
 }
 
-Level::Level(const xmlNode* parent, const std::map<std::string, Names>& defaulted)
+Level::Level(const Elements& parents, const std::map<std::string, Names>& defaulted)
     : m_defaulted(defaulted)
+{
+    for (const xmlNode* const parent : parents)
+    {
+        AddChildrenOf(parent);
+    }
+}
+
+void Level::AddChildrenOf(const xmlNode* parent)
 {
     const xmlNode* before = nullptr;
     for (const xmlNode* node = kx::ElementFrom(parent->children); node != nullptr;
          node = kx::ElementFrom(node->next))
     {
-        const Sibling sibling = {m_elements.size(), node};
-        m_elements.push_back(node);
-        const std::string name = Text(node->name);
-        Namesakes& namesakes = m_byName[name];
-        namesakes.all.push_back(sibling);
-        const bool suspended = before != nullptr && !xmlStrEqual(before->name, node->name);
-        if (suspended)
-        {
-            namesakes.suspended.push_back(sibling);
-            m_otherThanFirst = m_otherThanFirst == nullptr ? node : m_otherThanFirst;
-        }
-        for (const std::string& condition : ConditionsOf(node))
-        {
-            namesakes.fulfilling[condition].push_back(sibling);
-        }
+        Add(node, before != nullptr && !xmlStrEqual(before->name, node->name));
         before = node;
+    }
+}
+
+void Level::Add(const xmlNode* element, bool suspended)
+{
+    const Sibling sibling = {m_elements.size(), element, suspended};
+    m_elements.push_back(element);
+    Namesakes& namesakes = m_byName[Text(element->name)];
+    namesakes.all.push_back(sibling);
+    if (suspended)
+    {
+        namesakes.suspended.push_back(sibling);
+        m_otherThanFirst = m_otherThanFirst == nullptr ? element : m_otherThanFirst;
+    }
+    for (const std::string& condition : ConditionsOf(element))
+    {
+        namesakes.fulfilling[condition].push_back(sibling);
     }
 }
 
@@ -134,53 +145,45 @@ std::string Level::SegmentOf(const xmlNode* element) const
     return name;
 }
 
-Siblings Level::SelectedBy(const std::string& segment) const
+const Level::Namesakes& Level::NamesakesOf(const std::string& name) const
 {
-    const kx::Segment split((kx::TextView(segment)));
-    const auto namesakes = m_byName.find(Text(split.name));
-    if (namesakes == m_byName.end())
-    {
-        return {};
-    }
-    if (split.condition.IsEmpty())
-    {
-        return namesakes->second.all;
-    }
-    const Siblings& fulfilling = namesakes->second.Fulfilling(segment.substr(split.name.size));
-    const Siblings& suspended = namesakes->second.suspended;
-    Siblings selected;
-    std::set_union(fulfilling.begin(), fulfilling.end(), suspended.begin(), suspended.end(),
-                   std::back_inserter(selected), ComesFirst);
-    return selected;
+    static const Namesakes kNone;
+    const auto found = m_byName.find(name);
+    return found == m_byName.end() ? kNone : found->second;
 }
 
-const Siblings& Level::Namesakes::Fulfilling(const std::string& condition) const
+const Siblings& Level::Named(const std::string& name) const
+{
+    return NamesakesOf(name).all;
+}
+
+const Siblings& Level::Suspended(const std::string& name) const
+{
+    return NamesakesOf(name).suspended;
+}
+
+const Siblings& Level::Fulfilling(const std::string& segment) const
 {
     static const Siblings kNone;
-    const auto found = fulfilling.find(condition);
+    const kx::Segment split((kx::TextView(segment)));
+    const auto& fulfilling = NamesakesOf(Text(split.name)).fulfilling;
+    const auto found = fulfilling.find(segment.substr(split.name.size));
     return found == fulfilling.end() ? kNone : found->second;
 }
 
 Order Level::OrderFor(const std::string& segment) const
 {
-    const kx::Segment split((kx::TextView(segment)));
-    const std::string name = Text(split.name);
+    const std::string name = Text(kx::Segment(kx::TextView(segment)).name);
+    const Siblings& fulfilling = Fulfilling(segment);
     Order order;
     order.other = FirstNotNamed(name);
-    const auto found = m_byName.find(name);
-    if (found == m_byName.end())
-    {
-        return order;
-    }
-    const Namesakes& namesakes = found->second;
-    const Siblings& fulfilling = namesakes.Fulfilling(segment.substr(split.name.size));
-    if (const Sibling* const taken = FirstExcept(fulfilling, namesakes.suspended))
+    if (const Sibling* const taken = FirstExcept(fulfilling, Suspended(name)))
     {
         order.taken = taken->element;
-        order.suspender = SuspenderOf(*taken, namesakes);
+        order.suspender = SuspenderOf(*taken, Named(name));
     }
     // If none is taken like that, the condition rejects all the others that do not fulfill it.
-    else if (const Sibling* const rejected = FirstExcept(fulfilling, namesakes.all))
+    else if (const Sibling* const rejected = FirstExcept(fulfilling, Named(name)))
     {
         order.rejected = rejected->element;
     }
@@ -198,11 +201,10 @@ const xmlNode* Level::FirstNotNamed(const std::string& name) const
 }
 
 /** @return the first element after the namesake in front of @p suspended. */
-const xmlNode* Level::SuspenderOf(const Sibling& suspended, const Namesakes& namesakes) const
+const xmlNode* Level::SuspenderOf(const Sibling& suspended, const Siblings& namesakes) const
 {
-    const Siblings& all = namesakes.all;
-    const auto at = std::lower_bound(all.begin(), all.end(), suspended, ComesFirst);
-    return m_elements[at == all.begin() ? 0 : std::prev(at)->place + 1];
+    const auto at = std::lower_bound(namesakes.begin(), namesakes.end(), suspended, ComesFirst);
+    return m_elements[at == namesakes.begin() ? 0 : std::prev(at)->place + 1];
 }
 
 /** @return the conditions of one attribute, as "@name=value", that @p element fulfills. */
@@ -230,7 +232,7 @@ const Level& Levels::Below(const xmlNode* parent)
     const auto level = m_levels.find(parent);
     return level != m_levels.end()
                ? level->second
-               : m_levels.emplace(parent, Level(parent, m_defaulted)).first->second;
+               : m_levels.emplace(parent, Below(Elements{parent})).first->second;
 }
 
 std::map<std::string, std::string> Levels::AttributesOf(const xmlNode* element) const

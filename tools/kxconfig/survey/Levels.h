@@ -11,11 +11,14 @@
 // What the segments of keys select, for many keys of one document: a lookup compares a segment with
 // every sibling, here the siblings are sorted by the segments that select them.
 
+using Elements = std::vector<const xmlNode*>;
+
 /** An element and its place among the elements of its level. */
 struct Sibling
 {
     size_t place;
     const xmlNode* element;
+    bool suspended; ///< right after an element of another name: no condition rejects it
 };
 
 using Siblings = std::vector<Sibling>;
@@ -29,12 +32,13 @@ struct Order
     const xmlNode* suspender = nullptr; ///< suspended the condition for it
 };
 
-/** The element children of one node. */
+/** The element children of one node, or of several. */
 class Level
 {
 public:
     /** @param defaulted  the attributes that the DTD gives to elements, by the elements' name. */
-    Level(const xmlNode* parent, const std::map<std::string, std::vector<std::string>>& defaulted);
+    Level(const Elements& parents,
+          const std::map<std::string, std::vector<std::string>>& defaulted);
 
     /**
      * @return the segment for @p element: its name and, if others bear it too, the first condition
@@ -42,30 +46,36 @@ public:
      */
     std::string SegmentOf(const xmlNode* element) const;
 
-    /** @return what a lookup takes for @p segment, which SegmentOf() gave for some level. */
-    Siblings SelectedBy(const std::string& segment) const;
+    const Siblings& Named(const std::string& name) const;
 
-    /** @return the elements whose order matters to @p segment, which has a condition and which
-     * SegmentOf() gave for some level. */
+    /** @return those of the name that no condition rejects. */
+    const Siblings& Suspended(const std::string& name) const;
+
+    /** @return those of the name that @p segment starts with that fulfill the segment's condition,
+     * which SegmentOf() gave for some level. */
+    const Siblings& Fulfilling(const std::string& segment) const;
+
+    /** @return the elements of one parent whose order matters to @p segment, which has a condition
+     * and which SegmentOf() gave for some level. */
     Order OrderFor(const std::string& segment) const;
 
 private:
     struct Namesakes
     {
-        /** @return those that fulfill @p condition, "@name=value". */
-        const Siblings& Fulfilling(const std::string& condition) const;
-
         Siblings all;
-        Siblings suspended; ///< right after an element of another name: no condition rejects them
-        std::map<std::string, Siblings> fulfilling; ///< by condition
+        Siblings suspended;
+        std::map<std::string, Siblings> fulfilling; ///< by condition, "@name=value"
     };
 
+    const Namesakes& NamesakesOf(const std::string& name) const;
+    void AddChildrenOf(const xmlNode* parent);
+    void Add(const xmlNode* element, bool suspended);
     std::vector<std::string> ConditionsOf(const xmlNode* element) const;
     const xmlNode* FirstNotNamed(const std::string& name) const;
-    const xmlNode* SuspenderOf(const Sibling& suspended, const Namesakes& namesakes) const;
+    const xmlNode* SuspenderOf(const Sibling& suspended, const Siblings& namesakes) const;
 
     const std::map<std::string, std::vector<std::string>>& m_defaulted;
-    std::vector<const xmlNode*> m_elements;
+    Elements m_elements;
     const xmlNode* m_otherThanFirst = nullptr; ///< the first with another name than the first has
     std::map<std::string, Namesakes> m_byName;
 };
@@ -77,6 +87,9 @@ public:
     explicit Levels(const xmlDoc* document);
 
     const Level& Below(const xmlNode* parent);
+
+    /** @return the children of all @p parents, as one level, which is not kept. */
+    Level Below(const Elements& parents) const { return {parents, m_defaulted}; }
 
     /** @return the attributes that conditions find in @p element, by the names that they find them
      * by: without a prefix, and with the defaults of the DTD. */
