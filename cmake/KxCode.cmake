@@ -28,6 +28,10 @@ function(kx_host_code target)
         CXX_STANDARD 17
         CXX_STANDARD_REQUIRED ON
         CXX_EXTENSIONS OFF)
+    # A 32-bit program otherwise fails with files whose size, time, inode number or place in a folder needs 64 bits.
+    if(CMAKE_SIZEOF_VOID_P EQUAL 4)
+        target_compile_definitions(${target} PRIVATE _FILE_OFFSET_BITS=64 _TIME_BITS=64)
+    endif()
 endfunction()
 
 # Code that calls the engine. A newer engine may deprecate a call for which the oldest one that is supported has

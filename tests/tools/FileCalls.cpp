@@ -47,7 +47,8 @@ extern "C" int openat(int folder, const char* path, int flags, ...)
     va_start(arguments, flags);
     const mode_t mode = (flags & (O_CREAT | O_TMPFILE)) != 0 ? va_arg(arguments, mode_t) : 0;
     va_end(arguments);
-    return OpenNext("openat", folder, path, flags, mode);
+    // A 32-bit program calls this name, which is the same function elsewhere.
+    return OpenNext("openat64", folder, path, flags, mode);
 }
 
 namespace kxtest
