@@ -271,7 +271,7 @@ xmlXPathObject* CXmlParser::GetNodeSet(std::string expression, CXmlNode contextN
     else
     {
         context->node = contextNode.m_pXmlNode;
-        if (QueryEnds(context->node, expression.c_str()))
+        if (QueryEnds(context, expression.c_str()))
         {
             result = xmlXPathEvalExpression(ToEngine(expression), context);
         }

@@ -1,5 +1,7 @@
 #include "OldEngine.h"
 
+#include "Walk.h"
+
 #include <libxml/entities.h>
 #include <libxml/parser.h>
 
@@ -14,10 +16,16 @@ namespace kx
 namespace
 {
 
-bool IsOld()
+/** @return whether the engine is older than @p version, which is "20910" for 2.9.10. */
+bool IsBefore(const char* version)
 {
     // The variable behind it is a macro up to 2.11, and a symbol of its own since.
-    return strcmp(*__xmlParserVersion(), "20910") < 0;
+    return strcmp(*__xmlParserVersion(), version) < 0;
+}
+
+bool IsOld()
+{
+    return IsBefore("20910");
 }
 
 /** @return whether the engine turns the content of @p node into child nodes. */
@@ -107,6 +115,67 @@ bool IsInsideAttribute(const xmlNode* node)
     return parent != 0;
 }
 
+/** @return whether any node of @p document refers to a declared entity. */
+bool HasReferences(xmlDoc* document)
+{
+    xmlNode* const top = reinterpret_cast<xmlNode*>(document);
+    xmlNode* node = top;
+    while (node != 0 && (node->type != XML_ENTITY_REF_NODE || node->children == 0))
+    {
+        node = NextWithin(top, node);
+    }
+    return node != 0;
+}
+
+/** @return whether the query's document, or that of its context, has references. */
+bool MeetsReferences(const xmlXPathContext* context)
+{
+    const xmlNode* const node = context->node;
+    return HasReferences(context->doc) ||
+           (node != 0 && node->type != XML_NAMESPACE_DECL && HasReferences(node->doc));
+}
+
+/** @return whether @p text starts with the axis @p name, or with @p name and "-or-self". */
+bool StartsWithAxis(const char* text, const char* name)
+{
+    if (strncmp(text, name, strlen(name)) != 0)
+    {
+        return false;
+    }
+    text += strlen(name);
+    text += strncmp(text, "-or-self", 8) == 0 ? 8 : 0;
+    text += strspn(text, " \t\r\n");
+    return strncmp(text, "::", 2) == 0;
+}
+
+/** @return the end of the literal that starts at @p text, else @p text. */
+const char* SkipLiteral(const char* text)
+{
+    const char* const end = *text == '\'' || *text == '"' ? strchr(text + 1, *text) : 0;
+    return end != 0 ? end : text;
+}
+
+/** @return whether @p expression has a step along the axis @p name. */
+bool UsesAxis(const char* expression, const char* name)
+{
+    const char* at = expression;
+    while (*at != 0 && !StartsWithAxis(at, name))
+    {
+        at = SkipLiteral(at) + 1;
+    }
+    return *at != 0;
+}
+
+bool UsesAncestors(const char* expression)
+{
+    return UsesAxis(expression, "ancestor");
+}
+
+bool UsesOrder(const char* expression)
+{
+    return UsesAxis(expression, "following") || UsesAxis(expression, "preceding");
+}
+
 } // namespace
 
 void SetContent(xmlNode* node, const xmlChar* text)
@@ -138,10 +207,18 @@ xmlNode* NewElement(xmlDoc* document, xmlNs* space, const xmlChar* name, const x
     return element;
 }
 
-bool QueryEnds(const xmlNode* context, const char* expression)
+bool QueryEnds(const xmlXPathContext* context, const char* expression)
 {
-    return !IsOld() || !IsInsideAttribute(context) ||
-           (strstr(expression, "ancestor") == 0 && strstr(expression, "following") == 0);
+    if (!IsOld())
+    {
+        return true;
+    }
+    if (IsInsideAttribute(context->node) && UsesAncestors(expression))
+    {
+        return false;
+    }
+    // From 2.9 on a query fails that selects too many nodes.
+    return !IsBefore("20900") || !UsesOrder(expression) || !MeetsReferences(context);
 }
 
 #else
@@ -156,7 +233,7 @@ xmlNode* NewElement(xmlDoc* document, xmlNs* space, const xmlChar* name, const x
     return xmlNewDocNode(document, space, name, content);
 }
 
-bool QueryEnds(const xmlNode* /*context*/, const char* /*expression*/)
+bool QueryEnds(const xmlXPathContext* /*context*/, const char* /*expression*/)
 {
     return true;
 }

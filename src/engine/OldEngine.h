@@ -10,6 +10,7 @@
  */
 
 #include <libxml/tree.h>
+#include <libxml/xpath.h>
 
 namespace kx
 {
@@ -26,10 +27,11 @@ void SetContent(xmlNode* node, const xmlChar* text);
 xmlNode* NewElement(xmlDoc* document, xmlNs* space, const xmlChar* name, const xmlChar* content);
 
 /**
- * @return whether the evaluation of @p expression from @p context, which may be null, returns:
- *         inside an attribute, older engines follow the axes "ancestor" and "following" forever.
+ * @return whether the evaluation of @p expression ends. Older engines follow the ancestors of a
+ *         node inside an attribute forever. Engines before 2.9 enter the declaration of an entity
+ *         at a reference and follow the axes "following" and "preceding" from there.
  */
-bool QueryEnds(const xmlNode* context, const char* expression);
+bool QueryEnds(const xmlXPathContext* context, const char* expression);
 
 } // namespace kx
 

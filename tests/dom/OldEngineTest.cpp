@@ -120,6 +120,18 @@ protected:
         return most;
     }
 
+    /** @return whether a query of a document with the text @p xml succeeds. */
+    static bool Answers(const char* xml, const char* expression, const CXmlNode& context)
+    {
+        CXmlParser parser;
+        const TemporaryFolder folder;
+        EXPECT_EQ(0, parser.ParseXml(folder.Write("a.xml", xml)));
+        const xmlXPathObjectPtr result = parser.GetNodeSet(expression, context);
+        xmlXPathFreeObject(result);
+        TakeEngineErrors();
+        return result != nullptr;
+    }
+
     /** Newer engines survive each of these texts; with an older one there is nothing to compare. */
     static void ExpectNoDifference(const char* xpath, const Change& change)
     {
@@ -197,29 +209,71 @@ TEST_F(OldEngineTest, NothingMoreIsLostWhenMemoryRunsOut)
     }
 }
 
-TEST_F(OldEngineTest, QueryFromInsideAnAttributeEnds)
+TEST_F(OldEngineTest, QueryForAncestorsFromInsideAnAttributeFails)
 {
     const Pretended pretended(kOld);
-    const auto answers = [](CXmlNode context, const char* expression)
-    {
-        CXmlParser parser;
-        const TemporaryFolder folder;
-        EXPECT_EQ(0, parser.ParseXml(folder.Write("a.xml", "<a/>")));
-        const xmlXPathObjectPtr result = parser.GetNodeSet(expression, context);
-        xmlXPathFreeObject(result);
-        return result != nullptr;
-    };
     const xmlNodePtr attribute = NodeOf(m_document, "//net/@mode");
-    CXmlNode inside(attribute->children);
-    EXPECT_FALSE(answers(inside, "ancestor::*"));
-    EXPECT_FALSE(answers(inside, "following::*"));
-    EXPECT_TRUE(answers(inside, ".."));
-    EXPECT_TRUE(answers(CXmlNode(attribute), "ancestor::*"));
-    EXPECT_TRUE(answers(CXmlNode(), "//a/ancestor::*"));
+    const CXmlNode inside(attribute->children);
+    for (const char* const expression : {"ancestor::*", "../ancestor-or-self::node()",
+                                         "//a[ancestor \t\r\n::b]", "concat('x', ancestor::*)"})
+    {
+        EXPECT_FALSE(Answers("<a/>", expression, inside)) << expression;
+    }
+    EXPECT_TRUE(Answers("<a/>", "..", inside));
+    EXPECT_TRUE(Answers("<a/>", "ancestor::*", CXmlNode(attribute)));
+    EXPECT_TRUE(Answers("<a/>", "//a/ancestor::*", CXmlNode()));
 
     CXmlNode below = CXmlNode(attribute).AddChildNode("below", "");
     EXPECT_EQ("below", below.Name());
-    EXPECT_FALSE(answers(below, "ancestor::*"));
+    EXPECT_FALSE(Answers("<a/>", "ancestor::*", below));
+}
+
+TEST_F(OldEngineTest, NameOfAnAxisInALiteralOrANameIsNoAxis)
+{
+    const Pretended pretended(kOld);
+    const CXmlNode inside(NodeOf(m_document, "//net/@mode")->children);
+    for (const char* const expression :
+         {"'ancestor::*'", "\"'ancestor::*\"", "concat('ancestor', \"::\")", "//ancestor",
+          "//a[.='ancestor::b']", "ancestor-or-self", "string('')", "following::*", "preceding::*"})
+    {
+        EXPECT_TRUE(Answers("<a/>", expression, inside)) << expression;
+    }
+    EXPECT_FALSE(Answers("<a/>", "concat('', 'it', ancestor::*)", inside));
+    EXPECT_FALSE(Answers("<a/>", "'", inside));
+}
+
+TEST_F(OldEngineTest, QueryPastReferencesFails)
+{
+    const Pretended pretended(kOld);
+    const char* const xml = "<!DOCTYPE a [<!ENTITY e 'text'>]><a><b/>&e;<c/></a>";
+    EXPECT_FALSE(Answers(xml, "//b/following::c", CXmlNode()));
+    EXPECT_FALSE(Answers(xml, "//c/preceding :: *", CXmlNode()));
+    EXPECT_TRUE(Answers(xml, "//b/following-sibling::*", CXmlNode()));
+    EXPECT_TRUE(Answers(xml, "//c/preceding-sibling::*", CXmlNode()));
+    EXPECT_TRUE(Answers(xml, "//c/ancestor::*", CXmlNode()));
+    EXPECT_TRUE(Answers(xml, "'following::*'", CXmlNode()));
+}
+
+TEST_F(OldEngineTest, QueryFromANodeOfADocumentWithReferencesFails)
+{
+    const Pretended pretended(kOld);
+    const xmlDocPtr other = Parse("<!DOCTYPE a [<!ENTITY e 'text'>]><a><b/>&e;<c/></a>");
+    EXPECT_FALSE(Answers("<a/>", "following::c", CXmlNode(NodeOf(other, "//b"))));
+    EXPECT_TRUE(Answers("<a/>", "following::c", CXmlNode(NodeOf(m_document, "//net"))));
+}
+
+TEST_F(OldEngineTest, UndeclaredEntityIsNoReferenceToFollow)
+{
+    const Pretended pretended(kOld);
+    const char* const xml = "<!DOCTYPE a SYSTEM 'a.dtd'><a><b/>&e;<c/></a>";
+    EXPECT_TRUE(Answers(xml, "//b/following::c", CXmlNode()));
+}
+
+TEST_F(OldEngineTest, QueryPastReferencesIsLeftToEnginesFrom29On)
+{
+    const Pretended pretended("20901");
+    const char* const xml = "<!DOCTYPE a [<!ENTITY e 'text'>]><a><b/>&e;<c/></a>";
+    EXPECT_TRUE(Answers(xml, "//c/following::*", CXmlNode()));
 }
 
 TEST_F(OldEngineTest, NamespaceIsAContextAsEver)
@@ -230,8 +284,11 @@ TEST_F(OldEngineTest, NamespaceIsAContextAsEver)
     ASSERT_EQ(0, parser.ParseXml(folder.Write("a.xml", "<a xmlns:n='urn:n'/>")));
     const xmlXPathObjectPtr spaces = parser.GetNodeSet("/a/namespace::n", CXmlNode());
     CXmlNode space(xmlXPathNodeSetItem(spaces->nodesetval, 0));
-    const xmlXPathObjectPtr above = parser.GetNodeSet("ancestor::*", space);
-    EXPECT_NE(nullptr, above);
-    xmlXPathFreeObject(above);
+    for (const char* const expression : {"ancestor::*", "following::*"})
+    {
+        const xmlXPathObjectPtr result = parser.GetNodeSet(expression, space);
+        EXPECT_NE(nullptr, result) << expression;
+        xmlXPathFreeObject(result);
+    }
     xmlXPathFreeObject(spaces);
 }
