@@ -1,7 +1,24 @@
 #!/usr/bin/env bash
 # Measures this library and others, and writes docs/performance.md from the results. Takes about twenty minutes; other
 # load on the machine distorts the figures.
+# usage: bench.sh [client]
+#   client  measures kxconfig alone, and renews its section of the page; takes about five minutes
 . "$(dirname "$0")/common.sh"
+
+client=build/bench/client
+
+measure_client() {
+    need "${build_packages[@]}" "${client_bench_packages[@]}"
+    build_preset bench --target kxconfig kx_bench_load
+    scripts/client_performance.py measure build/bench/tools/kxconfig build/bench/bench/kx_bench_load $client
+}
+
+if [ "${1:-}" = client ]; then
+    measure_client
+    scripts/client_performance.py page $client docs/performance.md
+    echo "the client's section of docs/performance.md is written"
+    exit
+fi
 
 need "${build_packages[@]}" "${bench_packages[@]}"
 
@@ -40,5 +57,7 @@ for variant in as_it_is no_gates; do
         >$results/$variant.txt
 done
 
-scripts/performance_report.py $results docs
+measure_client
+
+scripts/performance_report.py $results $client docs
 echo "docs/performance.md is written"

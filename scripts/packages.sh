@@ -48,6 +48,9 @@ bench_packages=(libbenchmark-dev valgrind python3-matplotlib pkg-config
     libpoco-dev libboost-dev libpugixml-dev libtinyxml2-dev libxml++2.6-dev
     fontconfig-config shared-mime-info xkb-data)
 
+# For the benchmark of the client: the compared programs.
+client_bench_packages=(python3 libxml2-utils xmlstarlet)
+
 # For building the Debian packages, and for their tests.
 packaging_packages=(dpkg-dev file fakeroot lintian man-db pkg-config)
 

@@ -3,7 +3,7 @@
 
 The prose of the page is in performance.template.md, beside this script.
 
-usage: performance_report.py RESULTS_FOLDER DOCS_FOLDER
+usage: performance_report.py RESULTS_FOLDER CLIENT_FOLDER DOCS_FOLDER
 """
 
 import io
@@ -15,6 +15,7 @@ import sys
 from collections import namedtuple
 from pathlib import Path
 
+import client_performance
 import matplotlib
 
 matplotlib.use("svg")
@@ -463,7 +464,7 @@ SECTIONS = [
 TEMPLATE = Path(__file__).with_name("performance.template.md")
 
 
-def page(results):
+def page(results, client):
     workloads = results.workloads()
     small = [w for w in workloads if len(results.implementations(w)) > 3 or not w.startswith("look up")]
     parts = []
@@ -492,6 +493,7 @@ def page(results):
                            targets_table),
         loading=table(["library", "least favorable file", "most favorable file"], loading_rows(results)),
         tables="\n\n".join(parts),
+        client=client_performance.section_of(client),
         growth=table(["with the number of", "sizes", "instructions", "of the walk", "time", "of the walk"],
                      growth_rows(results)),
         prices=table(["operation", "as it is", "without gates", "price"],
@@ -585,12 +587,12 @@ def plot_growth(results, path):
 
 def main():
     results = Results(Path(sys.argv[1]))
-    docs = Path(sys.argv[2])
+    docs = Path(sys.argv[3])
     plots = docs / "performance"
     plots.mkdir(exist_ok=True)
     plot_ratios(results, plots / "ratios.svg")
     plot_growth(results, plots / "growth.svg")
-    (docs / "performance.md").write_text(page(results))
+    (docs / "performance.md").write_text(page(results, Path(sys.argv[2])))
 
 
 if __name__ == "__main__":
