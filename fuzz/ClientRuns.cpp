@@ -4,7 +4,6 @@
 
 #include "cli/Run.h"
 
-#include <libxml/parser.h>
 #include <libxml/tree.h>
 
 #include <algorithm>
@@ -63,37 +62,6 @@ std::string Named(std::string argument)
 {
     const auto at = argument.find("FILE");
     return at == argument.npos ? argument : argument.replace(at, 4, "f.xml");
-}
-
-std::string PathOf(const xmlNode* node)
-{
-    xmlChar* const path = xmlGetNodePath(const_cast<xmlNode*>(node));
-    const std::string text = reinterpret_cast<const char*>(path);
-    xmlFree(path);
-    return text;
-}
-
-std::string ContentOf(const xmlNode* node)
-{
-    xmlChar* const content = xmlNodeGetContent(const_cast<xmlNode*>(node));
-    const std::string text = content == nullptr ? "" : reinterpret_cast<const char*>(content);
-    xmlFree(content);
-    return text;
-}
-
-void Collect(const xmlNode* node, std::map<std::string, std::string>& texts)
-{
-    for (; node != nullptr; node = node->next)
-    {
-        if (node->type == XML_ELEMENT_NODE)
-        {
-            if (xmlChildElementCount(const_cast<xmlNode*>(node)) == 0)
-            {
-                texts[PathOf(node)] = ContentOf(node);
-            }
-            Collect(node->children, texts);
-        }
-    }
 }
 
 } // namespace
@@ -187,33 +155,6 @@ bool StartsAtRoot(CXMLReader& reader, const std::string& key)
     const auto document = static_cast<xmlDoc*>(reader.GetDataPtr());
     const std::string root = reinterpret_cast<const char*>(xmlDocGetRootElement(document)->name);
     return key.substr(0, key.find('.')) == root;
-}
-
-LeafTexts::LeafTexts(const std::string& file)
-{
-    const xmlDocPtr document =
-        xmlReadMemory(file.data(), static_cast<int>(file.size()), nullptr, nullptr, 0);
-    m_loaded = document != nullptr;
-    if (m_loaded)
-    {
-        Collect(xmlDocGetRootElement(document), m_texts);
-    }
-    xmlFreeDoc(document);
-}
-
-Changes LeafTexts::ChangesTo(const LeafTexts& after) const
-{
-    Changes changes;
-    for (const auto& [location, text] : m_texts)
-    {
-        const auto found = after.m_texts.find(location);
-        Require(found != after.m_texts.end(), "an element has gone", location);
-        if (found->second != text)
-        {
-            changes[location] = {text, found->second};
-        }
-    }
-    return changes;
 }
 
 } // namespace kxfuzz

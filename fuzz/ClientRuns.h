@@ -5,9 +5,7 @@
 
 #include <nlohmann/json.hpp>
 
-#include <map>
 #include <string>
-#include <utility>
 #include <vector>
 
 class CXMLReader;
@@ -67,23 +65,6 @@ Arguments WithJson(Arguments arguments);
 
 /** @return whether the first name of @p key is the root's: another root counts as success. */
 bool StartsAtRoot(CXMLReader& reader, const std::string& key);
-
-/** Before and after, by location path. */
-using Changes = std::map<std::string, std::pair<std::string, std::string>>;
-
-/** The texts of all elements without elements in them. */
-class LeafTexts
-{
-public:
-    explicit LeafTexts(const std::string& file);
-
-    bool Loaded() const { return m_loaded; }
-    Changes ChangesTo(const LeafTexts& after) const;
-
-private:
-    bool m_loaded;
-    std::map<std::string, std::string> m_texts;
-};
 
 } // namespace kxfuzz
 
