@@ -108,6 +108,7 @@ void RequirePlaces(const std::vector<xmlNode*>& places, const AddArguments& argu
 std::vector<Change> Additions(const std::vector<xmlNode*>& added)
 {
     std::vector<Change> changes;
+    changes.reserve(added.size());
     Locations locations;
     for (const xmlNode* const node : added)
     {

@@ -38,6 +38,7 @@ std::vector<xmlNode*> Topmost(const std::vector<xmlNode*>& nodes)
 std::vector<Change> Removals(const std::vector<xmlNode*>& nodes)
 {
     std::vector<Change> changes;
+    changes.reserve(nodes.size());
     Locations locations;
     for (const xmlNode* const node : nodes)
     {

@@ -72,7 +72,7 @@ void RequireReference(const std::string& text)
         const bool isHexadecimal = text.compare(1, 1, "x") == 0;
         RequireCharacter(text.substr(isHexadecimal ? 2 : 1), isHexadecimal ? 16 : 10);
     }
-    else if (text.empty() || text.find_first_of("&< \t\r\n") != text.npos)
+    else if (text.empty() || text.find_first_of("&< \t\r\n") != std::string::npos)
     {
         RefuseValue(g_bareAmpersand);
     }
@@ -82,10 +82,10 @@ void RequireReference(const std::string& text)
 template <class Check>
 void ForEachReference(const std::string& value, Check check)
 {
-    for (size_t at = value.find('&'); at != value.npos;)
+    for (size_t at = value.find('&'); at != std::string::npos;)
     {
         const size_t end = value.find(';', at);
-        if (end == value.npos)
+        if (end == std::string::npos)
         {
             RefuseValue(g_bareAmpersand);
         }
@@ -111,7 +111,8 @@ bool HasOnlyXmlCharacters(const std::string& value)
 /** @return whether @p value, which is UTF-8, contains U+FFFE or U+FFFF. */
 bool HasNoncharacters(const std::string& value)
 {
-    return value.find("\xEF\xBF\xBE") != value.npos || value.find("\xEF\xBF\xBF") != value.npos;
+    return value.find("\xEF\xBF\xBE") != std::string::npos ||
+           value.find("\xEF\xBF\xBF") != std::string::npos;
 }
 
 } // namespace
