@@ -61,6 +61,18 @@ void CheckOrder(const Order& order, const xmlNode* parent, const std::string& se
     }
 }
 
+/** Checks the order on the levels of a key that leads to one element. */
+void CheckOrders(const ListedKey& listed, Findings& findings)
+{
+    for (const auto& [parent, level, segment, isNew] : listed.steps)
+    {
+        if (isNew && level != nullptr && !IsFreeOf("@", segment))
+        {
+            CheckOrder(level->OrderFor(segment), parent, segment, findings);
+        }
+    }
+}
+
 // A given key can contain anything: what is reported of it comes from the library's walk.
 
 Order OrderOf(const TrailLevel& level)
@@ -214,12 +226,19 @@ std::vector<Reach> CheckGivenKeys(const xmlDoc* document, const std::vector<std:
 void CheckListedKeys(const xmlNode* root, Levels& levels, Findings& findings)
 {
     KeyValues values(root, levels);
-    for (const std::string& key : ListKeys(root, levels))
-    {
-        CheckMatches(values.BearersUnder(key, 2), key, Kind::SeveralValues, findings);
-        for (const auto& [parent, segment] : values.NewComparisons())
-        {
-            CheckOrder(levels.Below(parent).OrderFor(segment), parent, segment, findings);
-        }
-    }
+    VisitKeys(root, levels,
+              [&](const ListedKey& listed)
+              {
+                  if (listed.onlyBearer != nullptr)
+                  {
+                      CheckOrders(listed, findings);
+                      return;
+                  }
+                  CheckMatches(values.BearersUnder(listed.key, 2), listed.key, Kind::SeveralValues,
+                               findings);
+                  for (const auto& [parent, segment] : values.NewComparisons())
+                  {
+                      CheckOrder(levels.Below(parent).OrderFor(segment), parent, segment, findings);
+                  }
+              });
 }

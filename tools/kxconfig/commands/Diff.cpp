@@ -24,11 +24,12 @@ public:
         const xmlNode* const root = RootOf(*reader);
         Levels levels(root->doc);
         KeyValues values(root, levels);
-        m_keys = ListKeys(root, levels);
-        for (const std::string& key : m_keys)
-        {
-            m_values[key] = JoinedValues(values.BearersUnder(key).first);
-        }
+        VisitKeys(root, levels,
+                  [&](const ListedKey& listed)
+                  {
+                      m_keys.push_back(listed.key);
+                      m_values[listed.key] = JoinedValues(values.BearersUnder(listed).first);
+                  });
     }
 
     const std::vector<std::string>& Keys() const { return m_keys; }

@@ -67,11 +67,11 @@ size_t NumberShown(const Bearers& bearers)
     return bearers.count == 1 ? 1 : shown;
 }
 
-KeyAndValue Describe(const std::string& key, KeyValues& values, bool all)
+KeyAndValue Describe(const ListedKey& listed, KeyValues& values, bool all)
 {
-    Bearers bearers = all ? values.BearersUnder(key) : values.BearersUnder(key, kMostValues);
+    Bearers bearers = all ? values.BearersUnder(listed) : values.BearersUnder(listed, kMostValues);
     bearers.first.resize(all ? bearers.count : NumberShown(bearers));
-    return {key, JoinedValues(bearers.first), bearers.count - bearers.first.size()};
+    return {listed.key, JoinedValues(bearers.first), bearers.count - bearers.first.size()};
 }
 
 /** @return whether @p key is @p prefix, or goes on with a segment or with the condition of its last
@@ -87,13 +87,6 @@ bool IsBelow(const std::string& prefix, const std::string& key)
     return next == '.' || (next == '@' && !hasCondition);
 }
 
-void KeepBelow(const std::string& prefix, std::vector<std::string>& keys)
-{
-    keys.erase(std::remove_if(keys.begin(), keys.end(),
-                              [&](const std::string& key) { return !IsBelow(prefix, key); }),
-               keys.end());
-}
-
 Failure NothingFound(const KeysArguments& arguments)
 {
     const std::string below = arguments.prefix.empty() ? "" : " below " + Quoted(arguments.prefix);
@@ -101,12 +94,14 @@ Failure NothingFound(const KeysArguments& arguments)
             "nothing found: " + arguments.file + " has no value that a key path can name" + below};
 }
 
-void AddNames(const std::vector<std::string>& keys, Report& report)
+void Add(const ListedKey& listed, KeyValues& values, const KeysArguments& arguments, Report& report)
 {
-    for (const std::string& key : keys)
+    if (arguments.namesOnly)
     {
-        report.Add(Name{key});
+        report.Add(Name{listed.key});
+        return;
     }
+    report.Add(Describe(listed, values, arguments.all));
 }
 
 } // namespace
@@ -116,21 +111,20 @@ ExitStatus Keys(const KeysArguments& arguments, Report& report)
     const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file, arguments.input);
     const xmlNode* const root = RootOf(*reader);
     Levels levels(root->doc);
-    std::vector<std::string> keys = ListKeys(root, levels);
-    KeepBelow(arguments.prefix, keys);
-    if (keys.empty())
+    KeyValues values(root, levels);
+    bool isFound = false;
+    VisitKeys(root, levels,
+              [&](const ListedKey& listed)
+              {
+                  if (IsBelow(arguments.prefix, listed.key))
+                  {
+                      isFound = true;
+                      Add(listed, values, arguments, report);
+                  }
+              });
+    if (!isFound)
     {
         throw NothingFound(arguments);
-    }
-    if (arguments.namesOnly)
-    {
-        AddNames(keys, report);
-        return ExitStatus::Done;
-    }
-    KeyValues values(root, levels);
-    for (const std::string& key : keys)
-    {
-        report.Add(Describe(key, values, arguments.all));
     }
     return ExitStatus::Done;
 }

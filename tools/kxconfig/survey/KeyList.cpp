@@ -2,62 +2,132 @@
 
 #include "file/Nodes.h"
 
+#include <array>
 #include <unordered_set>
 
 namespace
 {
 
-/** Lists the keys of the elements below one whose key is given, in document order, each once. */
+/** @return whether @p parent has few elements, and each of them its own name. */
+bool HasOnlyOwnNames(const xmlNode* parent)
+{
+    std::array<const xmlNode*, 8> elements{};
+    size_t count = 0;
+    for (const xmlNode* node = kx::ElementFrom(parent->children); node != nullptr;
+         node = kx::ElementFrom(node->next))
+    {
+        for (size_t i = 0; i != count; ++i)
+        {
+            if (xmlStrEqual(elements[i]->name, node->name) != 0)
+            {
+                return false;
+            }
+        }
+        if (count == elements.size())
+        {
+            return false;
+        }
+        elements[count++] = node;
+    }
+    return true;
+}
+
+/** Visits the keys of the elements below one, in document order, each once. */
 class KeyLister
 {
 public:
-    explicit KeyLister(Levels& levels) : m_levels(levels) {}
-
-    void ListBelow(const xmlNode* parent, const std::string& key)
+    KeyLister(const xmlNode* root, Levels& levels, const KeyVisitor& visit)
+        : m_levels(levels), m_visit(visit), m_key(Text(root->name))
     {
-        const Level& level = m_levels.Below(parent);
+    }
+
+    /** @param isOnly  whether the key so far leads to @p parent alone. */
+    void ListBelow(const xmlNode* parent, bool isOnly)
+    {
+        if (HasOnlyOwnNames(parent))
+        {
+            ListLevel(parent, nullptr, isOnly);
+        }
+        else if (isOnly)
+        {
+            const Level level = m_levels.Below(Elements{parent});
+            ListLevel(parent, &level, true);
+        }
+        else
+        {
+            ListLevel(parent, &m_levels.Below(parent), false);
+        }
+    }
+
+private:
+    void ListLevel(const xmlNode* parent, const Level* level, bool isOnly)
+    {
         for (const xmlNode* node = kx::ElementFrom(parent->children); node != nullptr;
              node = kx::ElementFrom(node->next))
         {
             if (IsFreeOf(".@", Text(node->name)))
             {
-                const std::string keyOfNode = key + "." + level.SegmentOf(node);
-                if (kx::OnlyTextChild(node) != nullptr)
-                {
-                    List(keyOfNode);
-                }
-                else
-                {
-                    ListBelow(node, keyOfNode);
-                }
+                const std::string segment =
+                    level == nullptr ? Text(node->name) : level->SegmentOf(node);
+                const bool isOnlyHere = level == nullptr || level->SelectsOnly(node, segment);
+                m_steps.push_back({parent, level, segment, true});
+                List(node, isOnly && isOnlyHere);
+                m_steps.pop_back();
             }
         }
     }
 
-    std::vector<std::string> Take() { return std::move(m_keys); }
-
-private:
-    void List(const std::string& key)
+    /** Lists what is at @p element and below it, which the last step leads to. */
+    void List(const xmlNode* element, bool isOnly)
     {
-        if (m_listed.insert(key).second)
+        const size_t length = m_key.size();
+        m_key += '.';
+        m_key += m_steps.back().segment;
+        if (kx::OnlyTextChild(element) == nullptr)
         {
-            m_keys.push_back(key);
+            ListBelow(element, isOnly);
+        }
+        // A key that leads to one element alone is that of no other.
+        else if (isOnly || m_listed.insert(m_key).second)
+        {
+            Visit(isOnly ? element : nullptr);
+        }
+        m_key.resize(length);
+    }
+
+    void Visit(const xmlNode* onlyBearer)
+    {
+        m_visit({m_key, onlyBearer, m_steps});
+        if (onlyBearer == nullptr)
+        {
+            return;
+        }
+        for (auto step = m_steps.rbegin(); step != m_steps.rend() && step->isNew; ++step)
+        {
+            step->isNew = false;
         }
     }
 
     Levels& m_levels;
-    std::vector<std::string> m_keys;
+    const KeyVisitor& m_visit;
+    std::string m_key;
+    std::vector<KeyStep> m_steps;
     std::unordered_set<std::string> m_listed;
 };
 
 } // namespace
 
-std::vector<std::string> ListKeys(const xmlNode* root, Levels& levels)
+void VisitKeys(const xmlNode* root, Levels& levels, const KeyVisitor& visit)
 {
-    KeyLister lister(levels);
     if (IsFreeOf(".", Text(root->name)))
     {
-        lister.ListBelow(root, Text(root->name));
+        KeyLister(root, levels, visit).ListBelow(root, true);
     }
-    return lister.Take();
+}
+
+std::vector<std::string> ListKeys(const xmlNode* root, Levels& levels)
+{
+    std::vector<std::string> keys;
+    VisitKeys(root, levels, [&](const ListedKey& listed) { keys.push_back(listed.key); });
+    return keys;
 }

@@ -3,11 +3,43 @@
 
 #include "survey/Levels.h"
 
+#include <functional>
 #include <string>
 #include <vector>
 
-/** @return the key path of each element with a value, in document order and each key once; with a
- * condition where others bear the same name and an attribute distinguishes them. */
+/** A step on the way to an element: the level that it is on, and its segment there. */
+struct KeyStep
+{
+    const xmlNode* parent;
+    const Level* level; ///< null where all names differ, so that no segment has a condition
+    std::string segment;
+    bool isNew; ///< no key with an only bearer had it before
+};
+
+/** A key path under which there is a value. */
+struct ListedKey
+{
+    const std::string& key;
+
+    /** The element, if the key leads to it and to nothing else; null if that is not plain:
+     * KeyValues finds out. */
+    const xmlNode* onlyBearer;
+
+    const std::vector<KeyStep>& steps; ///< from the root's children on; of an only bearer
+};
+
+using KeyVisitor = std::function<void(const ListedKey&)>;
+
+/**
+ * Visits the key path of each element with a value, in document order and each key once. It has a
+ * condition where others bear the same name and an attribute distinguishes them.
+ *
+ * @param levels  gets those levels below which a key can lead to several elements. The others are
+ *                not kept.
+ */
+void VisitKeys(const xmlNode* root, Levels& levels, const KeyVisitor& visit);
+
+/** @return the same keys. */
 std::vector<std::string> ListKeys(const xmlNode* root, Levels& levels);
 
 #endif

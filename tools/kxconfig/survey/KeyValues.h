@@ -1,6 +1,7 @@
 #ifndef KX_TOOLS_KEYVALUES_H
 #define KX_TOOLS_KEYVALUES_H
 
+#include "survey/KeyList.h"
 #include "survey/SelectedElements.h"
 
 #include <limits>
@@ -38,6 +39,13 @@ public:
      * @param most  the number of elements that are wanted.
      */
     Bearers BearersUnder(const std::string& key, size_t most = std::numeric_limits<size_t>::max());
+
+    /** @return the same of a key that is visited. */
+    Bearers BearersUnder(const ListedKey& listed, size_t most = std::numeric_limits<size_t>::max())
+    {
+        return listed.onlyBearer != nullptr ? Bearers{1, {listed.onlyBearer}}
+                                            : BearersUnder(listed.key, most);
+    }
 
     /** @return the levels that the last key led to and no key before it did with the same outcome,
      * of the segments with a condition, in the order in which a lookup comes to them. */

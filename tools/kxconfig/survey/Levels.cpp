@@ -36,26 +36,65 @@ struct NamedValue
     std::string value;
 };
 
+/** The names of attributes that were seen: nearly always few. */
+class SeenNames
+{
+public:
+    /** @return whether @p name was not seen before. */
+    bool Add(std::string_view name)
+    {
+        if (m_many.empty() && m_few.size() < kMostFew)
+        {
+            const bool isNew = std::find(m_few.begin(), m_few.end(), name) == m_few.end();
+            if (isNew)
+            {
+                m_few.push_back(name);
+            }
+            return isNew;
+        }
+        m_many.insert(m_few.begin(), m_few.end());
+        m_few.clear();
+        return m_many.insert(name).second;
+    }
+
+private:
+    static const size_t kMostFew = 8;
+
+    std::vector<std::string_view> m_few;
+    std::unordered_set<std::string_view> m_many;
+};
+
+/** @return the value of @p attribute; nearly always it is one text. */
+std::string ValueOf(const xmlAttr* attribute)
+{
+    const xmlNode* const text = kx::OnlyText(attribute->children);
+    return text == nullptr ? ContentOf(reinterpret_cast<const xmlNode*>(attribute))
+                           : std::string(kx::ContentOf(text));
+}
+
 /** @return the attributes that a condition finds in @p element: the first of each name, without its
  * prefix, and the defaults of the others. */
 std::vector<NamedValue> NamedValuesOf(const xmlNode* element,
                                       const std::map<std::string, Names>& defaulted)
 {
     std::vector<NamedValue> attributes;
-    std::unordered_set<std::string> names;
+    SeenNames names;
     for (const xmlAttr* attribute = element->properties; attribute != nullptr;
          attribute = attribute->next)
     {
-        if (names.insert(Text(attribute->name)).second)
+        if (names.Add(kx::FromEngine(attribute->name)))
         {
-            const auto node = reinterpret_cast<const xmlNode*>(attribute);
-            attributes.push_back({Text(attribute->name), ContentOf(node)});
+            attributes.push_back({Text(attribute->name), ValueOf(attribute)});
         }
+    }
+    if (defaulted.empty())
+    {
+        return attributes;
     }
     const auto more = defaulted.find(Text(element->name));
     for (const std::string& name : more == defaulted.end() ? Names() : more->second)
     {
-        if (names.insert(name).second && HasAttribute(element, name))
+        if (HasAttribute(element, name) && names.Add(name))
         {
             attributes.push_back({name, AttributeOf(element, name)});
         }
@@ -102,42 +141,43 @@ Level::Level(const Elements& parents, const std::map<std::string, Names>& defaul
 void Level::AddChildrenOf(const xmlNode* parent)
 {
     const xmlNode* before = nullptr;
+    Namesakes* namesakes = nullptr; // of the one before
     for (const xmlNode* node = kx::ElementFrom(parent->children); node != nullptr;
          node = kx::ElementFrom(node->next))
     {
-        Add(node, before != nullptr && !xmlStrEqual(before->name, node->name));
+        const bool isSameName = before != nullptr && xmlStrEqual(before->name, node->name) != 0;
+        if (!isSameName)
+        {
+            namesakes = &m_byName[kx::FromEngine(node->name)];
+        }
+        Add(node, before != nullptr && !isSameName, *namesakes);
         before = node;
     }
 }
 
-void Level::Add(const xmlNode* element, bool suspended)
+void Level::Add(const xmlNode* element, bool suspended, Namesakes& namesakes)
 {
     const Sibling sibling = {m_elements.size(), element, suspended};
     m_elements.push_back(element);
-    Namesakes& namesakes = m_byName[Text(element->name)];
     namesakes.all.push_back(sibling);
     if (suspended)
     {
         namesakes.suspended.push_back(sibling);
         m_otherThanFirst = m_otherThanFirst == nullptr ? element : m_otherThanFirst;
     }
-    for (const std::string& condition : ConditionsOf(element))
-    {
-        namesakes.fulfilling[condition].push_back(sibling);
-    }
 }
 
 std::string Level::SegmentOf(const xmlNode* element) const
 {
     const std::string name = Text(element->name);
-    const Namesakes& namesakes = m_byName.at(name);
+    const Namesakes& namesakes = NamesakesOf(name);
     if (namesakes.all.size() == 1)
     {
         return name;
     }
     for (const std::string& condition : ConditionsOf(element))
     {
-        if (namesakes.fulfilling.at(condition).size() == 1)
+        if (Fulfilling(namesakes, condition).size() == 1)
         {
             return name + condition;
         }
@@ -145,7 +185,20 @@ std::string Level::SegmentOf(const xmlNode* element) const
     return name;
 }
 
-const Level::Namesakes& Level::NamesakesOf(const std::string& name) const
+bool Level::SelectsOnly(const xmlNode* element, const std::string& segment) const
+{
+    const std::string_view name = kx::FromEngine(element->name);
+    const Namesakes& namesakes = NamesakesOf(name);
+    if (segment.size() == name.size())
+    {
+        return namesakes.all.size() == 1;
+    }
+    // No other element fulfills the condition.
+    const Siblings& suspended = namesakes.suspended;
+    return suspended.empty() || (suspended.size() == 1 && suspended[0].element == element);
+}
+
+const Level::Namesakes& Level::NamesakesOf(std::string_view name) const
 {
     static const Namesakes kNone;
     const auto found = m_byName.find(name);
@@ -164,11 +217,32 @@ const Siblings& Level::Suspended(const std::string& name) const
 
 const Siblings& Level::Fulfilling(const std::string& segment) const
 {
+    const kx::TextView name = kx::Segment(kx::TextView(segment)).name;
+    return Fulfilling(NamesakesOf({name.data, name.size}), segment.substr(name.size));
+}
+
+const Siblings& Level::Fulfilling(const Namesakes& namesakes, const std::string& condition) const
+{
     static const Siblings kNone;
-    const kx::Segment split((kx::TextView(segment)));
-    const auto& fulfilling = NamesakesOf(Text(split.name)).fulfilling;
-    const auto found = fulfilling.find(segment.substr(split.name.size));
-    return found == fulfilling.end() ? kNone : found->second;
+    if (!namesakes.fulfilling)
+    {
+        namesakes.fulfilling = SortByCondition(namesakes.all);
+    }
+    const auto found = namesakes.fulfilling->find(condition);
+    return found == namesakes.fulfilling->end() ? kNone : found->second;
+}
+
+Level::ByCondition Level::SortByCondition(const Siblings& siblings) const
+{
+    ByCondition byCondition;
+    for (const Sibling& sibling : siblings)
+    {
+        for (const std::string& condition : ConditionsOf(sibling.element))
+        {
+            byCondition[condition].push_back(sibling);
+        }
+    }
+    return byCondition;
 }
 
 Order Level::OrderFor(const std::string& segment) const

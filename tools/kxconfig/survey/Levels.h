@@ -4,7 +4,9 @@
 #include <libxml/tree.h>
 
 #include <map>
+#include <optional>
 #include <string>
+#include <string_view>
 #include <unordered_map>
 #include <vector>
 
@@ -46,6 +48,9 @@ public:
      */
     std::string SegmentOf(const xmlNode* element) const;
 
+    /** @return whether a lookup takes only @p element for its own segment on this level. */
+    bool SelectsOnly(const xmlNode* element, const std::string& segment) const;
+
     const Siblings& Named(const std::string& name) const;
 
     /** @return those of the name that no condition rejects. */
@@ -60,16 +65,20 @@ public:
     Order OrderFor(const std::string& segment) const;
 
 private:
+    using ByCondition = std::unordered_map<std::string, Siblings>; ///< "@name=value"
+
     struct Namesakes
     {
         Siblings all;
         Siblings suspended;
-        std::map<std::string, Siblings> fulfilling; ///< by condition, "@name=value"
+        mutable std::optional<ByCondition> fulfilling; ///< sorted when a condition is asked for
     };
 
-    const Namesakes& NamesakesOf(const std::string& name) const;
+    const Namesakes& NamesakesOf(std::string_view name) const;
+    const Siblings& Fulfilling(const Namesakes& namesakes, const std::string& condition) const;
+    ByCondition SortByCondition(const Siblings& siblings) const;
     void AddChildrenOf(const xmlNode* parent);
-    void Add(const xmlNode* element, bool suspended);
+    void Add(const xmlNode* element, bool suspended, Namesakes& namesakes);
     std::vector<std::string> ConditionsOf(const xmlNode* element) const;
     const xmlNode* FirstNotNamed(const std::string& name) const;
     const xmlNode* SuspenderOf(const Sibling& suspended, const Siblings& namesakes) const;
@@ -77,7 +86,7 @@ private:
     const std::map<std::string, std::vector<std::string>>& m_defaulted;
     Elements m_elements;
     const xmlNode* m_otherThanFirst = nullptr; ///< the first with another name than the first has
-    std::map<std::string, Namesakes> m_byName;
+    std::unordered_map<std::string_view, Namesakes> m_byName;
 };
 
 /** The levels of a document, each sorted when it is first asked for. */
