@@ -26,8 +26,13 @@ XMLLINT = "xmllint --xpath"
 XMLSTARLET_EL = "xmlstarlet el -v"
 XMLSTARLET_ED = "xmlstarlet ed"
 
-# A file, a key and an expression for the same element in its middle, the next one's key, and an expression for many.
-Workload = namedtuple("Workload", "path key element many")
+# A file, the key of an element in its middle, and an expression for many. An update by that key would reach most of the
+# file, so that another element is updated.
+Workload = namedtuple("Workload", "path key many")
+
+LAST = "  <last>\n    <title>old</title>\n  </last>\n</cfg>\n"
+LAST_KEY = "cfg.last.title"
+LAST_ELEMENT = "/cfg/last/title"
 
 
 def write_large(path):
@@ -39,7 +44,7 @@ def write_large(path):
                 file.write(f'    <item id="{item}">\n      <name>item {section * 20 + item}</name>\n'
                            '      <on/>\n    </item>\n')
             file.write("  </section>\n")
-        file.write("</cfg>\n")
+        file.write(LAST)
 
 
 def write_siblings(path):
@@ -47,13 +52,12 @@ def write_siblings(path):
         file.write('<?xml version="1.0" encoding="UTF-8"?>\n<cfg>\n')
         for item in range(100000):
             file.write(f'  <item id="{item}"><v>value {item}</v></item>\n')
-        file.write("</cfg>\n")
+        file.write(LAST)
 
 
 def workloads(folder):
-    large = Workload(folder / "large.xml", "cfg.section@name=section-15000.item@id=7.name",
-                     "/cfg/section[@name='section-15000']/item[@id=7]/name", "//name")
-    siblings = Workload(folder / "siblings.xml", "cfg.item@id=50000.v", "/cfg/item[@id=50000]/v", "//v")
+    large = Workload(folder / "large.xml", "cfg.section@name=section-15000.item@id=7.name", "//name")
+    siblings = Workload(folder / "siblings.xml", "cfg.item@id=50000.v", "//v")
     write_large(large.path)
     write_siblings(siblings.path)
     return {LARGE: large, SIBLINGS: siblings}
@@ -69,8 +73,8 @@ def commands(work, kxconfig, load):
         XMLLINT: ["xmllint", "--xpath", work.many, path],
         "keys": [kxconfig, "keys", path],
         XMLSTARLET_EL: ["xmlstarlet", "el", "-v", path],
-        "set --output": [kxconfig, "set", "--output", output, path, work.key, "new"],
-        XMLSTARLET_ED: ["xmlstarlet", "ed", "-u", work.element, "-v", "new", path],
+        "set --output": [kxconfig, "set", "--output", output, path, LAST_KEY, "new"],
+        XMLSTARLET_ED: ["xmlstarlet", "ed", "-u", LAST_ELEMENT, "-v", "new", path],
         "check": [kxconfig, "check", path],
     }
 
@@ -175,7 +179,7 @@ the load of the file. Ratios are the medians of {rounds} rounds, with the range 
 {targets}
 
 - "{bare}" is a program that loads the file with the library, calls `GetValue()` and ends.
-- `get`, `explain` and `set` use one key with conditions, in the middle of the file.
+- `get` and `explain` use a key with conditions, in the middle of the file. `set` and `xmlstarlet ed` change one element.
 - `find` and `xmllint` print all elements of one name.
 - `xmlstarlet el -v` builds no tree and prints no values.
 - `set` verifies that what it saves loads again.

@@ -130,6 +130,13 @@ TEST_F(KxconfigCompletion, OffersFilesAfterAnEqualsSign)
     EXPECT_EQ(std::set<std::string>{"error,trace"}, Completions("kxconfig --log-mask error,t"));
 }
 
+TEST_F(KxconfigCompletion, OffersKinds)
+{
+    const std::set<std::string> kinds = {"several-values", "suspended-condition"};
+    EXPECT_EQ(kinds, Completions("kxconfig check --only s"));
+    EXPECT_EQ(kinds, Completions("kxconfig check --ignore=s"));
+}
+
 TEST_F(KxconfigCompletion, QuotesKeys)
 {
     const std::string file =

@@ -92,7 +92,7 @@ TEST_F(KxconfigGet, RefusesBadUsage)
                     "The following argument was not expected: --frobnicate" + kUsage);
     ExpectComplaint(Tool({"get"}), 2, "FILE is required" + kUsage);
     ExpectComplaint(Tool({"get", kGateway}), 2, "KEY is required" + kUsage);
-    ExpectComplaint(Tool({"check", "-"}), 2, "FILE: \"-\" is not a file name" + kUsage);
+    ExpectComplaint(Tool({"remove", "-", "/a/b"}), 2, "FILE: \"-\" is not a file name" + kUsage);
     EXPECT_EQ(2, Tool({"get", kGateway, "a.b", "c"}).status);
 }
 

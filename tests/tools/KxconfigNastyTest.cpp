@@ -162,9 +162,10 @@ TEST_F(KxconfigNasty, ValuesThatAreNoXml)
     {
         const Outcome outcome = Tool({"set", file, "cfg.a", value});
         EXPECT_EQ(2, outcome.status);
-        EXPECT_EQ("kxconfig: VALUE is not XML text: it contains control characters, or bytes that "
-                  "are not UTF-8\n",
-                  outcome.err);
+        EXPECT_EQ(
+            "kxconfig: the new text is not XML text: it contains control characters, or bytes that "
+            "are not UTF-8\n",
+            outcome.err);
         EXPECT_EQ(xml, ReadFile(file));
     }
     EXPECT_EQ(0, Tool({"set", file, "cfg.a", "caf\xC3\xA9\t\n\r"}).status);

@@ -111,7 +111,7 @@ TEST_F(KxconfigNodes, SetRefusesWhatItWouldDestroy)
     ExpectRefused({"set", "--node", m_file, "count(//ip)", "x"}, 2,
                   "\"count(//ip)\" selects no nodes: it is a value");
     ExpectRefused({"set", "--node", m_file, "//name", "a&b"}, 2,
-                  "VALUE is not XML text: write & as &amp;");
+                  "the new text is not XML text: write & as &amp;");
     EXPECT_EQ(2, Tool({"set", "--node", m_file, "//name[", "x"}).status);
     EXPECT_EQ(2, Tool({"set", "--all", m_file, "cfg.name", "x"}).status);
     EXPECT_EQ(2, Tool({"set", "--node", "--create", m_file, "//name", "x"}).status);
@@ -171,7 +171,7 @@ TEST_F(KxconfigNodes, AddRefusesWhatCannotBeSaved)
     ExpectRefused({"add", m_file, "//@id[.=1]", "a"}, 2,
                   "\"//@id[.=1]\" selects an attribute; add needs an element");
     ExpectRefused({"add", m_file, "/cfg", "a", "x&y"}, 2,
-                  "VALUE is not XML text: write & as &amp;");
+                  "the new text is not XML text: write & as &amp;");
     EXPECT_EQ(2, Tool({"add", m_file, "/cfg", "a", "&nowhere;"}).status);
     EXPECT_EQ(2, Tool({"add", "--after", "--attribute", m_file, "/cfg/name", "a"}).status);
     EXPECT_EQ(2, Tool({"add", "-", "/cfg", "a"}).status);

@@ -71,7 +71,7 @@ TEST_F(KxconfigSetPairs, SavesNothingUnlessAllPairsApply)
                   "nothing found: no element of " + m_file +
                       " has text that can be replaced under \"cfg.missing\"");
     ExpectRefused({"set", m_file, "cfg.name", "crate", "cfg.net.ip", "a&b"}, 2,
-                  "VALUE is not XML text: write & as &amp;");
+                  "the new text is not XML text: write & as &amp;");
     ExpectRefused(
         {"set", m_file, "cfg.name", "crate", "cfg", "x"}, 2,
         "malformed key \"cfg\": a key names the root element and at least one more, as in "

@@ -206,7 +206,7 @@ TEST_F(KxconfigSet, RefusesToSaveWhatWouldNotLoadAgain)
 TEST_F(KxconfigSet, RefusesAReferenceToAnEntityThatTheFileDoesNotDeclare)
 {
     ExpectRefused({"set", m_file, "cfg.name", "a&nowhere;"}, 2,
-                  "VALUE is not XML text: the file declares no entity \"nowhere\"");
+                  "the new text is not XML text: the file declares no entity \"nowhere\"");
     const std::string file =
         m_folder.Write("entity.xml", "<!DOCTYPE cfg [<!ENTITY e \"x\">]>\n<cfg><a>1</a></cfg>\n");
     EXPECT_EQ(0, Tool({"set", file, "cfg.a", "&e;&lt;"}).status);
@@ -220,7 +220,7 @@ TEST_F(KxconfigSet, RefusesNoncharacters)
     for (const std::string character : {"\xEF\xBF\xBE", "\xEF\xBF\xBF"})
     {
         ExpectRefused({"set", m_file, "cfg.name", "a" + character}, 2,
-                      "VALUE is not XML text: it contains U+FFFE or U+FFFF, which are not "
+                      "the new text is not XML text: it contains U+FFFE or U+FFFF, which are not "
                       "characters");
     }
     EXPECT_EQ(0, Tool({"set", m_file, "cfg.name", "\xEF\xBF\xBD"}).status);
@@ -257,7 +257,7 @@ TEST_F(KxconfigSet, RefusesAValueThatIsNoXmlText)
          {"x&y", "x&y=2", "&", "a & b", "a & b;", "&;", "&#;", "&#x;", "&#1a;", "&#xg;", "&amp;&"})
     {
         ExpectRefused({"set", m_file, "cfg.name", value}, 2,
-                      "VALUE is not XML text: write & as &amp;");
+                      "the new text is not XML text: write & as &amp;");
     }
 }
 
@@ -269,8 +269,9 @@ TEST_F(KxconfigSet, RefusesAReferenceToACharacterThatXmlDoesNotHave)
           "&#xDFFF;", "&#xFFFE;", "&#65535;", "&#x110000;", "&#4294967361;",
           "&#x10000000000000041;"})
     {
-        ExpectRefused({"set", m_file, "cfg.name", value}, 2,
-                      "VALUE is not XML text: it refers to a character that XML does not allow");
+        ExpectRefused(
+            {"set", m_file, "cfg.name", value}, 2,
+            "the new text is not XML text: it refers to a character that XML does not allow");
     }
 }
 
@@ -286,7 +287,7 @@ TEST_F(KxconfigSet, TakesReferencesToTheFirstAndTheLastCharacterOfEachRange)
 TEST_F(KxconfigSet, RefusesAValueThatIsNoXmlTextWhateverTheKeySelects)
 {
     ExpectRefused({"set", m_file, "cfg.missing", "x&y"}, 2,
-                  "VALUE is not XML text: write & as &amp;");
+                  "the new text is not XML text: write & as &amp;");
 }
 
 TEST_F(KxconfigSet, TakesReferencesToCharactersAndEntities)

@@ -119,7 +119,29 @@ TEST_F(KxconfigUsage, OnlyCommandsThatReadTakeStandardInput)
 {
     const std::string message = "FILE: \"-\" is not a file name (kxconfig --help shows the usage)";
     ExpectComplaint(Tool({"set", "-", "a.b", "c"}), 2, message);
-    ExpectComplaint(Tool({"check", "-"}), 2, message);
+    ExpectComplaint(Tool({"add", "-", "/a", "b"}), 2, message);
+    ExpectComplaint(Tool({"remove", "-", "/a/b"}), 2, message);
+    const std::string xml = "<a><b>1</b><b><![CDATA[2]]></b></a>";
+    for (const std::vector<std::string>& command : {std::vector<std::string>{"get", "-", "a.b"},
+                                                    {"keys", "-"},
+                                                    {"explain", "-", "a.b"},
+                                                    {"find", "-", "//b"},
+                                                    {"check", "--notes", "-"},
+                                                    {"check", "-", "a.b"}})
+    {
+        std::vector<std::string> named = command;
+        *std::find(named.begin(), named.end(), "-") = m_folder.Write("in.xml", xml);
+        const Outcome expected = Tool(named);
+        const Outcome outcome = ToolWithInput(command, xml);
+        EXPECT_EQ(expected.status, outcome.status) << command[0];
+        EXPECT_THAT(outcome.out, testing::Not(testing::IsEmpty())) << command[0];
+    }
+}
+
+TEST_F(KxconfigUsage, CheckOfStandardInputReportsWhatIsInIt)
+{
+    const std::string xml = "<a>\n<b><![CDATA[2]]></b></a>";
+    EXPECT_THAT(ToolWithInput({"check", "-"}, xml).out, testing::StartsWith("-:2: warning: "));
 }
 
 TEST_F(KxconfigUsage, ColorsAreChosen)
@@ -196,11 +218,49 @@ TEST_F(KxconfigUsage, BadArgumentsAreAnsweredWithWhatToType)
             see);
 }
 
+TEST_F(KxconfigUsage, EachCommandDescribesASurplusArgument)
+{
+    const std::map<std::string, std::vector<std::string>> whole = {
+        {"get", {}}, // takes any number
+        {"set", {}},
+        {"check", {}},
+        {"add", {"/cfg", "a", "b"}},
+        {"remove", {"/cfg/net"}},
+        {"explain", {"--set", "cfg.net.ip", "v"}},
+        {"keys", {"cfg"}},
+        {"find", {"/cfg"}},
+        {"diff", {m_plain}}};
+    for (const std::string& verb : m_verbs)
+    {
+        std::vector<std::string> words = {verb, m_plain};
+        words.insert(words.end(), whole.at(verb).begin(), whole.at(verb).end());
+        if (!whole.at(verb).empty())
+        {
+            std::vector<std::string> more = words;
+            more.emplace_back("surplus");
+            EXPECT_THAT(Tool(more).err, HasSubstr("surplus argument \"surplus\"; usage: kxconfig " +
+                                                  verb + " [options] FILE "));
+        }
+        words.emplace_back("--unknown");
+        const Outcome outcome = Tool(words);
+        EXPECT_EQ(2, outcome.status) << verb;
+        EXPECT_THAT(outcome.err, AnyOf(HasSubstr("unknown option \"--unknown\"; kxconfig " + verb +
+                                                 " --help lists the options"),
+                                       HasSubstr(" -- --unknown (kxconfig --help")));
+    }
+}
+
 TEST_F(KxconfigUsage, ExplainIgnoresTheValueOfAnUpdate)
 {
     const Outcome without = Tool({"explain", "--set", m_plain, "cfg.net.ip"});
     EXPECT_EQ(0, without.status);
-    EXPECT_EQ(without.out, Tool({"explain", "--set", m_plain, "cfg.net.ip", "a&"}).out);
+    EXPECT_EQ("", without.err);
+    const Outcome with = Tool({"explain", "--set", m_plain, "cfg.net.ip", "a&"});
+    EXPECT_EQ(0, with.status);
+    EXPECT_EQ(without.out, with.out);
+    EXPECT_EQ("kxconfig: note: \"a&\" is ignored: an update reaches the same elements with any "
+              "value\n",
+              with.err);
     ExpectComplaint(Tool({"explain", m_plain, "cfg.net.ip", "x"}), 2,
                     "VALUE requires --set (kxconfig --help shows the usage)");
 }

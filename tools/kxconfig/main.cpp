@@ -1,4 +1,5 @@
 #include "cli/Run.h"
+#include "file/Load.h"
 
 #include <algorithm>
 #include <iostream>
@@ -6,5 +7,7 @@
 int main(int argc, char** argv)
 {
     const std::vector<std::string> arguments(argv + std::min(argc, 1), argv + argc);
+    KeepLoaded();
+    std::ios::sync_with_stdio(false); // the streams get buffers of their own
     return Run(arguments, std::cin, std::cout, std::cerr);
 }

@@ -73,6 +73,20 @@ void CheckOrders(const ListedKey& listed, Findings& findings)
     }
 }
 
+void CheckListedKey(const ListedKey& listed, KeyValues& values, Levels& levels, Findings& findings)
+{
+    if (listed.onlyBearer != nullptr)
+    {
+        CheckOrders(listed, findings);
+        return;
+    }
+    CheckMatches(values.BearersUnder(listed.key, 2), listed.key, Kind::SeveralValues, findings);
+    for (const auto& [parent, segment] : values.NewComparisons())
+    {
+        CheckOrder(levels.Below(parent).OrderFor(segment), parent, segment, findings);
+    }
+}
+
 // A given key can contain anything: what is reported of it comes from the library's walk.
 
 Order OrderOf(const TrailLevel& level)
@@ -229,16 +243,7 @@ void CheckListedKeys(const xmlNode* root, Levels& levels, Findings& findings)
     VisitKeys(root, levels,
               [&](const ListedKey& listed)
               {
-                  if (listed.onlyBearer != nullptr)
-                  {
-                      CheckOrders(listed, findings);
-                      return;
-                  }
-                  CheckMatches(values.BearersUnder(listed.key, 2), listed.key, Kind::SeveralValues,
-                               findings);
-                  for (const auto& [parent, segment] : values.NewComparisons())
-                  {
-                      CheckOrder(levels.Below(parent).OrderFor(segment), parent, segment, findings);
-                  }
+                  CheckListedKey(listed, values, levels, findings);
+                  return true;
               });
 }

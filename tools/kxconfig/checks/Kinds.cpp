@@ -63,6 +63,16 @@ std::optional<Kind> KindNamed(const std::string& text)
     return found == std::end(kKinds) ? std::nullopt : std::optional(found->kind);
 }
 
+std::vector<std::string> KindWords()
+{
+    std::vector<std::string> words;
+    for (const KindMeaning& meaning : kKinds)
+    {
+        words.push_back(WordOf(meaning.kind));
+    }
+    return words;
+}
+
 std::string KindList()
 {
     std::ostringstream list;

@@ -4,6 +4,7 @@
 #include <optional>
 #include <set>
 #include <string>
+#include <vector>
 
 /** What `check` reports. */
 enum class Kind
@@ -47,6 +48,9 @@ std::string WordOf(Kind kind);
 
 /** @return the kind of the name or word @p text, if there is one. */
 std::optional<Kind> KindNamed(const std::string& text);
+
+/** @return the words of all kinds. */
+std::vector<std::string> KindWords();
 
 /** @return a line for each kind. */
 std::string KindList();

@@ -169,6 +169,20 @@ std::string SurplusError(const CLI::App& command, const std::string& surplus,
            " [options]" + Arguments(command) + "; an argument with spaces needs quotes";
 }
 
+/** @return the names of all commands, as "get, set or find". */
+std::string CommandNames(const CLI::App& app)
+{
+    const std::vector<const CLI::App*> commands = app.get_subcommands(nullptr);
+    std::string names;
+    for (const CLI::App* const command : commands)
+    {
+        const bool isFirst = command == commands.front();
+        const bool isLast = command == commands.back();
+        names += (isFirst ? "" : isLast ? " or " : ", ") + command->get_name();
+    }
+    return names;
+}
+
 bool IsError(const CLI::ParseError& error, CLI::ExitCodes code)
 {
     return error.get_exit_code() == static_cast<int>(code);
@@ -255,8 +269,7 @@ bool CommandLine::Parse(const std::vector<std::string>& arguments, Report& repor
     }
     if (!m_parser->request.command)
     {
-        throw BadUsage(
-            "a command is required: get, set, add, remove, explain, check, keys, find or diff");
+        throw BadUsage("a command is required: " + CommandNames(app));
     }
     report.ChooseColors(ColorChoiceOf(m_parser->request.color));
     report.SetSubject(app.get_subcommands().front()->get_name(), m_parser->request.file);

@@ -1,7 +1,8 @@
 #include "cli/Completion.h"
 
+#include "commands/Check.h"
 #include "file/Engine.h"
-#include "file/Load.h"
+#include "file/KeyTree.h"
 #include "output/Failure.h"
 #include "survey/KeyList.h"
 
@@ -11,7 +12,9 @@
 #include <cstdlib>
 #include <filesystem>
 
+#include <signal.h>
 #include <sys/time.h>
+#include <unistd.h>
 
 namespace
 {
@@ -19,23 +22,54 @@ namespace
 /** More keys than a person reads, or a shell quotes in an instant. */
 const size_t kMostKeys = 500;
 
-const suseconds_t kLongestMicroseconds = 800000; // the rest of a second is the shell's
+/** Then no more keys are listed; a load that takes longer ends the process soon after. */
+const suseconds_t kMostMicroseconds = 700000;
+const suseconds_t kMicrosecondsMore = 200000; // the rest of a second is the shell's
 
-/** Ends the process, with what it offers, if the object lives too long. */
+volatile sig_atomic_t g_isLate = 0;
+
+void NoteLateness(int)
+{
+    if (g_isLate != 0)
+    {
+        _exit(0);
+    }
+    g_isLate = 1;
+}
+
+/** Limits the time that keys are listed, or the process takes, while the object lives. */
 class TimeLimit
 {
 public:
-    TimeLimit() { Start(kLongestMicroseconds); }
-    ~TimeLimit() { Start(0); }
+    TimeLimit()
+    {
+        g_isLate = 0;
+        struct sigaction note = {};
+        note.sa_handler = NoteLateness;
+        note.sa_flags = SA_RESTART;
+        sigaction(SIGALRM, &note, &m_former);
+        Start(kMostMicroseconds, kMicrosecondsMore);
+    }
+
+    ~TimeLimit()
+    {
+        Start(0, 0);
+        sigaction(SIGALRM, &m_former, nullptr);
+    }
+
     TimeLimit(const TimeLimit&) = delete;
     TimeLimit& operator=(const TimeLimit&) = delete;
 
+    static bool IsOver() { return g_isLate != 0; }
+
 private:
-    static void Start(suseconds_t microseconds)
+    static void Start(suseconds_t first, suseconds_t more)
     {
-        const itimerval timer = {{0, 0}, {0, microseconds}};
+        const itimerval timer = {{0, more}, {0, first}};
         setitimer(ITIMER_REAL, &timer, nullptr);
     }
+
+    struct sigaction m_former = {};
 };
 
 bool StartsWith(const std::string& text, const std::string& start)
@@ -81,6 +115,23 @@ std::string InHome(const std::string& file)
     return StartsWith(file, "~/") && home != nullptr ? home + file.substr(1) : file;
 }
 
+/** @return the keys that start with @p start, as far as they are found in time. */
+std::vector<std::string> KeysIn(xmlDoc* document, const std::string& start)
+{
+    std::vector<std::string> keys;
+    Levels levels(document);
+    VisitKeys(xmlDocGetRootElement(document), levels,
+              [&](const ListedKey& listed)
+              {
+                  if (StartsWith(listed.key, start) && !HasControlCharacters(listed.key))
+                  {
+                      keys.push_back(listed.key);
+                  }
+                  return !TimeLimit::IsOver();
+              });
+    return keys;
+}
+
 /** @return the keys of the file that start with @p start. */
 std::vector<std::string> KeysOf(const std::string& file, const std::string& start)
 {
@@ -92,14 +143,8 @@ std::vector<std::string> KeysOf(const std::string& file, const std::string& star
     }
     const TimeLimit limit;
     const EngineSettings engine;
-    const std::unique_ptr<CXMLReader> reader = LoadFile(file);
-    const xmlNode* const root = RootOf(*reader);
-    Levels levels(root->doc);
-    std::vector<std::string> keys = ListKeys(root, levels);
-    keys.erase(std::remove_if(keys.begin(), keys.end(),
-                              [&](const std::string& key)
-                              { return !StartsWith(key, start) || HasControlCharacters(key); }),
-               keys.end());
+    const KeyTree document = LoadKeyTree(file);
+    std::vector<std::string> keys = KeysIn(document.get(), start);
     Shorten(keys);
     return keys;
 }
@@ -110,6 +155,10 @@ std::vector<std::string> WordsOfType(const std::string& type)
     if (type == "WHEN")
     {
         return {"auto", "always", "never"};
+    }
+    if (type == "KIND")
+    {
+        return KindWords();
     }
     return type == "MASK" ? std::vector<std::string>{"warning", "error", "trace", "value",
                                                      "xpath",   "all",   "none"}

@@ -201,7 +201,9 @@ void AddExplain(CLI::App& app, Request& request)
     AddKey(*explain, request.explain.key);
     CLI::Option* const update = explain->add_flag(
         "--set", request.explain.isUpdate, "explain what an update would reach; changes nothing");
-    explain->add_option("VALUE", request.ignoredValue, "with --set: ignored, as in a call of set")
+    explain
+        ->add_option("VALUE", request.explain.value,
+                     "with --set: ignored, since an update reaches the same with any")
         ->needs(update);
 }
 
@@ -235,8 +237,8 @@ void AddKinds(CLI::App& command, const char* name, std::set<Kind>& kinds, const 
 void AddCheck(CLI::App& app, Request& request)
 {
     Selection& selection = request.check.selection;
-    CLI::App* const check = AddFileCommand(app, "check", "report pitfalls for lookups and updates",
-                                           Check, request.check, request);
+    CLI::App* const check = AddReader(app, "check", "report pitfalls for lookups and updates",
+                                      Check, request.check, request);
     check->add_option("KEY", request.check.keys, "key paths to check instead of the whole file");
     check->add_flag("--notes", selection.notes, "also print notes, which are not warnings");
     AddKinds(*check, "--only", selection.only, "print this kind only, be it a warning or a note");

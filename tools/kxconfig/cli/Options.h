@@ -32,7 +32,6 @@ struct Request
     FindArguments find;
     DiffArguments diff;
     std::istream* input = nullptr; ///< standard input
-    std::string ignoredValue;      ///< of explain --set: an update reaches the same with any
     std::string logMask;
     bool trace = false;
     std::string color = "auto";

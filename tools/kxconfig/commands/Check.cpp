@@ -62,15 +62,16 @@ void CheckKeys(CXMLReader& reader, const CheckArguments& arguments, Findings& fi
     }
 }
 
-void CheckFile(CXMLReader& reader, const std::string& file, Findings& findings)
+void CheckFile(CXMLReader& reader, const CheckArguments& arguments, Findings& findings)
 {
     const xmlNode* const root = RootOf(reader);
     Levels levels(root->doc);
     CheckListedKeys(root, levels, findings);
     CheckElements(root, levels, findings);
-    if (findings.Want(Kind::ChangedBySaving))
+    const bool isStream = arguments.file == "-"; // its bytes are gone
+    if (findings.Want(Kind::ChangedBySaving) && !isStream)
     {
-        CheckSaving(reader, file, findings);
+        CheckSaving(reader, arguments.file, findings);
     }
 }
 
@@ -90,7 +91,7 @@ bool AddFindings(const Findings& findings, const std::string& file, Report& repo
 
 ExitStatus Check(const CheckArguments& arguments, Report& report)
 {
-    const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file);
+    const LoadedReader reader = LoadFile(arguments.file, arguments.input);
     for (const std::string& key : arguments.keys)
     {
         RequireWellFormedKey(key);
@@ -98,7 +99,7 @@ ExitStatus Check(const CheckArguments& arguments, Report& report)
     Findings findings(arguments.selection);
     if (arguments.keys.empty())
     {
-        CheckFile(*reader, arguments.file, findings);
+        CheckFile(*reader, arguments, findings);
     }
     else
     {

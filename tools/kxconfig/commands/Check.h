@@ -4,6 +4,7 @@
 #include "checks/Kinds.h"
 #include "output/ExitStatus.h"
 
+#include <iosfwd>
 #include <string>
 #include <vector>
 
@@ -12,6 +13,7 @@ class Report;
 struct CheckArguments
 {
     std::string file;
+    std::istream* input = nullptr; ///< what the file "-" stands for
     std::vector<std::string> keys; ///< if empty, the whole file is checked
     Selection selection;
 };

@@ -1,6 +1,6 @@
 #include "commands/Diff.h"
 
-#include "file/Load.h"
+#include "file/KeyTree.h"
 #include "output/Quoting.h"
 #include "output/Report.h"
 #include "survey/KeyList.h"
@@ -20,15 +20,16 @@ class KeyedValues
 public:
     KeyedValues(const std::string& path, std::istream* input)
     {
-        const std::unique_ptr<CXMLReader> reader = LoadFile(path, input);
-        const xmlNode* const root = RootOf(*reader);
-        Levels levels(root->doc);
+        const KeyTree document = LoadKeyTree(path, input);
+        const xmlNode* const root = xmlDocGetRootElement(document.get());
+        Levels levels(document.get());
         KeyValues values(root, levels);
         VisitKeys(root, levels,
                   [&](const ListedKey& listed)
                   {
                       m_keys.push_back(listed.key);
                       m_values[listed.key] = JoinedValues(values.BearersUnder(listed).first);
+                      return true;
                   });
     }
 

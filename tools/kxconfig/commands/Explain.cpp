@@ -150,9 +150,14 @@ ExitStatus ExplainUpdate(CXMLReader& reader, const std::string& key, Report& rep
 
 ExitStatus Explain(const ExplainArguments& arguments, Report& report)
 {
-    const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file, arguments.input);
+    const LoadedReader reader = LoadFile(arguments.file, arguments.input);
     const xmlNode* const root = RootOf(*reader);
     report.Add(RootEvent{root, CompareRoot(root, arguments.key)});
+    if (!arguments.value.empty())
+    {
+        report.Complain("note: " + Quoted(arguments.value) +
+                        " is ignored: an update reaches the same elements with any value");
+    }
     return arguments.isUpdate ? ExplainUpdate(*reader, arguments.key, report)
                               : ExplainLookup(*reader, arguments.key, report);
 }

@@ -180,9 +180,9 @@ int AddNodes(const xmlNodeSet* nodes, Report& report)
 
 ExitStatus Find(const FindArguments& arguments, Report& report)
 {
-    CXmlParser document;
-    LoadDocument(arguments.file, document, arguments.input);
-    const XPathResult result = Evaluate(document, arguments.expression);
+    const LoadedParser document(new CXmlParser);
+    LoadDocument(arguments.file, *document, arguments.input);
+    const XPathResult result = Evaluate(*document, arguments.expression);
     if (result->type != XPATH_NODESET)
     {
         report.Add(Scalar{Taken(xmlXPathCastToString(result.get()))});

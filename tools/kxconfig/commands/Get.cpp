@@ -111,7 +111,7 @@ private:
 
 ExitStatus Get(const GetArguments& arguments, Report& report)
 {
-    const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file, arguments.input);
+    const LoadedReader reader = LoadFile(arguments.file, arguments.input);
     for (const std::string& key : arguments.keys)
     {
         RequireWellFormedKey(key);

@@ -1,6 +1,6 @@
 #include "commands/Keys.h"
 
-#include "file/Load.h"
+#include "file/KeyTree.h"
 #include "output/Failure.h"
 #include "output/Quoting.h"
 #include "output/Report.h"
@@ -108,9 +108,9 @@ void Add(const ListedKey& listed, KeyValues& values, const KeysArguments& argume
 
 ExitStatus Keys(const KeysArguments& arguments, Report& report)
 {
-    const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file, arguments.input);
-    const xmlNode* const root = RootOf(*reader);
-    Levels levels(root->doc);
+    const KeyTree document = LoadKeyTree(arguments.file, arguments.input);
+    const xmlNode* const root = xmlDocGetRootElement(document.get());
+    Levels levels(document.get());
     KeyValues values(root, levels);
     bool isFound = false;
     VisitKeys(root, levels,
@@ -121,6 +121,7 @@ ExitStatus Keys(const KeysArguments& arguments, Report& report)
                       isFound = true;
                       Add(listed, values, arguments, report);
                   }
+                  return true;
               });
     if (!isFound)
     {

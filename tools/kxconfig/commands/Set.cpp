@@ -183,7 +183,7 @@ ExitStatus Set(const SetArguments& arguments, Report& report)
     {
         return SetNodes(pairs, arguments, edit);
     }
-    const std::unique_ptr<CXMLReader> reader = LoadFile(arguments.file);
+    const LoadedReader reader = LoadFile(arguments.file);
     Updates updates(*reader, arguments, edit);
     for (const KeyValue& pair : pairs)
     {

@@ -121,7 +121,7 @@ const char* const g_bareAmpersand = "write & as &amp;";
 
 void RefuseValue(const std::string& why)
 {
-    throw Failure(ExitStatus::BadUsage, "VALUE is not XML text: " + why);
+    throw Failure(ExitStatus::BadUsage, "the new text is not XML text: " + why);
 }
 
 void RequireXmlText(const std::string& value)

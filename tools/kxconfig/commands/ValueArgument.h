@@ -6,7 +6,7 @@
 
 struct _xmlDoc;
 
-/** Ends a command with the message that VALUE is not XML text, and @p why. */
+/** Ends a command with the message that the new text is not XML text, and @p why. */
 [[noreturn]] void RefuseValue(const std::string& why);
 
 /** Throws a Failure unless @p value is text as an XML file holds it, with references. */

@@ -5,8 +5,11 @@
 #include "output/Failure.h"
 #include "output/Quoting.h"
 
+#include "KxLog.h"
+
 #include <libxml/tree.h>
 
+#include <array>
 #include <new>
 
 namespace
@@ -41,32 +44,59 @@ Input Open(const std::string& path, std::istream* standardInput)
     }
 }
 
+/** What is kept: more than a command loads. */
+std::array<void*, 4> g_kept;
+size_t g_keptCount = g_kept.size(); ///< none is, unless it is asked for
+
 } // namespace
 
-std::unique_ptr<CXMLReader> LoadFile(const std::string& path, std::istream* standardInput)
+void KeepLoaded()
+{
+    g_keptCount = 0;
+}
+
+bool IsKept(void* loaded)
+{
+    if (g_keptCount == g_kept.size() || g_LumLogParams.xmlConfigParserMask != 0)
+    {
+        return false;
+    }
+    g_kept[g_keptCount++] = loaded;
+    return true;
+}
+
+void LoadWith(const std::function<bool(const std::string&)>& load, const std::string& path,
+              std::istream* standardInput)
 {
     const Input input = Open(path, standardInput);
     const FirstEngineError error;
-    std::unique_ptr<CXMLReader> reader(GetCXMLReaderObject(input.Path().c_str()));
-    if (reader == nullptr)
-    {
-        throw std::bad_alloc();
-    }
-    if (reader->GetDataPtr() == nullptr)
+    if (!load(input.Path()))
     {
         ThrowNotParsed(path, error);
     }
+}
+
+LoadedReader LoadFile(const std::string& path, std::istream* standardInput)
+{
+    LoadedReader reader;
+    LoadWith(
+        [&](const std::string& file)
+        {
+            reader.reset(GetCXMLReaderObject(file.c_str()));
+            if (reader == nullptr)
+            {
+                throw std::bad_alloc();
+            }
+            return reader->GetDataPtr() != nullptr;
+        },
+        path, standardInput);
     return reader;
 }
 
 void LoadDocument(const std::string& path, CXmlParser& document, std::istream* standardInput)
 {
-    const Input input = Open(path, standardInput);
-    const FirstEngineError error;
-    if (document.ParseXml(input.Path()) != 0)
-    {
-        ThrowNotParsed(path, error);
-    }
+    LoadWith([&](const std::string& file) { return document.ParseXml(file) == 0; }, path,
+             standardInput);
 }
 
 _xmlDoc* DocumentOf(CXMLReader& reader)

@@ -122,6 +122,40 @@ Alike AlikeOf(const xmlNode* node)
     }
 }
 
+/** More siblings than these are numbered all at once. */
+const size_t kMostFew = 16;
+
+bool HasFewChildren(const xmlNode* parent)
+{
+    size_t count = 0;
+    for (const xmlNode* node = parent->children; node != nullptr && count <= kMostFew;
+         node = node->next)
+    {
+        ++count;
+    }
+    return count <= kMostFew;
+}
+
+/** @return whether @p other shares the step of @p node: "*" stands for every element. */
+bool ShareStep(const xmlNode* node, const xmlNode* other)
+{
+    return IsNameless(node) ? other->type == XML_ELEMENT_NODE
+                            : !IsNameless(other) && AlikeOf(node) == AlikeOf(other);
+}
+
+/** @return the position of @p node among the siblings with the same step, or 0 if there is none. */
+size_t PositionAmongSiblings(const xmlNode* node)
+{
+    size_t before = 0;
+    size_t count = 0;
+    for (const xmlNode* other = node->parent->children; other != nullptr; other = other->next)
+    {
+        before = other == node ? count : before;
+        count += ShareStep(node, other) ? 1 : 0;
+    }
+    return count == 1 ? 0 : before + 1;
+}
+
 // The mark of a node: its position among the nodes with the same step, from 1, or 0 if there is no
 // other; and in the lowest bit whether its own children are counted.
 
@@ -273,6 +307,10 @@ size_t Locations::PositionOf(const xmlNode* node)
     if (node->type == XML_ATTRIBUTE_NODE || node->parent == nullptr)
     {
         return 0;
+    }
+    if (HasFewChildren(node->parent))
+    {
+        return PositionAmongSiblings(node);
     }
     if ((MarkOf(node->parent) & kIsCounted) == 0)
     {

@@ -62,7 +62,7 @@ public:
 private:
     void ListLevel(const xmlNode* parent, const Level* level, bool isOnly)
     {
-        for (const xmlNode* node = kx::ElementFrom(parent->children); node != nullptr;
+        for (const xmlNode* node = kx::ElementFrom(parent->children); node != nullptr && !m_isEnded;
              node = kx::ElementFrom(node->next))
         {
             if (IsFreeOf(".@", Text(node->name)))
@@ -97,7 +97,7 @@ private:
 
     void Visit(const xmlNode* onlyBearer)
     {
-        m_visit({m_key, onlyBearer, m_steps});
+        m_isEnded = !m_visit({m_key, onlyBearer, m_steps});
         if (onlyBearer == nullptr)
         {
             return;
@@ -113,6 +113,7 @@ private:
     std::string m_key;
     std::vector<KeyStep> m_steps;
     std::unordered_set<std::string> m_listed;
+    bool m_isEnded = false; ///< by the visitor
 };
 
 } // namespace
@@ -128,6 +129,11 @@ void VisitKeys(const xmlNode* root, Levels& levels, const KeyVisitor& visit)
 std::vector<std::string> ListKeys(const xmlNode* root, Levels& levels)
 {
     std::vector<std::string> keys;
-    VisitKeys(root, levels, [&](const ListedKey& listed) { keys.push_back(listed.key); });
+    VisitKeys(root, levels,
+              [&](const ListedKey& listed)
+              {
+                  keys.push_back(listed.key);
+                  return true;
+              });
     return keys;
 }

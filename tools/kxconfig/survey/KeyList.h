@@ -28,7 +28,8 @@ struct ListedKey
     const std::vector<KeyStep>& steps; ///< from the root's children on; of an only bearer
 };
 
-using KeyVisitor = std::function<void(const ListedKey&)>;
+/** @return whether to go on. */
+using KeyVisitor = std::function<bool(const ListedKey&)>;
 
 /**
  * Visits the key path of each element with a value, in document order and each key once. It has a
