@@ -1,17 +1,19 @@
 #!/usr/bin/env bash
-# Detects regressions of speed: counts the instructions of some key operations and compares them with the counts in
-# bench/instructions.txt, which are valid for Debian 12 on x86-64; and the stack that a level of a lookup takes.
+# Detects regressions of speed: counts the instructions of some key operations, and of some runs of the client, and
+# compares them with the counts in bench/instructions.txt and bench/client_instructions.txt, which are valid for Debian 12
+# on x86-64; and the stack that a level of a lookup takes.
 # usage: check_speed.sh [--accept]
-#   --accept  writes the present counts to the file, for an intended change
+#   --accept  writes the present counts to the files, for an intended change
 . "$(dirname "$0")/common.sh"
 
 margin=3        # percent
 stack_limit=240 # bytes
 file=bench/instructions.txt
+client_file=bench/client_instructions.txt
 
 need "${build_packages[@]}" valgrind
 
-build_preset bench --target kx_bench_guard kx_as_it_is
+build_preset bench --target kx_bench_guard kx_as_it_is kxconfig
 
 # Versions outside this project that affect the counts.
 versions() {
@@ -28,13 +30,20 @@ count() {
 }
 
 counted=$(count as_it_is)
+client_counted=$(scripts/count_client.sh build/bench/tools/kxconfig)
+
+# accept FILE COUNTS
+accept() {
+    { grep '^#' "$1" | grep -v '^# with '; echo "# with $(versions)"; echo "$2"; } >"$1.new"
+    mv "$1.new" "$1"
+}
 
 if [ "${1:-}" = --accept ]; then
     [ "$(wc -l <<<"$counted")" -eq ${#operations[@]} ] ||
         { echo "not all operations of $file were counted; is one of them called otherwise now?" >&2; exit 1; }
-    { grep '^#' $file | grep -v '^# with '; echo "# with $(versions)"; echo "$counted"; } >$file.new
-    mv $file.new $file
-    echo "$file is written; commit it with the change that it is about"
+    accept $file "$counted"
+    accept $client_file "$client_counted"
+    echo "$file and $client_file are written; commit them with the change that they are about"
     exit 0
 fi
 
@@ -57,11 +66,14 @@ compare() {
         }' "$2" "$3"
 }
 
-echo "== instructions, against $file"
-if ! compare $margin $file <(echo "$counted"); then
+echo "== instructions, against $file and $client_file"
+failed=0
+compare $margin $file <(echo "$counted") || failed=1
+compare $margin $client_file <(echo "$client_counted") || failed=1
+if [ $failed = 1 ]; then
     cat >&2 <<MESSAGE
 
-An operation takes more than $margin % more instructions than $file says.
+An operation takes more than $margin % more instructions than $file or $client_file states.
 If the change is not intended: callgrind_annotate shows where the instructions are spent, see docs/performance.md.
 If it is meant: scripts/check_speed.sh --accept writes the new counts; commit them, and say why in the message.
 MESSAGE

@@ -7,12 +7,10 @@ set -euo pipefail
 dumps=$(mktemp -d)
 trap 'rm -rf "$dumps"' EXIT
 
-# Otherwise the C library selects its string functions by the processor, and the loader resolves a function at its first
-# call.
-processor=-AVX512F,-AVX512VL,-AVX512BW,-AVX512DQ,-AVX2,-AVX,-BMI1,-BMI2,-LZCNT,-MOVBE,-SSE4_2,-SSE4_1,-SSSE3
-processor+=,-ERMS,-FSRM,-RTM,-AVX_Fast_Unaligned_Load,-Fast_Unaligned_Copy,-Prefer_No_VZEROUPPER
-if ! GLIBC_TUNABLES=glibc.cpu.hwcaps=$processor LD_BIND_NOW=1 \
-    valgrind --tool=callgrind --instr-atstart=no --callgrind-out-file="$dumps/out" "$@" 2>"$dumps/log" >&2; then
+. "$(dirname "$0")/plain_processor.sh"
+
+# With LD_BIND_NOW the loader does not resolve a function at its first call.
+if ! LD_BIND_NOW=1 valgrind --tool=callgrind --instr-atstart=no --callgrind-out-file="$dumps/out" "$@" 2>"$dumps/log" >&2; then
     cat "$dumps/log" >&2
     exit 1
 fi

@@ -54,6 +54,7 @@ public:
     ~TimeLimit()
     {
         Start(0, 0);
+        signal(SIGALRM, SIG_IGN); // drops a signal that is still pending
         sigaction(SIGALRM, &m_former, nullptr);
     }
 
