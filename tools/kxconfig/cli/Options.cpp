@@ -151,12 +151,13 @@ void AddSet(CLI::App& app, Request& request)
                     "read VALUE from this file, without the last line end; -: standard input")
         ->type_name("FILE")
         ->check(CLI::Validator(ValueFileError, ""));
-    set->add_flag("--create", arguments.create,
-                  "make the elements of a key without conditions that are not there");
+    CLI::Option* const create =
+        set->add_flag("--create", arguments.create,
+                      "make the elements of a key without conditions that are not there");
     CLI::Option* const node = set->add_flag(
         "--node", arguments.byNode,
         "KEY is an XPath expression: replace the text of the one element or attribute it selects");
-    node->excludes("--create");
+    node->excludes(create); // by its name it would be looked up without regard to a lack of memory
     set->add_flag("--all", arguments.all, "with --node: of all that it selects")->needs(node);
     AddSaving(*set, arguments.saving);
 }

@@ -1,5 +1,6 @@
 #include "commands/CreateElements.h"
 
+#include "file/Engine.h"
 #include "file/Insertion.h"
 #include "file/Nodes.h"
 #include "output/Failure.h"
@@ -97,6 +98,7 @@ void CreateElements(xmlDoc* document, const std::string& key, const std::string&
 {
     const std::vector<std::string> names = NamesBelowRoot(key);
     RequireNames(names, key);
+    const FirstEngineError error;
     xmlNode* element = xmlDocGetRootElement(document);
     bool isNew = false;
     for (size_t i = 0; i != names.size(); ++i)
@@ -110,4 +112,5 @@ void CreateElements(xmlDoc* document, const std::string& key, const std::string&
     {
         Fill(element, value, key, changes);
     }
+    error.RequireMemory();
 }

@@ -27,6 +27,7 @@ XPathResult Evaluate(CXmlParser& document, const std::string& expression)
     const FirstEngineError error;
     // Not FindAllNodes(), which ends at 255 nodes.
     XPathResult result(document.GetNodeSet(expression, top));
+    error.RequireMemory();
     if (result == nullptr)
     {
         const std::string reason = error.IsNone() ? "" : ": " + error.Text();

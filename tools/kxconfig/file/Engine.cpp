@@ -72,6 +72,20 @@ FirstEngineError::FirstEngineError() : m_receiver(Keep, this)
 {
 }
 
+void FirstEngineError::RequireMemory() const
+{
+    if (m_isOutOfMemory)
+    {
+        throw std::bad_alloc();
+    }
+}
+
+bool FirstEngineError::IsNone() const
+{
+    RequireMemory();
+    return m_text.empty();
+}
+
 void FirstEngineError::Keep(void* self, EngineError error)
 {
     FirstEngineError& errors = *static_cast<FirstEngineError*>(self);

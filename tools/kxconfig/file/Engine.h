@@ -56,10 +56,12 @@ class FirstEngineError
 public:
     FirstEngineError();
 
-    bool IsNone() const { return m_text.empty(); }
+    /** @throws std::bad_alloc if the engine ran out of memory, be it after the first error. */
+    void RequireMemory() const;
 
-    /** @return whether the engine ran out of memory, be it after the first error. */
-    bool IsOutOfMemory() const { return m_isOutOfMemory; }
+    /** @return whether there was no error.
+     * @throws std::bad_alloc if the engine ran out of memory: other errors can follow from that. */
+    bool IsNone() const;
 
     /** @return "LINE: reason", or the reason alone if it is on no line; empty if there is none. */
     const std::string& Text() const { return m_text; }

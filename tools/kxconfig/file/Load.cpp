@@ -7,7 +7,7 @@
 
 #include "KxLog.h"
 
-#include <libxml/tree.h>
+#include <libxml/parser.h>
 
 #include <array>
 #include <new>
@@ -21,10 +21,24 @@ Failure NotRead(const std::string& path, const std::error_code& error)
             "cannot read " + (path.empty() ? Quoted(path) : path) + ": " + error.message()};
 }
 
-/** Throws what kept the engine from loading the file. */
-[[noreturn]] void ThrowNotParsed(const std::string& path, const FirstEngineError& error)
+bool IsWellFormed(const std::string& path)
 {
-    if (error.IsOutOfMemory())
+    xmlDoc* const document = xmlReadFile(path.c_str(), nullptr, 0);
+    xmlFreeDoc(document);
+    return document != nullptr;
+}
+
+/** Throws unless the engine has loaded the file completely. */
+void RequireParsed(bool isParsed, const Input& input, const std::string& path,
+                   const FirstEngineError& error)
+{
+    error.RequireMemory();
+    if (isParsed)
+    {
+        return;
+    }
+    // Some lacks of memory look like an error of the file, which the same file then has no more.
+    if (IsWellFormed(input.Path()))
     {
         throw std::bad_alloc();
     }
@@ -70,10 +84,7 @@ void LoadWith(const std::function<bool(const std::string&)>& load, const std::st
 {
     const Input input = Open(path, standardInput);
     const FirstEngineError error;
-    if (!load(input.Path()))
-    {
-        ThrowNotParsed(path, error);
-    }
+    RequireParsed(load(input.Path()), input, path, error);
 }
 
 LoadedReader LoadFile(const std::string& path, std::istream* standardInput)

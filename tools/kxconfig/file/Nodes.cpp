@@ -1,5 +1,9 @@
 #include "file/Nodes.h"
 
+#include "file/Engine.h"
+
+#include <memory>
+
 namespace
 {
 
@@ -33,9 +37,9 @@ std::string KindOf(const xmlNode* node)
 
 std::string Taken(xmlChar* text)
 {
-    const std::string copy = Text(text);
-    xmlFree(text);
-    return copy;
+    const std::unique_ptr<xmlChar, void (*)(xmlChar*)> owner(text, [](xmlChar* owned)
+                                                             { xmlFree(owned); });
+    return Text(text);
 }
 
 long LineNumberOf(const xmlNode* node)
@@ -52,7 +56,10 @@ std::string LineOf(const xmlNode* node)
 
 std::string ContentOf(const xmlNode* node)
 {
-    return Taken(xmlNodeGetContent(const_cast<xmlNode*>(node)));
+    const FirstEngineError error;
+    std::string content = Taken(xmlNodeGetContent(const_cast<xmlNode*>(node)));
+    error.RequireMemory();
+    return content;
 }
 
 std::string NameWithPrefix(const xmlNode* node)
@@ -88,12 +95,17 @@ std::string WhyNoValue(const xmlNode* element)
 
 bool HasAttribute(const xmlNode* element, const std::string& name)
 {
+    const FirstEngineError error;
     xmlChar* const text = xmlGetProp(const_cast<xmlNode*>(element), kx::ToEngine(name));
     xmlFree(text);
+    error.RequireMemory();
     return text != nullptr;
 }
 
 std::string AttributeOf(const xmlNode* element, const std::string& name)
 {
-    return Taken(xmlGetProp(const_cast<xmlNode*>(element), kx::ToEngine(name)));
+    const FirstEngineError error;
+    std::string text = Taken(xmlGetProp(const_cast<xmlNode*>(element), kx::ToEngine(name)));
+    error.RequireMemory();
+    return text;
 }

@@ -96,6 +96,15 @@ std::string WhyNotLoaded(const TreelessParse& parse, const FirstEngineError& err
                                : ", line " + error.Text();
 }
 
+/** Some lacks of memory look like an error of the file, which the same bytes then have no more. */
+void RequireFailsAgain(const std::string& bytes)
+{
+    if (bytes.size() <= INT_MAX && TreelessParse().Succeeds(bytes))
+    {
+        throw std::bad_alloc();
+    }
+}
+
 } // namespace
 
 void RequireLoadsAgain(const std::string& bytes, const std::string& target)
@@ -104,6 +113,8 @@ void RequireLoadsAgain(const std::string& bytes, const std::string& target)
     TreelessParse parse;
     if (bytes.size() > INT_MAX || !parse.Succeeds(bytes))
     {
+        error.RequireMemory();
+        RequireFailsAgain(bytes);
         throw Failure(ExitStatus::NotSaved, "not saved: " + target + " would no longer load" +
                                                 WhyNotLoaded(parse, error));
     }

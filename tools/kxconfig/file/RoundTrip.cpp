@@ -1,5 +1,7 @@
 #include "file/RoundTrip.h"
 
+#include "file/Engine.h"
+
 #include <libxml/xmlsave.h>
 
 #include <filesystem>
@@ -51,9 +53,12 @@ std::optional<std::string> BytesOf(const std::string& path)
 std::string SavedBytes(xmlDoc* document)
 {
     std::string bytes;
+    const FirstEngineError error;
     xmlOutputBuffer* const buffer =
         xmlOutputBufferCreateIO(AppendTo, nullptr, &bytes, xmlFindCharEncodingHandler("UTF-8"));
-    if (buffer == nullptr || xmlSaveFileTo(buffer, document, "UTF-8") < 0)
+    const bool isSaved = buffer != nullptr && xmlSaveFileTo(buffer, document, "UTF-8") >= 0;
+    error.RequireMemory(); // short of it the engine leaves out declarations and reports success
+    if (!isSaved)
     {
         throw std::bad_alloc();
     }

@@ -6,10 +6,15 @@
 
 #include <nlohmann/json.hpp>
 
+#include <atomic>
 #include <cstdlib>
 #include <cstring>
+#include <exception>
+#include <new>
 #include <ostream>
 #include <utility>
+
+#include <unistd.h>
 
 namespace
 {
@@ -55,10 +60,38 @@ Json OrNull(const std::optional<std::string>& text)
     return text ? Json(*text) : Json();
 }
 
+/** The status of a process that ends short of memory. */
+std::atomic<ExitStatus> g_failure{ExitStatus::NotSaved};
+
 } // namespace
+
+void EndTerminated()
+{
+    try
+    {
+        std::rethrow_exception(std::current_exception());
+    }
+    catch (const std::bad_alloc&)
+    {
+        const char message[] = "kxconfig: out of memory\n";
+        static_cast<void>(!write(STDERR_FILENO, message, sizeof message - 1));
+        _exit(static_cast<int>(g_failure.load()));
+    }
+    catch (...)
+    {
+        std::abort();
+    }
+}
 
 Report::Report(std::ostream& output, std::ostream& errors) : m_output(&output), m_errors(errors)
 {
+    g_failure = m_failure;
+}
+
+void Report::NoteSaved()
+{
+    m_failure = ExitStatus::NotReported;
+    g_failure = m_failure;
 }
 
 Report::~Report() = default;

@@ -27,6 +27,12 @@ enum class ColorChoice
     Never
 };
 
+/**
+ * Ends the process where std::terminate() would abort it: short of memory, functions of the parsers
+ * of arguments and of JSON throw that must not. The message and the status are those of such a run.
+ */
+[[noreturn]] void EndTerminated();
+
 /** What one run of kxconfig prints: lines for people, or one JSON object at the end. */
 class Report
 {
@@ -85,7 +91,7 @@ public:
     std::ostream& GiveOutput();
 
     /** Notes that a file is saved: what fails from now on fails after that. */
-    void NoteSaved() { m_failure = ExitStatus::NotReported; }
+    void NoteSaved();
 
     /** Ends the output. @return @p status; NotSaved, or NotReported after NoteSaved(), if the
      * output could not be written. */
