@@ -207,8 +207,10 @@ TEST_P(KxconfigCost, IsLinearInTheFile)
         const Cost less = Of(command, small);
         const Cost more = Of(command, large);
         const std::size_t fixed = 5000; // of any run
+        // A standard library that shares strings allocates the short ones, too.
+        const std::size_t requests = _GLIBCXX_USE_CXX11_ABI != 0 ? 4 : 6;
         EXPECT_LT(more.requests, less.requests * 5 / 2 + fixed) << command;
-        EXPECT_LT(more.requests, 4 * large.size() + fixed) << command;
+        EXPECT_LT(more.requests, requests * large.size() + fixed) << command;
         EXPECT_LT(more.bytes, less.bytes * 5 / 2 + 100 * fixed) << command;
         EXPECT_LT(more.bytes, 250 * large.size() + 100 * fixed) << command;
         EXPECT_LT(more.output, less.output * 5 / 2 + fixed) << command;
