@@ -18,4 +18,6 @@ set(CMAKE_FIND_ROOT_PATH_MODE_PROGRAM NEVER)
 set(engine_needs ${sysroot}/usr/lib/${triplet}:${sysroot}/lib/${triplet})
 set(CMAKE_EXE_LINKER_FLAGS_INIT -Wl,-rpath-link,${engine_needs})
 set(CMAKE_SHARED_LINKER_FLAGS_INIT -Wl,-rpath-link,${engine_needs})
-set(CMAKE_CROSSCOMPILING_EMULATOR qemu-arm -L /usr/${triplet} -E LD_LIBRARY_PATH=${engine_needs})
+# The library is linked without its build directory, and finds the platform here.
+set(libraries ${engine_needs}:${CMAKE_BINARY_DIR}/platform)
+set(CMAKE_CROSSCOMPILING_EMULATOR qemu-arm -L /usr/${triplet} -E LD_LIBRARY_PATH=${libraries})
