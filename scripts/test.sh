@@ -10,11 +10,13 @@
 #   engine   all tests with the newest libxml2 that Debian has as a source package
 #   engines  the library's suites with each libxml2-VERSION.tar.xz in the folder KX_ENGINE_ARCHIVES
 #   arm      all tests for ARMv7-A, in both calling conventions, under qemu-arm; the library's size
+#   target   the library's suites as on the target: ARMv7-A, soft-float convention, shared strings, libxml2 2.7.8 from
+#            the folder KX_ENGINE_ARCHIVES
 #   proof    full coverage of lines and branches; Valgrind; ThreadSanitizer; a short run of each fuzz target
 #   speed    the instructions of key operations, compared with the accepted counts
 #   docs     the reference, without a warning of Doxygen; the recording of a new user's first steps
 #   host     fast and package; the default
-#   all      all stages, engines only if KX_ENGINE_ARCHIVES is set; CI runs this
+#   all      all stages, engines and target only if KX_ENGINE_ARCHIVES is set; CI runs this
 . "$(dirname "$0")/common.sh"
 
 # run_preset NAME — configures, builds and tests with the preset; prints details only of failures.
@@ -78,6 +80,13 @@ stage_arm() {
     scripts/arm_size.sh
 }
 
+stage_target() {
+    need "${build_packages[@]}" "${test_packages[@]}" googletest g++-arm-linux-gnueabi qemu-user
+    scripts/arm_sysroot.sh armel
+    scripts/target_engine.sh "${KX_ENGINE_ARCHIVES:?names a folder of libxml2-VERSION.tar.xz}"
+    run_preset target
+}
+
 stage_proof() {
     scripts/coverage.sh
     scripts/valgrind.sh
@@ -112,8 +121,11 @@ stage_all() {
     stage_proof
     stage_abi98
     stage_engine
-    [ -z "${KX_ENGINE_ARCHIVES:-}" ] || stage_engines
     stage_arm
+    if [ -n "${KX_ENGINE_ARCHIVES:-}" ]; then
+        stage_engines
+        stage_target
+    fi
 }
 
 [ $# -gt 0 ] || set -- host
@@ -121,7 +133,7 @@ for stage in "$@"; do
     declare -F "stage_$stage" >/dev/null ||
         {
             echo "$0: no stage \"$stage\"; there are fast, style, sanitize, package, abi98, engine, engines, arm," \
-                "proof, speed, docs, host, all" >&2
+                "target, proof, speed, docs, host, all" >&2
             exit 2
         }
 done

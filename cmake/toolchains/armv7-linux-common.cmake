@@ -20,4 +20,10 @@ set(CMAKE_EXE_LINKER_FLAGS_INIT -Wl,-rpath-link,${engine_needs})
 set(CMAKE_SHARED_LINKER_FLAGS_INIT -Wl,-rpath-link,${engine_needs})
 # The library is linked without its build directory, and finds the platform here.
 set(libraries ${engine_needs}:${CMAKE_BINARY_DIR}/platform)
+# The prefix of another engine than the sysroot's.
+if(KX_ARM_ENGINE)
+    set(LIBXML2_INCLUDE_DIR ${KX_ARM_ENGINE}/include/libxml2 CACHE PATH "")
+    set(LIBXML2_LIBRARY ${KX_ARM_ENGINE}/lib/libxml2.so CACHE FILEPATH "")
+    string(PREPEND libraries ${KX_ARM_ENGINE}/lib:)
+endif()
 set(CMAKE_CROSSCOMPILING_EMULATOR qemu-arm -L /usr/${triplet} -E LD_LIBRARY_PATH=${libraries})
