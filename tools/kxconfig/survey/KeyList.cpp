@@ -4,6 +4,7 @@
 
 #include <array>
 #include <unordered_set>
+#include <utility>
 
 namespace
 {
@@ -62,15 +63,21 @@ public:
 private:
     void ListLevel(const xmlNode* parent, const Level* level, bool isOnly)
     {
+        std::vector<std::string> segments;
+        if (level != nullptr)
+        {
+            segments = level->Segments();
+        }
+        size_t place = 0;
         for (const xmlNode* node = kx::ElementFrom(parent->children); node != nullptr && !m_isEnded;
-             node = kx::ElementFrom(node->next))
+             node = kx::ElementFrom(node->next), ++place)
         {
             if (IsFreeOf(".@", Text(node->name)))
             {
-                const std::string segment =
-                    level == nullptr ? Text(node->name) : level->SegmentOf(node);
+                std::string segment =
+                    level == nullptr ? Text(node->name) : std::move(segments[place]);
                 const bool isOnlyHere = level == nullptr || level->SelectsOnly(node, segment);
-                m_steps.push_back({parent, level, segment, true});
+                m_steps.push_back({parent, level, std::move(segment), true});
                 List(node, isOnly && isOnlyHere);
                 m_steps.pop_back();
             }

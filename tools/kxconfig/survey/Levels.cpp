@@ -5,6 +5,7 @@
 #include "config/KeyPath.h"
 
 #include <algorithm>
+#include <functional>
 #include <iterator>
 #include <unordered_set>
 #include <utility>
@@ -122,6 +123,30 @@ const Sibling* FirstExcept(const Siblings& excepted, const Siblings& siblings)
     return nullptr;
 }
 
+/** A condition, and an element that fulfills it. */
+struct FulfilledCondition
+{
+    size_t hash; ///< of the condition: numbers are faster to sort than texts
+    size_t bearer;
+    size_t number; ///< in the order of elements and attributes
+    std::string condition;
+};
+
+bool ComesBefore(const FulfilledCondition& one, const FulfilledCondition& other)
+{
+    return one.hash != other.hash ? one.hash < other.hash : one.condition < other.condition;
+}
+
+using ConditionIterator = std::vector<FulfilledCondition>::const_iterator;
+
+/** @return the end of the conditions that are the same as the one at @p begin. */
+ConditionIterator EndOfSame(ConditionIterator begin, ConditionIterator end)
+{
+    return std::find_if(std::next(begin), end,
+                        [begin](const FulfilledCondition& other)
+                        { return ComesBefore(*begin, other); });
+}
+
 } // namespace
 
 bool IsFreeOf(const char* separators, const std::string& text)
@@ -167,22 +192,50 @@ void Level::Add(const xmlNode* element, bool suspended, Namesakes& namesakes)
     }
 }
 
-std::string Level::SegmentOf(const xmlNode* element) const
+std::vector<std::string> Level::Segments() const
 {
-    const std::string name = Text(element->name);
-    const Namesakes& namesakes = NamesakesOf(name);
-    if (namesakes.all.size() == 1)
+    std::vector<std::string> segments;
+    segments.reserve(m_elements.size());
+    for (const xmlNode* const element : m_elements)
     {
-        return name;
+        segments.push_back(Text(element->name));
     }
-    for (const std::string& condition : ConditionsOf(element))
+    for (const auto& [name, namesakes] : m_byName)
     {
-        if (Fulfilling(namesakes, condition).size() == 1)
+        if (namesakes.all.size() > 1)
         {
-            return name + condition;
+            AddConditions(namesakes.all, segments);
         }
     }
-    return name;
+    return segments;
+}
+
+/** Adds to the segment of each of @p namesakes the first condition that no other one fulfills. */
+void Level::AddConditions(const Siblings& namesakes, std::vector<std::string>& segments) const
+{
+    std::vector<FulfilledCondition> all;
+    all.reserve(namesakes.size());
+    for (size_t i = 0; i != namesakes.size(); ++i)
+    {
+        for (std::string& condition : ConditionsOf(namesakes[i].element))
+        {
+            all.push_back(
+                {std::hash<std::string>()(condition), i, all.size(), std::move(condition)});
+        }
+    }
+    std::sort(all.begin(), all.end(), ComesBefore);
+    std::vector<const FulfilledCondition*> chosen(namesakes.size());
+    for (ConditionIterator at = all.begin(), next; at != all.end(); at = next)
+    {
+        next = EndOfSame(at, all.end());
+        const FulfilledCondition*& before = chosen[at->bearer];
+        const bool isUnique = next == std::next(at);
+        before = isUnique && (before == nullptr || at->number < before->number) ? &*at : before;
+    }
+    for (size_t i = 0; i != namesakes.size(); ++i)
+    {
+        segments[namesakes[i].place] += chosen[i] == nullptr ? "" : chosen[i]->condition;
+    }
 }
 
 bool Level::SelectsOnly(const xmlNode* element, const std::string& segment) const

@@ -43,10 +43,11 @@ public:
           const std::map<std::string, std::vector<std::string>>& defaulted);
 
     /**
-     * @return the segment for @p element: its name and, if others bear it too, the first condition
-     * with a single attribute that only this element fulfills; without such a condition its name.
+     * @return a segment for each element, in their order: its name and, if others bear it too, the
+     * first condition with a single attribute that only this element fulfills; without such a
+     * condition its name.
      */
-    std::string SegmentOf(const xmlNode* element) const;
+    std::vector<std::string> Segments() const;
 
     /** @return whether a lookup takes only @p element for its own segment on this level. */
     bool SelectsOnly(const xmlNode* element, const std::string& segment) const;
@@ -57,11 +58,11 @@ public:
     const Siblings& Suspended(const std::string& name) const;
 
     /** @return those of the name that @p segment starts with that fulfill the segment's condition,
-     * which SegmentOf() gave for some level. */
+     * which Segments() gave for some level. */
     const Siblings& Fulfilling(const std::string& segment) const;
 
     /** @return the elements of one parent whose order matters to @p segment, which has a condition
-     * and which SegmentOf() gave for some level. */
+     * and which Segments() gave for some level. */
     Order OrderFor(const std::string& segment) const;
 
 private:
@@ -77,6 +78,7 @@ private:
     const Namesakes& NamesakesOf(std::string_view name) const;
     const Siblings& Fulfilling(const Namesakes& namesakes, const std::string& condition) const;
     ByCondition SortByCondition(const Siblings& siblings) const;
+    void AddConditions(const Siblings& namesakes, std::vector<std::string>& segments) const;
     void AddChildrenOf(const xmlNode* parent);
     void Add(const xmlNode* element, bool suspended, Namesakes& namesakes);
     std::vector<std::string> ConditionsOf(const xmlNode* element) const;
