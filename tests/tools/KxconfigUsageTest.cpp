@@ -70,6 +70,22 @@ TEST_F(KxconfigUsage, ExitStatusesAreTheSameInHelpManPageAndDocumentation)
     EXPECT_EQ(6, count);
 }
 
+TEST_F(KxconfigUsage, ADiffShowsNoControlCharactersToATerminal)
+{
+    if (!HasTerminals())
+    {
+        GTEST_SKIP() << "no terminals here";
+    }
+    const std::string file = m_folder.Write("c1.xml", "<cfg>\n\t<a>\xC2\x9B"
+                                                      "1m</a></cfg>");
+    const Outcome piped =
+        ToolProcess({"set", "--dry-run", "--quiet", "--diff", file, "cfg.a", "x"});
+    EXPECT_THAT(piped.out, HasSubstr("\n-\t<a>\xC2\x9B"
+                                     "1m</a></cfg>\n"));
+    const std::string arguments = "set --dry-run --quiet --diff " + InShell(file) + " cfg.a x";
+    EXPECT_THAT(OnTerminal(arguments, {"TERM=dumb"}), HasSubstr("\n-\t<a>\\xc2\\x9b1m</a></cfg>"));
+}
+
 TEST_F(KxconfigUsage, ColoursAreForTerminals)
 {
     if (!HasTerminals())

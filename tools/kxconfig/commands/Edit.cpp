@@ -133,8 +133,8 @@ void Edit::PrintDiff(const std::string& diff)
     {
         m_report.AddJson({{"diff", diff}});
     }
-    else if (!diff.empty())
+    else
     {
-        m_report.AddLine(diff.substr(0, diff.size() - 1));
+        m_report.AddFileLines(diff);
     }
 }

@@ -86,16 +86,16 @@ std::string Escaped(const std::string& bytes)
     return escaped;
 }
 
-} // namespace
-
-std::string OnOneLine(const std::string& text)
+/** @return @p text with what is neither plain nor one of the @p kept characters escaped. */
+std::string EscapedBut(const std::string& kept, const std::string& text)
 {
     std::string line;
     for (size_t i = 0; i != text.size();)
     {
         const size_t character = LengthOfCharacter(text, i);
         const size_t length = std::max<size_t>(character, 1);
-        if (character != 0 && IsPlain(text, i, character))
+        const bool isKept = kept.find(text[i]) != std::string::npos;
+        if (isKept || (character != 0 && IsPlain(text, i, character)))
         {
             line.append(text, i, length);
         }
@@ -106,6 +106,18 @@ std::string OnOneLine(const std::string& text)
         i += length;
     }
     return line;
+}
+
+} // namespace
+
+std::string OnOneLine(const std::string& text)
+{
+    return EscapedBut("", text);
+}
+
+std::string OnItsLines(const std::string& text)
+{
+    return EscapedBut("\n\t", text);
 }
 
 std::string Quoted(const std::string& text)

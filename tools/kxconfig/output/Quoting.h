@@ -8,6 +8,9 @@
 /** @return @p text with its control characters, and bytes that are not UTF-8, escaped. */
 std::string OnOneLine(const std::string& text);
 
+/** The same of a text of several lines, whose line ends and tabs remain. */
+std::string OnItsLines(const std::string& text);
+
 /** @return @p text in double quotes and on one line, as OnOneLine() writes it. */
 std::string Quoted(const std::string& text);
 

@@ -116,6 +116,11 @@ void Report::AddBytes(const std::string& bytes)
     }
 }
 
+void Report::AddFileLines(const std::string& lines)
+{
+    AddBytes(IsTerminal(*m_output) ? OnItsLines(lines) : lines);
+}
+
 void Report::AddJson(Json result)
 {
     if (m_isJson)

@@ -73,6 +73,9 @@ public:
     /** For what exists in one form only: nothing happens if the other one was asked for. */
     void AddLine(const std::string& line);
     void AddBytes(const std::string& bytes);
+
+    /** Adds lines of a file, as they are; on a terminal with their control characters escaped. */
+    void AddFileLines(const std::string& lines);
     void AddJson(Json result);
 
     /** Prints "kxconfig: " and @p message to the errors, on one line regardless of its content. */
