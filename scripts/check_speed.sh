@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # Detects regressions of speed: counts the instructions of some key operations, and of some runs of the client, and
-# compares them with the counts in bench/instructions.txt and bench/client_instructions.txt, which are valid for Debian 12
-# on x86-64; and the stack that a level of a lookup takes.
+# compares them with the counts in bench/instructions.txt and bench/client_instructions.txt, which are valid for
+# Debian 12 on x86-64; and the stack that a level of a lookup takes.
 # usage: check_speed.sh [--accept]
 #   --accept  writes the present counts to the files, for an intended change
 . "$(dirname "$0")/common.sh"

@@ -25,8 +25,13 @@ protected:
     static std::string OnTerminal(const std::string& arguments,
                                   const std::vector<std::string>& environment)
     {
-        const std::string command = InShell(KX_CONFIG_TOOL) + " " + arguments;
-        return RunProgram({"/usr/bin/script", "-qec", command, "/dev/null"}, environment).out;
+        return ScriptOnTerminal(InShell(KX_CONFIG_TOOL) + " " + arguments, environment);
+    }
+
+    static std::string ScriptOnTerminal(const std::string& script,
+                                        const std::vector<std::string>& environment)
+    {
+        return RunProgram({"/usr/bin/script", "-qec", script, "/dev/null"}, environment).out;
     }
 };
 
@@ -100,6 +105,27 @@ TEST_F(KxconfigUsage, ColoursAreForTerminals)
     EXPECT_THAT(OnTerminal("--json " + arguments, {"TERM=xterm"}), Not(HasSubstr("\x1B")));
     EXPECT_THAT(ToolProcess({"explain", m_plain, "cfg.net.ip"}, {"TERM=xterm"}).out,
                 Not(HasSubstr("\x1B")));
+}
+
+TEST_F(KxconfigUsage, ProgressIsShownOnATerminalUntilThereIsAResult)
+{
+    if (!HasTerminals())
+    {
+        GTEST_SKIP() << "needs a terminal, and this machine gives out none";
+    }
+    // The signal of the clock comes from here: as soon as the pipe has a reader, kxconfig works.
+    const std::string pipe = InShell(m_folder.Path("pipe"));
+    const std::string script = "mkfifo " + pipe + "; " + InShell(KX_CONFIG_TOOL) + " get " + pipe +
+                               " a.b & exec 3>" + pipe +
+                               "; kill -ALRM $!; echo '<a><b>1</b></a>' >&3; exec 3>&-; wait $!";
+    const std::string shown = ScriptOnTerminal(script, {"TERM=xterm"});
+    const size_t progress = shown.find("\r\x1B[Kkxconfig: working... ");
+    const size_t cleared = shown.find("s\r\x1B[K1\r\n");
+    EXPECT_NE(std::string::npos, progress) << shown;
+    EXPECT_NE(std::string::npos, cleared) << shown;
+    EXPECT_LT(progress, cleared);
+    const std::string get = "get " + m_plain + " cfg.net.ip";
+    EXPECT_THAT(OnTerminal(get, {"TERM=xterm"}), Not(HasSubstr("working")));
 }
 
 TEST_F(KxconfigUsage, TraceShowsTheLibrarysRecordsBesideTheResult)
