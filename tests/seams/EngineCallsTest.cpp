@@ -145,6 +145,10 @@ TEST(EngineTranscript, SeesEveryFunctionThatTheLibraryMayCall)
         {
             continue; // variables, which the transcript sets
         }
+        if (name == "__xmlParserVersion" && EngineVersion() >= 21400)
+        {
+            continue; // not called, as these engines do not have it
+        }
         Dl_info definition;
         ASSERT_NE(0, dladdr(dlsym(RTLD_DEFAULT, name.c_str()), &definition)) << name;
         EXPECT_EQ(program.dli_fbase, definition.dli_fbase) << name;

@@ -1,7 +1,10 @@
 #include "ToolTest.h"
 
+#include "support/Engine.h"
+
 #include <libxml/parser.h>
 #include <libxml/tree.h>
+#include <libxml/xpath.h>
 #include <nlohmann/json.hpp>
 
 #include <algorithm>
@@ -61,6 +64,20 @@ std::vector<std::string> PathsOfTheEngine(const std::string& file)
     return paths;
 }
 
+/** @return how many nodes of @p xml the bare engine selects. */
+int CountOf(const char* expression, const std::string& xml)
+{
+    xmlDoc* const document = ParseText(xml);
+    xmlXPathContext* const context = xmlXPathNewContext(document);
+    xmlXPathObject* const result =
+        xmlXPathEvalExpression(reinterpret_cast<const xmlChar*>(expression), context);
+    const int count = xmlXPathNodeSetGetLength(result->nodesetval);
+    xmlXPathFreeObject(result);
+    xmlXPathFreeContext(context);
+    xmlFreeDoc(document);
+    return count;
+}
+
 } // namespace
 
 TEST_F(KxconfigFind, PrintsElementsWithLocationAttributesAndText)
@@ -85,6 +102,11 @@ TEST_F(KxconfigFind, PrintsEveryKindOfNode)
 
 TEST_F(KxconfigFind, DescribesWhereANodeInADtdIs)
 {
+    if (kxtest::EngineVersion() < 20900)
+    {
+        EXPECT_EQ(0, CountOf("//comment()", "<!DOCTYPE c [<!-- hi --><!ELEMENT c ANY>]><c/>"));
+        GTEST_SKIP() << "the bare query of this engine does not enter the DTD";
+    }
     // No path leads to it: to XPath a document has no DTD.
     const std::string file =
         m_folder.Write("dtd.xml", "<!DOCTYPE c [<!-- hi --><?p q?><!ELEMENT c ANY>]><c/>");
@@ -172,9 +194,10 @@ TEST_F(KxconfigFind, GivesTheLocationsOfTheEngine)
                    "t<![CDATA[u]]><e/>v<!--c--><e i='1'/><p:e/><q:e/><p:e xmlns:p='urn:r'/><!--c-->"
                    "<e xmlns='urn:d'><f/><g/><f xmlns=''/><p:f/></e><h><e xmlns='urn:d'/></h>"
                    "<?pi?><?po?><?pi?><k><l/>only</k><k><l/><m/><l/></k><m/></cfg><!--e-->");
-    const Outcome outcome = Tool({"--json", "find", file, "/ | //node() | //@*"});
+    // Without the document, which engines before 2.9 do not put first.
+    const Outcome outcome = Tool({"--json", "find", file, "//node() | //@*"});
     const nlohmann::json answer = nlohmann::json::parse(outcome.out);
-    std::vector<std::string> locations;
+    std::vector<std::string> locations = {"/"};
     for (const nlohmann::json& result : answer.at("results"))
     {
         locations.push_back(result.at("location"));
@@ -184,6 +207,11 @@ TEST_F(KxconfigFind, GivesTheLocationsOfTheEngine)
 
 TEST_F(KxconfigFind, DistinguishesAPrefixWithoutANamespaceFromOneWithIt)
 {
+    if (kxtest::EngineVersion() < 20900)
+    {
+        EXPECT_EQ(1, CountOf("/a/b", "<a><p:b/></a>"));
+        GTEST_SKIP() << "this engine drops an undeclared prefix when it parses";
+    }
     // To the engine the undeclared prefix is a part of the name.
     const std::string file =
         m_folder.Write("undeclared.xml", "<a><p:b/><c xmlns:p='urn:p'><p:b/></c><p:b/></a>");

@@ -12,11 +12,11 @@ namespace
 {
 
 /** The library evaluates without prefixes, though the locations that find prints have them. */
-std::string AdviceOnPrefixes()
+std::string AdviceOnPrefixes(const FirstEngineError& error)
 {
-    const auto error = xmlGetLastError();
-    const bool isPrefix = error != nullptr && error->code == XML_XPATH_UNDEF_PREFIX_ERROR;
-    return isPrefix ? "; no prefixes are registered: write *[name()='p:a'] for p:a" : "";
+    return error.Code() == XML_XPATH_UNDEF_PREFIX_ERROR
+               ? "; no prefixes are registered: write *[name()='p:a'] for p:a"
+               : "";
 }
 
 } // namespace
@@ -31,8 +31,8 @@ XPathResult Evaluate(CXmlParser& document, const std::string& expression)
     if (result == nullptr)
     {
         const std::string reason = error.IsNone() ? "" : ": " + error.Text();
-        throw Failure(ExitStatus::BadUsage,
-                      "malformed expression " + Quoted(expression) + reason + AdviceOnPrefixes());
+        throw Failure(ExitStatus::BadUsage, "malformed expression " + Quoted(expression) + reason +
+                                                AdviceOnPrefixes(error));
     }
     return result;
 }

@@ -108,6 +108,7 @@ void FirstEngineError::KeepText(EngineError error)
     {
         return;
     }
+    m_code = error->code;
     m_text = error->message;
     m_text.erase(std::min(m_text.find_first_of("\r\n"), m_text.size()));
     if (error->line > 0)

@@ -63,6 +63,9 @@ public:
      * @throws std::bad_alloc if the engine ran out of memory: other errors can follow from that. */
     bool IsNone() const;
 
+    /** @return the engine's number of the error; XML_ERR_OK if there is none. */
+    int Code() const { return m_code; }
+
     /** @return "LINE: reason", or the reason alone if it is on no line; empty if there is none. */
     const std::string& Text() const { return m_text; }
 
@@ -71,6 +74,7 @@ private:
     void KeepText(EngineError error);
 
     std::string m_text;
+    int m_code = XML_ERR_OK;
     bool m_isOutOfMemory = false;
     const EngineErrorReceiver m_receiver;
 };

@@ -101,6 +101,10 @@ LoadedReader LoadFile(const std::string& path, std::istream* standardInput)
             return reader->GetDataPtr() != nullptr;
         },
         path, standardInput);
+    if (RootOf(*reader) == nullptr)
+    {
+        throw std::bad_alloc(); // short of memory, some engines load a document without a root
+    }
     return reader;
 }
 
