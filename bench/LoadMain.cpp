@@ -13,7 +13,8 @@ int main(int argc, char** argv)
         return 2;
     }
     g_LumLogParams.xmlConfigParserMask = 0;
-    CXMLReader reader(argv[1]);
+    // Not freed, as in the client: the system takes the memory back at once.
+    CXMLReader& reader = *new CXMLReader(argv[1]);
     std::string value;
     const int status = reader.GetValue(argv[2], value);
     std::cout << value << '\n';
