@@ -33,7 +33,8 @@ void CountPrinted(void* printed, const char*, ...)
 class UnusualSettings
 {
 public:
-    UnusualSettings() : m_lines(CountLines(0)), m_blanks(xmlKeepBlanksDefault(0))
+    UnusualSettings()
+        : m_lines(CountLines(0)), m_noLines(CountLines(0)), m_blanks(xmlKeepBlanksDefault(0))
     {
         xmlSetStructuredErrorFunc(&g_reported, CountReport);
         xmlSetGenericErrorFunc(&g_reported, CountPrinted);
@@ -60,7 +61,7 @@ public:
         EXPECT_EQ(CountPrinted, xmlGenericError);
         EXPECT_EQ(&g_reported, xmlGenericErrorContext);
         EXPECT_EQ(0, xmlKeepBlanksDefault(0));
-        EXPECT_EQ(0, CountLines(0));
+        EXPECT_EQ(m_noLines, CountLines(0));
         EXPECT_EQ(nullptr, xmlGetLastError());
         EXPECT_EQ(m_folder, std::filesystem::current_path());
         EXPECT_EQ(0, g_reported);
@@ -78,6 +79,7 @@ private:
     }
 
     const int m_lines;
+    const int m_noLines; // from 2.15 on the engine always counts them
     const int m_blanks;
     const xmlGenericErrorFunc m_print = xmlGenericError;
     const std::filesystem::path m_folder = std::filesystem::current_path();

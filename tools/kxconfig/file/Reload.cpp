@@ -13,6 +13,9 @@
 namespace
 {
 
+/** What only the tree limits from 2.14 on; before, the parser does. */
+const int kMostLevels = LIBXML_VERSION < 21400 ? INT_MAX : 256;
+
 /** The parse of a document whose elements and texts are dropped. */
 class TreelessParse
 {
@@ -37,10 +40,11 @@ public:
         xmlDoc* const document = xmlCtxtReadMemory(
             m_context, bytes.data(), static_cast<int>(bytes.size()), nullptr, nullptr, 0);
         xmlFreeDoc(document);
-        return document != nullptr && !m_hasHugeText;
+        return document != nullptr && !m_hasHugeText && !m_isTooDeep;
     }
 
     bool HasHugeText() const { return m_hasHugeText; }
+    bool IsTooDeep() const { return m_isTooDeep; }
 
 private:
     /** Declarations are kept, for what refers to them. */
@@ -63,11 +67,14 @@ private:
                              const xmlChar**, int, int, const xmlChar**)
     {
         EndText(context);
+        TreelessParse& parse = Of(context);
+        parse.m_isTooDeep = ++parse.m_levels > kMostLevels || parse.m_isTooDeep;
     }
 
     static void EndElement(void* context, const xmlChar*, const xmlChar*, const xmlChar*)
     {
         EndText(context);
+        --Of(context).m_levels;
     }
 
     static void EndText(void* context) { Of(context).m_textLength = 0; }
@@ -88,12 +95,16 @@ private:
     xmlParserCtxt* const m_context;
     size_t m_textLength = 0; ///< since another node
     bool m_hasHugeText = false;
+    int m_levels = 0;
+    bool m_isTooDeep = false;
 };
 
 std::string WhyNotLoaded(const TreelessParse& parse, const FirstEngineError& error)
 {
     return parse.HasHugeText() ? ": a text of more than 10,000,000 bytes"
-                               : ", line " + error.Text();
+           : parse.IsTooDeep()
+               ? ": more than " + std::to_string(kMostLevels) + " levels of elements"
+               : ", line " + error.Text();
 }
 
 /** Some lacks of memory look like an error of the file, which the same bytes then have no more. */
