@@ -8,7 +8,7 @@
 #   package  the Debian packages: installs them into a scratch root, uses and removes them
 #   abi98    all tests with the target's kind of standard library (shared strings, a linear list::size)
 #   engine   all tests with the newest libxml2 that Debian has as a source package
-#   engines  the library's suites with each libxml2-VERSION.tar.xz in the folder KX_ENGINE_ARCHIVES
+#   engines  the suites with each libxml2-VERSION.tar.xz in the folder KX_ENGINE_ARCHIVES
 #   arm      all tests for ARMv7-A, in both calling conventions, under qemu-arm; the library's size
 #   target   the library's suites as on the target: ARMv7-A, soft-float convention, shared strings, libxml2 2.7.8 from
 #            the folder KX_ENGINE_ARCHIVES
