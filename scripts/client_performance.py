@@ -172,14 +172,16 @@ def markdown(header, rows):
     return "\n".join(lines + ["| " + " | ".join(row) + " |" for row in rows])
 
 
-SECTION = """`kxconfig`, compared with programs for similar tasks. Times are processor times of whole processes and include
-the load of the file. Ratios are the medians of {rounds} rounds, with the range of the single rounds.
+SECTION = """`kxconfig`, compared with programs for similar tasks. Times are processor times of whole processes and
+include the load of the file. Ratios are the medians of {rounds} rounds, with the range of the single rounds.
 `scripts/bench.sh client` measures only this section and renews it.
 
 {targets}
 
-- "{bare}" is a program that loads the file with the library, calls `GetValue()` and ends.
-- `get` and `explain` use a key with conditions, in the middle of the file. `set` and `xmlstarlet ed` change one element.
+- "{bare}" is a program that loads the file with the library, calls `GetValue()` and ends. As in the client, the system
+  takes its memory back.
+- `get` and `explain` use a key with conditions, in the middle of the file.
+- `set` and `xmlstarlet ed` change one element. An update that reaches many elements takes longer, and is not measured.
 - `find` and `xmllint` print all elements of one name.
 - `xmlstarlet el -v` builds no tree and prints no values.
 - `set` verifies that what it saves loads again.

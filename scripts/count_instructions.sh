@@ -10,7 +10,8 @@ trap 'rm -rf "$dumps"' EXIT
 . "$(dirname "$0")/plain_processor.sh"
 
 # With LD_BIND_NOW the loader does not resolve a function at its first call.
-if ! LD_BIND_NOW=1 valgrind --tool=callgrind --instr-atstart=no --callgrind-out-file="$dumps/out" "$@" 2>"$dumps/log" >&2; then
+if ! LD_BIND_NOW=1 valgrind --tool=callgrind --instr-atstart=no --callgrind-out-file="$dumps/out" "$@" \
+    2>"$dumps/log" >&2; then
     cat "$dumps/log" >&2
     exit 1
 fi

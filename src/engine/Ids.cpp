@@ -64,8 +64,8 @@ void RemoveIfLeaving(void* id, void* data, Char* value)
     // The attribute is not read: where a client has freed it past the library, it is gone.
     const Leaving* const leaving = static_cast<const Leaving*>(data);
     const xmlAttr* const attribute = static_cast<const xmlID*>(id)->attr;
-    if (bsearch(&attribute, leaving->attributes, leaving->count, sizeof attribute,
-                CompareAddresses) != 0)
+    if (bsearch(&attribute, leaving->attributes, leaving->count, sizeof(void*), CompareAddresses) !=
+        0)
     {
         xmlHashRemoveEntry(leaving->table, value, FreeId);
     }
@@ -73,7 +73,7 @@ void RemoveIfLeaving(void* id, void* data, Char* value)
 
 void RemoveFromTable(Leaving& leaving)
 {
-    qsort(leaving.attributes, leaving.count, sizeof *leaving.attributes, CompareAddresses);
+    qsort(leaving.attributes, leaving.count, sizeof(void*), CompareAddresses);
     // A scan permits the removal of the entry that it is at.
     xmlHashScan(leaving.table, RemoveIfLeaving, &leaving);
     leaving.count = 0;
@@ -111,7 +111,7 @@ void ForgetIdsFrom(xmlNode* first, const xmlNode* top)
 {
     const size_t count = CountIds(first, top);
     const xmlAttr* one = 0;
-    void* const all = count > 1 ? xmlMalloc(count * sizeof one) : 0;
+    void* const all = count > 1 ? xmlMalloc(count * sizeof(void*)) : 0;
     if (all != 0)
     {
         ForgetInSteps(first, top, static_cast<const xmlAttr**>(all), count);
