@@ -61,7 +61,7 @@ struct Result
 class KxconfigMemoryFault : public testing::TestWithParam<Command>
 {
 protected:
-    /** Runs the command while the request fails that Memory was told. */
+    /** Runs the command while Memory fails the given request. */
     template <class Memory>
     Result RunWhile(std::size_t failing)
     {
