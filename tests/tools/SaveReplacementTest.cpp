@@ -1,6 +1,7 @@
 #include "FileCalls.h"
 
 #include "file/Debris.h"
+#include "file/FileLock.h"
 #include "file/Replacement.h"
 #include "support/Files.h"
 
@@ -160,7 +161,7 @@ TEST_P(ReplacementTest, HasTheModeThatIsAskedForAndTheUmaskAllows)
 TEST_P(ReplacementTest, IsNoDebrisWhileItIsMade)
 {
     Replacement replacement(m_place, 0600);
-    RemoveDebris(m_place.Folder());
+    RemoveDebris(m_place);
     replacement.TakePlace();
     EXPECT_EQ("", ReadFile(m_file));
 }
@@ -174,7 +175,7 @@ TEST_P(ReplacementTest, IsDebrisWhenItsProcessIsKilled)
                                raise(SIGKILL);
                            }));
     EXPECT_EQ(GetParam() ? 1 : 2, FilesInFolder());
-    RemoveDebris(m_place.Folder());
+    RemoveDebris(m_place);
     EXPECT_EQ(1, FilesInFolder());
 }
 
@@ -192,7 +193,7 @@ TEST(DebrisTest, IsOnlyWhatHasItsName)
     std::filesystem::create_symlink("x", folder.Path(".kxconfig-1123456789abcdef.tmp"));
     const std::string debris = folder.Write(NameOfReplacement(), "");
     const Place place(folder.Path("cfg.xml"));
-    RemoveDebris(place.Folder());
+    RemoveDebris(place);
     EXPECT_FALSE(FileExists(debris));
     const std::filesystem::directory_iterator rest(folder.Path(""));
     EXPECT_EQ(8, std::distance(begin(rest), end(rest)));
@@ -204,6 +205,28 @@ TEST(DebrisTest, StaysWhereNoLockProvesItStale)
     const std::string debris = folder.Write(NameOfReplacement(), "");
     const Place place(folder.Path("cfg.xml"));
     const NoLocks none(ENOLCK);
-    RemoveDebris(place.Folder());
+    RemoveDebris(place);
     EXPECT_TRUE(FileExists(debris));
+}
+
+TEST(DebrisTest, IsAlsoASecondNameOfTheLockedFile)
+{
+    const TemporaryFolder folder;
+    const Place place(folder.Write("cfg.xml", "old"));
+    const FileLock lock(place, std::chrono::seconds(0));
+    const std::string link = folder.Path(NameOfReplacement());
+    std::filesystem::create_hard_link(folder.Path("cfg.xml"), link);
+    RemoveDebris(place);
+    EXPECT_FALSE(FileExists(link));
+    EXPECT_EQ("old", ReadFile(folder.Path("cfg.xml")));
+}
+
+TEST(DebrisTest, IsNoFileThatAnotherSaveHasLocked)
+{
+    const TemporaryFolder folder;
+    const Place place(folder.Write("cfg.xml", "old"));
+    const Place other(folder.Write(NameOfReplacement(), "new"));
+    const FileLock lock(other, std::chrono::seconds(0));
+    RemoveDebris(place);
+    EXPECT_TRUE(other.Status());
 }

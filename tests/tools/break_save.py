@@ -5,7 +5,8 @@ usage: break_save.py STRACE KXCONFIG
 
 The process is killed before each call, and then each call fails. Afterwards the file must be the old or the new one,
 whole, with its permissions; the exit status must fit; a killed save may leave one file of a known name, a failed
-one none; and the next `set` must succeed and clean up.
+one none; and the next `set` must succeed and clean up. A backup, where one is asked for, is the old file if the file is
+the new one.
 """
 
 import collections
@@ -26,12 +27,22 @@ SAVED = (0, 5)
 NEVER_FAIL = {"exit_group", "rt_sigreturn", "munmap"}
 
 
+def read(path):
+    try:
+        with open(path, encoding="utf-8") as file:
+            return file.read()
+    except FileNotFoundError:
+        return None
+
+
 class Save:
-    def __init__(self, strace, kxconfig, folder):
+    def __init__(self, strace, kxconfig, folder, options):
         self.strace = strace
         self.kxconfig = kxconfig
         self.folder = folder
+        self.options = options
         self.file = os.path.join(folder, "cfg.xml")
+        self.backup = self.file + "~"
         self.log = os.path.join(os.path.dirname(folder), "log")
 
     def reset(self):
@@ -47,7 +58,7 @@ class Save:
         command = [self.strace, "-o", self.log]
         for injection in injections:
             command += ["-e", "inject=" + injection]
-        command += [self.kxconfig, "set", self.file, "cfg.name", "new"]
+        command += [self.kxconfig, "set", self.file, "cfg.name", "new"] + self.options
         return subprocess.run(command, stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL, check=False).returncode
 
     def calls(self, injections):
@@ -67,21 +78,22 @@ class Save:
 
     def faults(self, status, debris_allowed):
         """Yields what is wrong after a run."""
-        with open(self.file, encoding="utf-8") as file:
-            content = file.read()
+        content = read(self.file)
         if content not in (OLD, NEW):
             yield f"the file is neither old nor new: {content!r}"
         if os.stat(self.file).st_mode & 0o7777 != MODE:
             yield "the permissions changed"
         if status >= 0 and (content == NEW) != (status in SAVED):
             yield f"status {status}, but the file is {'new' if content == NEW else 'old'}"
-        rest = [name for name in os.listdir(self.folder) if name != "cfg.xml"]
+        if "--backup" in self.options and content == NEW and read(self.backup) != OLD:
+            yield "the backup is not the old file"
+        rest = [name for name in os.listdir(self.folder) if name not in ("cfg.xml", "cfg.xml~")]
         if len(rest) > debris_allowed or not all(DEBRIS.fullmatch(name) for name in rest):
             yield f"left behind: {rest}"
         if subprocess.run([self.kxconfig, "set", self.file, "cfg.name", "next"], check=False,
                           stdout=subprocess.DEVNULL).returncode != 0:
             yield "the next update fails"
-        if os.listdir(self.folder) != ["cfg.xml"]:
+        if not set(os.listdir(self.folder)) <= {"cfg.xml", "cfg.xml~"}:
             yield f"the next update leaves {os.listdir(self.folder)}"
 
 
@@ -135,11 +147,13 @@ def main():
     with tempfile.TemporaryDirectory(dir="/dev/shm" if os.access("/dev/shm", os.W_OK) else None) as parent:
         folder = os.path.join(parent, "folder")
         os.mkdir(folder)
-        save = Save(strace, kxconfig, folder)
-        ways = {"unnamed": [], "named": [f"openat:error=EOPNOTSUPP:when={number_of_unnamed(save)}"]}
+        save = Save(strace, kxconfig, folder, [])
+        backup = Save(strace, kxconfig, folder, ["--backup"])
+        named = [f"openat:error=EOPNOTSUPP:when={number_of_unnamed(save)}"]
+        ways = {"unnamed": (save, []), "named": (save, named), "with a backup": (backup, [])}
         failed = 0
-        for way, always in ways.items():
-            runs, faults = check(save, way, always)
+        for way, (attempt, always) in ways.items():
+            runs, faults = check(attempt, way, always)
             print(f"{way}: {runs} broken saves, {faults} faults")
             failed += faults
             if runs == 0:

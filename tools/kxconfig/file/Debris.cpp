@@ -1,7 +1,5 @@
 #include "file/Debris.h"
 
-#include "file/Place.h"
-
 #include <memory>
 #include <random>
 
@@ -31,17 +29,26 @@ bool IsRegular(int folder, const char* name)
     return fstatat(folder, name, &status, AT_SYMLINK_NOFOLLOW) == 0 && S_ISREG(status.st_mode);
 }
 
-/** A save holds the lock on its file until the file has its place or is removed. */
-void RemoveUnlessLocked(int folder, const char* name)
+/**
+ * A save holds the lock on its file until the file has its place or is removed. A second name of
+ * the file that is to be replaced belongs to no other save: the caller has the lock on it.
+ */
+bool IsStale(const Place& place, int file)
 {
-    if (!IsRegular(folder, name))
+    return flock(file, LOCK_EX | LOCK_NB) == 0 || (errno == EWOULDBLOCK && place.Has(file));
+}
+
+void RemoveIfStale(const Place& place, const char* name)
+{
+    if (!IsRegular(place.Folder(), name))
     {
         return;
     }
-    const Descriptor file(openat(folder, name, O_RDWR | O_CLOEXEC | O_NOFOLLOW | O_NONBLOCK));
-    if (file && flock(file.Get(), LOCK_EX | LOCK_NB) == 0)
+    const Descriptor file(
+        openat(place.Folder(), name, O_RDWR | O_CLOEXEC | O_NOFOLLOW | O_NONBLOCK));
+    if (file && IsStale(place, file.Get()))
     {
-        unlinkat(folder, name, 0);
+        unlinkat(place.Folder(), name, 0);
     }
 }
 
@@ -59,16 +66,16 @@ std::string NameOfReplacement()
     return name + g_end;
 }
 
-void RemoveDebris(int folder)
+void RemoveDebris(const Place& place)
 {
-    const int list = openat(folder, ".", O_RDONLY | O_DIRECTORY | O_CLOEXEC);
+    const int list = openat(place.Folder(), ".", O_RDONLY | O_DIRECTORY | O_CLOEXEC);
     const std::unique_ptr<DIR, int (*)(DIR*)> entries(list < 0 ? nullptr : fdopendir(list),
                                                       closedir);
     while (const dirent* const entry = entries ? readdir(entries.get()) : nullptr)
     {
         if (IsNameOfReplacement(entry->d_name))
         {
-            RemoveUnlessLocked(folder, entry->d_name);
+            RemoveIfStale(place, entry->d_name);
         }
     }
 }

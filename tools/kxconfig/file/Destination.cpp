@@ -156,7 +156,7 @@ void Destination::Replace(const std::string& bytes, const Options& options)
     RequireWritable();
     if (!options.dryRun)
     {
-        RemoveDebris(m_place->Folder());
+        RemoveDebris(*m_place);
     }
     const std::unique_ptr<Replacement> replacement = MakeReplacement();
     WriteAll(replacement->File(), bytes);
