@@ -6,6 +6,7 @@
 #include "file/Insertion.h"
 #include "file/Locations.h"
 #include "file/Nodes.h"
+#include "file/StoredText.h"
 #include "output/Failure.h"
 #include "output/Quoting.h"
 
@@ -59,6 +60,7 @@ xmlNode* AddAttribute(xmlNode* element, const AddArguments& arguments)
     const auto added =
         reinterpret_cast<xmlNode*>(xmlHasNsProp(element, kx::ToEngine(arguments.name), nullptr));
     CXmlNode(added).SetContent(arguments.content); // as XML text, like that of an element
+    RequireStored(added, arguments.content);
     return added;
 }
 
@@ -80,10 +82,7 @@ std::vector<xmlNode*> AddNodes(const std::vector<xmlNode*>& places, const AddArg
     for (xmlNode* const place : places)
     {
         added.push_back(AddNode(place, arguments));
-        if (!error.IsNone())
-        {
-            RefuseValue(g_bareAmpersand);
-        }
+        error.RequireMemory();
         if (added.back() == nullptr)
         {
             throw std::bad_alloc();

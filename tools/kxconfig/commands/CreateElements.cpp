@@ -3,6 +3,7 @@
 #include "file/Engine.h"
 #include "file/Insertion.h"
 #include "file/Nodes.h"
+#include "file/StoredText.h"
 #include "output/Failure.h"
 #include "output/Quoting.h"
 
@@ -89,6 +90,7 @@ void Fill(xmlNode* element, const std::string& value, const std::string& key,
     }
     changes.NoteChanged(element, "");
     CXmlNode(element).SetContent(value);
+    RequireStored(element, value);
 }
 
 } // namespace

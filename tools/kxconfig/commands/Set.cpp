@@ -7,6 +7,7 @@
 #include "file/Engine.h"
 #include "file/Load.h"
 #include "file/Nodes.h"
+#include "file/StoredText.h"
 #include "output/Failure.h"
 #include "output/Quoting.h"
 #include "output/Report.h"
@@ -57,10 +58,7 @@ void Update(CXMLWriter& writer, const KeyValue& pair, const std::string& file)
 {
     const FirstEngineError error;
     const int status = writer.SetValue(pair.key, pair.value);
-    if (!error.IsNone())
-    {
-        RefuseValue(g_bareAmpersand);
-    }
+    error.RequireMemory();
     if (status == kx::StatusNotFound)
     {
         throw Failure(ExitStatus::NothingFound, "nothing found: no element of " + file +
@@ -90,6 +88,14 @@ std::vector<ElementText> TextsOf(const std::vector<const xmlNode*>& elements)
         texts.push_back({element, ContentOf(element)});
     }
     return texts;
+}
+
+void RequireStored(const std::vector<ElementText>& texts, const std::string& value)
+{
+    for (const ElementText& text : texts)
+    {
+        RequireStored(text.element, value);
+    }
 }
 
 /** @return those of @p texts that are not those of their elements any more. */
@@ -141,6 +147,7 @@ public:
         }
         const auto texts = TextsOf(ElementsOfUpdate(DocumentOf(m_reader), pair.key));
         Update(m_writer.Get(), pair, m_arguments.file);
+        RequireStored(texts, pair.value);
         m_edit.RequireTexts(DocumentOf(m_reader), pair.value);
         const std::vector<ElementText> changed = Changed(texts);
         m_edit.Warn(ReachWarning(pair.key, changed, found));

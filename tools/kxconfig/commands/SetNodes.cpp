@@ -5,6 +5,7 @@
 #include "file/Engine.h"
 #include "file/Locations.h"
 #include "file/Nodes.h"
+#include "file/StoredText.h"
 #include "output/Failure.h"
 #include "output/Quoting.h"
 
@@ -57,10 +58,8 @@ void SetContent(xmlNode* node, const std::string& value)
 {
     const FirstEngineError error;
     CXmlNode(node).SetContent(value);
-    if (!error.IsNone())
-    {
-        RefuseValue(g_bareAmpersand);
-    }
+    error.RequireMemory();
+    RequireStored(node, value);
 }
 
 } // namespace

@@ -2,6 +2,7 @@
 
 #include "CXmlNode.h"
 #include "file/Nodes.h"
+#include "file/StoredText.h"
 
 #include "engine/Node.h"
 
@@ -60,6 +61,7 @@ xmlNode* AddElement(xmlNode* parent, xmlNode* after, const std::string& name,
         return nullptr;
     }
     xmlNode* const added = parent->last;
+    RequireStored(added, content);
     if (before != nullptr)
     {
         xmlAddNextSibling(before, added); // the library adds at the end only

@@ -3,6 +3,7 @@
 #include "file/Engine.h"
 
 #include <memory>
+#include <new>
 
 namespace
 {
@@ -33,6 +34,22 @@ std::string KindOf(const xmlNode* node)
     }
 }
 
+/** Other nodes can have none. */
+bool HasContent(const xmlNode* node)
+{
+    return node->type == XML_ELEMENT_NODE || node->type == XML_ATTRIBUTE_NODE ||
+           (node->type == XML_TEXT_NODE && node->content != nullptr);
+}
+
+/** Engines from 2.13 on do not report that they are short of memory. */
+void RequireMemory(bool isThere)
+{
+    if (!isThere)
+    {
+        throw std::bad_alloc();
+    }
+}
+
 } // namespace
 
 std::string Taken(xmlChar* text)
@@ -57,9 +74,12 @@ std::string LineOf(const xmlNode* node)
 std::string ContentOf(const xmlNode* node)
 {
     const FirstEngineError error;
-    std::string content = Taken(xmlNodeGetContent(const_cast<xmlNode*>(node)));
+    xmlChar* const content = xmlNodeGetContent(const_cast<xmlNode*>(node));
+    const bool isMissing = content == nullptr && HasContent(node);
+    std::string text = Taken(content);
     error.RequireMemory();
-    return content;
+    RequireMemory(!isMissing);
+    return text;
 }
 
 std::string NameWithPrefix(const xmlNode* node)
@@ -95,17 +115,16 @@ std::string WhyNoValue(const xmlNode* element)
 
 bool HasAttribute(const xmlNode* element, const std::string& name)
 {
-    const FirstEngineError error;
-    xmlChar* const text = xmlGetProp(const_cast<xmlNode*>(element), kx::ToEngine(name));
-    xmlFree(text);
-    error.RequireMemory();
-    return text != nullptr;
+    return xmlHasProp(const_cast<xmlNode*>(element), kx::ToEngine(name)) != nullptr;
 }
 
 std::string AttributeOf(const xmlNode* element, const std::string& name)
 {
     const FirstEngineError error;
-    std::string text = Taken(xmlGetProp(const_cast<xmlNode*>(element), kx::ToEngine(name)));
+    xmlChar* const value = xmlGetProp(const_cast<xmlNode*>(element), kx::ToEngine(name));
+    const bool isMissing = value == nullptr && HasAttribute(element, name);
+    std::string text = Taken(value);
     error.RequireMemory();
+    RequireMemory(!isMissing);
     return text;
 }
