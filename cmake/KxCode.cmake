@@ -34,6 +34,17 @@ function(kx_host_code target)
     endif()
 endfunction()
 
+# Sources that are compiled together, a dozen at a time: what many of them include and instantiate costs most of the
+# time. Names in their unnamed namespaces must differ.
+option(KX_COMPILE_IN_BATCHES "Compile sources of the client and of the tests together" ON)
+function(kx_in_batches target)
+    set_target_properties(${target} PROPERTIES UNITY_BUILD ${KX_COMPILE_IN_BATCHES} UNITY_BUILD_BATCH_SIZE 12)
+    if(KX_COMPILE_IN_BATCHES AND CMAKE_CXX_COMPILER_ID STREQUAL "GNU")
+        # GCC takes a source that is included for a header, whose unnamed namespace would be a mistake.
+        target_compile_options(${target} PRIVATE -Wno-subobject-linkage)
+    endif()
+endfunction()
+
 # Code that calls the engine. A newer engine may deprecate a call for which the oldest one that is supported has
 # no replacement, which is worth knowing but no error. The engine's headers can pull in ICU's, whose C++ face
 # needs C++11.

@@ -1,5 +1,7 @@
 #include "CXMLReader.h"
 
+#include "Messages.h"
+
 #include "support/Engine.h"
 #include "support/Expect.h"
 #include "support/Files.h"
@@ -15,8 +17,6 @@ using namespace kxtest;
 
 namespace
 {
-
-const char* const kNoDocument = "Document structure pointer m_pXmlDoc is NULL";
 
 // The document that the suite talks about.
 const char* const kNets = "<cfg>"
@@ -588,14 +588,14 @@ TEST_F(LookupTest, WithoutADocumentIsMissing)
 {
     CXMLReader reader;
     ExpectMissing(reader, "cfg.name",
-                  {Trace("GetValue", "Key cfg.name"), Error("GetValue", kNoDocument)},
-                  {Trace("GetValue", "+"), Error("GetValue", kNoDocument), Trace("GetValue", "-")});
+                  {Trace("GetValue", "Key cfg.name"), Error("GetValue", kNoMemberDocument)},
+                  {Trace("GetValue", "+"), Error("GetValue", kNoMemberDocument), Trace("GetValue", "-")});
 }
 
 TEST_F(LookupTest, EmptyKeyIsMissing)
 {
-    ExpectMissing(*m_reader, "", {Trace("GetValue", "Key "), Error("GetValue", kNoDocument)},
-                  {Trace("GetValue", "+"), Error("GetValue", kNoDocument), Trace("GetValue", "-")});
+    ExpectMissing(*m_reader, "", {Trace("GetValue", "Key "), Error("GetValue", kNoMemberDocument)},
+                  {Trace("GetValue", "+"), Error("GetValue", kNoMemberDocument), Trace("GetValue", "-")});
 }
 
 TEST_F(LookupTest, WithoutARootElementIsMissing)

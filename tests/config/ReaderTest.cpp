@@ -1,5 +1,7 @@
 #include "CXMLReader.h"
 
+#include "Messages.h"
+
 #include "support/Engine.h"
 #include "support/Expect.h"
 #include "support/Files.h"
@@ -20,8 +22,6 @@ using namespace kxtest;
 
 namespace
 {
-
-const char* const kNoDocument = "Pointer to document structure is NULL";
 
 static_assert(std::is_base_of<IConfigReader, CXMLReader>::value, "");
 static_assert(!std::is_copy_constructible<CXMLReader>::value, "");

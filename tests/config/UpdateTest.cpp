@@ -1,5 +1,7 @@
 #include "CXMLWriter.h"
 
+#include "Messages.h"
+
 #include "support/Engine.h"
 #include "support/Files.h"
 #include "support/Log.h"
@@ -16,8 +18,6 @@ using namespace kxtest;
 
 namespace
 {
-
-const char* const kNoDocument = "Document structure pointer m_pXmlDoc is NULL";
 
 /** What an update answers and what the document then looks like, without declaration. */
 struct Result
@@ -367,14 +367,14 @@ TEST_F(UpdateTest, WithoutADocumentOrAKeyIsABadArgument)
     CXMLWriter writer;
     LogRecorder log;
     EXPECT_EQ(7, writer.SetValue("cfg.a", "2"));
-    EXPECT_EQ(Records({Trace("SetValue", "Key cfg.a"), Error("SetValue", kNoDocument)}),
+    EXPECT_EQ(Records({Trace("SetValue", "Key cfg.a"), Error("SetValue", kNoMemberDocument)}),
               log.Take());
     EXPECT_EQ(7, writer.SetValue("", "2"));
-    EXPECT_EQ(Records({Trace("SetValue", "Key "), Error("SetValue", kNoDocument)}), log.Take());
+    EXPECT_EQ(Records({Trace("SetValue", "Key "), Error("SetValue", kNoMemberDocument)}), log.Take());
     Load("<cfg/>");
     writer.SetDataPtr(m_document);
     EXPECT_EQ(7, writer.SetValue("", "2"));
-    EXPECT_EQ(Records({Trace("SetValue", "Key "), Error("SetValue", kNoDocument)}), log.Take());
+    EXPECT_EQ(Records({Trace("SetValue", "Key "), Error("SetValue", kNoMemberDocument)}), log.Take());
     writer.SetDataPtr(nullptr);
 }
 

@@ -2,6 +2,8 @@
 
 #include "CXMLReader.h"
 
+#include "Messages.h"
+
 #include "support/Engine.h"
 #include "support/Expect.h"
 #include "support/Files.h"
@@ -21,7 +23,6 @@ using namespace kxtest;
 namespace
 {
 
-const char* const kNoDocument = "Pointer to document structure is NULL";
 const char* const kNoData = "Data Pointer not set in xml writer";
 
 static_assert(std::is_base_of<IConfigWriter, CXMLWriter>::value, "");

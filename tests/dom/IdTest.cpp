@@ -10,7 +10,7 @@ using namespace kxtest;
 namespace
 {
 
-const char* const kXml = "<!DOCTYPE r [<!ENTITY e 'x'> <!ATTLIST b id ID #IMPLIED>]>"
+const char* const kDeclaredId = "<!DOCTYPE r [<!ENTITY e 'x'> <!ATTLIST b id ID #IMPLIED>]>"
                          "<r><b id='kept'/><a><b id='plain'>one</b><c><d/><b id='i&e;'>two</b></c>"
                          "<b id='after'>three</b></a></r>";
 /** Failing this many requests in turn is more than any of the operations asks for. */
@@ -66,7 +66,7 @@ protected:
         for (std::size_t failing = 0; failing <= kRequests; ++failing)
         {
             SCOPED_TRACE(xpath + ", request " + std::to_string(failing) + " fails");
-            const xmlDocPtr document = Parse(kXml);
+            const xmlDocPtr document = Parse(kDeclaredId);
             const xmlNodePtr element = NodeOf(document, xpath);
             const std::size_t expected = Ids(document) - IdsIn(element) + left(element);
             EngineMemory::FailAt(failing);
@@ -140,7 +140,7 @@ protected:
 
 TEST_F(IdTest, EngineKnowsTheIdsThatTheSuiteIsAbout)
 {
-    const xmlDocPtr document = Parse(kXml);
+    const xmlDocPtr document = Parse(kDeclaredId);
     EXPECT_EQ(1u, IdsIn(NodeOf(document, "//b[. = 'one']")));
     EXPECT_LE(2u, IdsIn(NodeOf(document, "/r/a")));
     EXPECT_EQ(1 + IdsIn(NodeOf(document, "/r/a")), Ids(document));
@@ -159,7 +159,7 @@ TEST_F(IdTest, ChangedAttributeIsFoundUnderItsOldValueUntilItIsFreed)
 {
     for (const auto& change : kValueChanges)
     {
-        const xmlDocPtr document = Parse(kXml);
+        const xmlDocPtr document = Parse(kDeclaredId);
         const xmlNodePtr b = NodeOf(document, "//b[. = 'one']");
         EXPECT_EQ(0, change(b));
         EXPECT_EQ(b, NodeOf(document, "id('plain')"));
@@ -275,7 +275,7 @@ TEST_F(IdTest, NoOrderOfCallsLeavesAFreedAttributeInTheTable)
         [](xmlDocPtr document) { Change(document, "(//b)[last()]/@id"); }};
     // Without an entity the DTD can be removed.
     for (const char* const xml :
-         {kXml, "<!DOCTYPE r [<!ATTLIST b id ID #IMPLIED>]><r><b id='kept'/>"
+         {kDeclaredId, "<!DOCTYPE r [<!ATTLIST b id ID #IMPLIED>]><r><b id='kept'/>"
                 "<a><b id='plain'>one</b><b id='i'>two</b></a></r>"})
     {
         ExpectSoundIdsInAnyOrder(xml, calls);
@@ -298,7 +298,7 @@ TEST_F(IdTest, AttributeThatIsInTheTableTwiceIsForgottenUnderBothValues)
         {
             for (std::size_t failing = 0; failing <= kRequests; ++failing)
             {
-                const xmlDocPtr document = Parse(kXml);
+                const xmlDocPtr document = Parse(kDeclaredId);
                 const xmlNodePtr b = NodeOf(document, "//b[. = 'one']");
                 EXPECT_EQ(0, change(b));
                 SetId(b, "second");
@@ -368,7 +368,7 @@ TEST_F(IdTest, RemovalOfManyLeavesTheIdsOfAllOthers)
 TEST_F(IdTest, AttributeThatAClientFreedIsNotRead)
 {
     // Up to 2.12 the engine's own call leaves the former value in the table.
-    const xmlDocPtr document = Parse(kXml);
+    const xmlDocPtr document = Parse(kDeclaredId);
     EXPECT_EQ(0, CXmlNode(NodeOf(document, "//b/@id")).SetContent("other"));
     EXPECT_EQ(0, xmlRemoveProp(NodeOf(document, "//b")->properties));
     EXPECT_EQ(0, CXmlNode(NodeOf(document, "/r/a")).ClearNode());
@@ -378,7 +378,7 @@ TEST_F(IdTest, AttributeThatAClientFreedIsNotRead)
 TEST_F(IdTest, EntryWithoutAnAttributeStays)
 {
     // A reader that validates frees the attributes on its way, and keeps the values.
-    const xmlDocPtr document = Parse(kXml);
+    const xmlDocPtr document = Parse(kDeclaredId);
     const auto kept = reinterpret_cast<const xmlChar*>("kept");
     static_cast<xmlIDPtr>(xmlHashLookup(static_cast<xmlHashTablePtr>(document->ids), kept))->attr =
         nullptr;
@@ -418,7 +418,7 @@ TEST_F(IdTest, AttributeThatCouldNotBeMadeWholeIsForgotten)
 
 TEST_F(IdTest, ValueCanBeGivenToAnotherOnceItIsForgotten)
 {
-    const xmlDocPtr document = Parse(kXml);
+    const xmlDocPtr document = Parse(kDeclaredId);
     EXPECT_EQ(0, RemoveNode(NodeOf(document, "id('plain')")));
     CXmlNode added = CXmlNode(NodeOf(document, "/r/a")).AddChildNode("b", "");
     EXPECT_EQ(0, added.AddNewAttribute("id", "plain"));
@@ -438,7 +438,7 @@ TEST_F(IdTest, OtherAttributesWithTheValueOfAnIdLeaveItAlone)
 
 TEST_F(IdTest, ElementWhoseContentIsReplacedKeepsItsId)
 {
-    const xmlDocPtr document = Parse(kXml);
+    const xmlDocPtr document = Parse(kDeclaredId);
     EXPECT_EQ(0, CXmlNode(NodeOf(document, "//b[. = 'one']")).SetContent("new"));
     EXPECT_NE(nullptr, NodeOf(document, "id('plain')"));
 }
@@ -446,7 +446,7 @@ TEST_F(IdTest, ElementWhoseContentIsReplacedKeepsItsId)
 TEST_F(IdTest, AttributesOfAnXIncludeMarkAreForgottenToo)
 {
     // The mark is the element that it replaces, with all its fields.
-    const xmlDocPtr document = Parse(kXml);
+    const xmlDocPtr document = Parse(kDeclaredId);
     const xmlNodePtr mark = NodeOf(document, "id('plain')");
     mark->type = XML_XINCLUDE_START;
     EXPECT_EQ(0, CXmlNode(AttributeOf(mark)).SetContent("other"));

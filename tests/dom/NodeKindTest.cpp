@@ -17,7 +17,7 @@ using namespace kxtest;
 namespace
 {
 
-const char* const kXml = "<!DOCTYPE a [\n"
+const char* const kEveryKind = "<!DOCTYPE a [\n"
                          "<!--in the DTD-->\n"
                          "<!ELEMENT a ANY>\n"
                          "<!ATTLIST a id ID #IMPLIED d CDATA \"dflt\">\n"
@@ -379,7 +379,7 @@ public:
         }
         else
         {
-            m_document = ParseText(kXml);
+            m_document = ParseText(kEveryKind);
         }
         m_node = Find(title);
     }
@@ -861,7 +861,7 @@ protected:
 TEST_F(NodeTest, EntityWhoseContentLiesInTheDocumentIsNotCleared)
 {
     // As some engines leave it when they replace references while parsing.
-    const xmlDocPtr document = Parse(kXml);
+    const xmlDocPtr document = Parse(kEveryKind);
     const auto entity = xmlGetDocEntity(document, reinterpret_cast<const xmlChar*>("m"));
     const xmlNodePtr own = entity->children;
     entity->children = entity->last = NodeOf(document, "/a/b");
@@ -886,7 +886,7 @@ TEST_F(NodeTest, DeclarationThatWasMovedBelowAnElementIsNotRemovedByName)
 
 TEST_F(NodeTest, ClearedDocumentTakesANewRoot)
 {
-    const xmlDocPtr document = Parse(kXml);
+    const xmlDocPtr document = Parse(kEveryKind);
     CXmlNode handle(reinterpret_cast<xmlNodePtr>(document));
     EXPECT_EQ(0, handle.ClearNode());
     EXPECT_EQ("<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n", Serialized(document));

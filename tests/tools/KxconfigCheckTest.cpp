@@ -15,8 +15,6 @@ using testing::HasSubstr;
 namespace
 {
 
-const std::string kDeclaration = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n";
-
 class KxconfigCheck : public ToolTest
 {
 protected:

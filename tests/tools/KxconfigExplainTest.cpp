@@ -10,8 +10,6 @@ using testing::Not;
 namespace
 {
 
-const std::string kGateway = KX_EXAMPLE_DATA "/gateway.xml";
-
 class KxconfigExplain : public ToolTest
 {
 protected:

@@ -17,8 +17,6 @@ using testing::StartsWith;
 namespace
 {
 
-const std::string kGateway = KX_EXAMPLE_DATA "/gateway.xml";
-
 class KxconfigGet : public ToolTest
 {
 protected:

@@ -14,8 +14,6 @@ using namespace kxtest;
 namespace
 {
 
-const std::string kDeclaration = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n";
-
 /** What becomes of the file when it is saved, whatever else happens. */
 class KxconfigSave : public ToolTest
 {

@@ -13,8 +13,6 @@ using namespace kxtest;
 namespace
 {
 
-const std::string kDeclaration = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n";
-
 class KxconfigSet : public ToolTest
 {
 protected:

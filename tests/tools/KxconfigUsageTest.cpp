@@ -13,8 +13,6 @@ using testing::Not;
 namespace
 {
 
-const std::string kGateway = KX_EXAMPLE_DATA "/gateway.xml";
-
 class KxconfigUsage : public ToolTest
 {
 protected:

@@ -17,6 +17,12 @@
 #include <stdlib.h>
 #include <unistd.h>
 
+/** An example of a device's configuration. */
+inline const std::string kGateway = KX_EXAMPLE_DATA "/gateway.xml";
+
+/** What each saved file begins with. */
+inline const std::string kDeclaration = "<?xml version=\"1.0\" encoding=\"UTF-8\"?>\n";
+
 /** Runs kxconfig. */
 class ToolTest : public testing::Test
 {

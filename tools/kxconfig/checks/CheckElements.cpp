@@ -125,14 +125,14 @@ struct Repeat
 };
 
 /** The elements of a group that bear the same distinguishing attributes. */
-using Bearers = std::map<Attributes, Group>;
+using Alike = std::map<Attributes, Group>;
 
 /** @return whether the attributes seem to identify elements, so that a repeat is a mistake: those
  * that do repeat are no more than the elements that are distinguished. */
-bool Identify(const Bearers& bearers)
+bool Identify(const Alike& alike)
 {
     std::ptrdiff_t balance = 0;
-    for (const auto& [attributes, elements] : bearers)
+    for (const auto& [attributes, elements] : alike)
     {
         const bool isUnique = elements.size() == 1;
         balance += isUnique ? 1 : attributes.empty() ? 0 : -1;
@@ -143,18 +143,18 @@ bool Identify(const Bearers& bearers)
 /** @param distinguishing  what DistinguishingAttributes() gives for @p group. */
 std::vector<Repeat> RepeatsIn(const Group& group, const std::vector<Attributes>& distinguishing)
 {
-    Bearers bearers;
+    Alike groups;
     std::vector<Repeat> repeats;
     for (size_t i = 0; i != group.size(); ++i)
     {
-        Group& alike = bearers[distinguishing[i]];
+        Group& alike = groups[distinguishing[i]];
         alike.push_back(group[i]);
         if (alike.size() > 1 && !distinguishing[i].empty())
         {
             repeats.push_back({group[i], alike.front(), &distinguishing[i]});
         }
     }
-    return Identify(bearers) ? repeats : std::vector<Repeat>();
+    return Identify(groups) ? repeats : std::vector<Repeat>();
 }
 
 void CheckGroup(const Group& group, const Levels& levels, Findings& findings)

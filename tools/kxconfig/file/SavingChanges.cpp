@@ -146,11 +146,11 @@ std::string TakeDeclaration(std::istream& file)
 }
 
 /** Compares a file with what the engine writes, while it writes. */
-class Comparison
+class SavedTextComparison
 {
 public:
     /** @param file  behind the XML declaration. */
-    explicit Comparison(std::istream& file) : m_file(file) {}
+    explicit SavedTextComparison(std::istream& file) : m_file(file) {}
 
     /** Compares with what @p document would be saved as; throws if memory runs out. */
     void Run(xmlDoc* document)
@@ -179,13 +179,13 @@ private:
     {
         try
         {
-            static_cast<Comparison*>(self)->Take({bytes, static_cast<size_t>(size)});
+            static_cast<SavedTextComparison*>(self)->Take({bytes, static_cast<size_t>(size)});
         }
         catch (const std::bad_alloc&)
         {
             return -1; // no exception passes through the engine
         }
-        return static_cast<Comparison*>(self)->IsDone() ? -1 : size; // the rest is not needed
+        return static_cast<SavedTextComparison*>(self)->IsDone() ? -1 : size; // the rest is not needed
     }
 
     bool IsDone() const { return m_place && m_place->after.size() > kBytesBefore + kBytesAfter; }
@@ -283,7 +283,7 @@ std::vector<Difference> Compare(std::istream& file, xmlDoc* document)
         differences.push_back({1, "the byte order mark, which is removed"});
     }
     const std::string declaration = TakeDeclaration(file);
-    Comparison comparison(file);
+    SavedTextComparison comparison(file);
     comparison.Run(document);
     if (declaration != comparison.Declaration())
     {

@@ -4,16 +4,6 @@
 
 #include <nlohmann/json.hpp>
 
-namespace
-{
-
-Json OrNull(const std::optional<std::string>& text)
-{
-    return text ? Json(*text) : Json();
-}
-
-} // namespace
-
 std::string Change::Line() const
 {
     if (!before)

@@ -54,16 +54,15 @@ std::string Colored(Color color, const std::string& text)
     return StartOf(color) + text + "\x1B[0m";
 }
 
-/** @return the text as JSON, or null if there is none. */
-Json OrNull(const std::optional<std::string>& text)
-{
-    return text ? Json(*text) : Json();
-}
-
 /** The status of a process that ends short of memory. */
 std::atomic<ExitStatus> g_failure{ExitStatus::NotSaved};
 
 } // namespace
+
+Json OrNull(const std::optional<std::string>& text)
+{
+    return text ? Json(*text) : Json();
+}
 
 void EndTerminated()
 {

@@ -12,6 +12,9 @@
 
 using Json = nlohmann::ordered_json;
 
+/** @return the text as JSON, or null if there is none. */
+Json OrNull(const std::optional<std::string>& text);
+
 enum class Color
 {
     Good,

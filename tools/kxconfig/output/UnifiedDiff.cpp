@@ -46,10 +46,10 @@ struct Part
 };
 
 /** Finds the parts that differ. */
-class Comparison
+class LineComparison
 {
 public:
-    Comparison(const Lines& before, const Lines& after)
+    LineComparison(const Lines& before, const Lines& after)
     {
         std::unordered_map<std::string_view, size_t> numbers;
         m_before = Numbered(before, numbers);
@@ -378,7 +378,7 @@ std::string UnifiedDiff(const NamedText& before, const NamedText& after)
 {
     const Lines linesBefore = Split(before.text);
     const Lines linesAfter = Split(after.text);
-    const std::vector<Part> parts = Joined(Comparison(linesBefore, linesAfter).Differences());
+    const std::vector<Part> parts = Joined(LineComparison(linesBefore, linesAfter).Differences());
     std::string diff = parts.empty() ? "" : "--- " + before.name + "\n+++ " + after.name + "\n";
     for (auto first = parts.begin(); first != parts.end();)
     {
