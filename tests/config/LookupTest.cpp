@@ -587,15 +587,17 @@ TEST_F(LookupTest, KeyAndValueMayBeOneString)
 TEST_F(LookupTest, WithoutADocumentIsMissing)
 {
     CXMLReader reader;
-    ExpectMissing(reader, "cfg.name",
-                  {Trace("GetValue", "Key cfg.name"), Error("GetValue", kNoMemberDocument)},
-                  {Trace("GetValue", "+"), Error("GetValue", kNoMemberDocument), Trace("GetValue", "-")});
+    ExpectMissing(
+        reader, "cfg.name",
+        {Trace("GetValue", "Key cfg.name"), Error("GetValue", kNoMemberDocument)},
+        {Trace("GetValue", "+"), Error("GetValue", kNoMemberDocument), Trace("GetValue", "-")});
 }
 
 TEST_F(LookupTest, EmptyKeyIsMissing)
 {
-    ExpectMissing(*m_reader, "", {Trace("GetValue", "Key "), Error("GetValue", kNoMemberDocument)},
-                  {Trace("GetValue", "+"), Error("GetValue", kNoMemberDocument), Trace("GetValue", "-")});
+    ExpectMissing(
+        *m_reader, "", {Trace("GetValue", "Key "), Error("GetValue", kNoMemberDocument)},
+        {Trace("GetValue", "+"), Error("GetValue", kNoMemberDocument), Trace("GetValue", "-")});
 }
 
 TEST_F(LookupTest, WithoutARootElementIsMissing)

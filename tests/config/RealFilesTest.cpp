@@ -44,9 +44,9 @@ TEST(RealFiles, MimeTypes)
     EXPECT_EQ("eXtensible Markup Language", ValueIn(kMimeTypes, xml + "expanded-acronym"));
     EXPECT_EQ("Документ XML", ValueIn(kMimeTypes, xml + "comment@lang=ru"));
     EXPECT_EQ("Tài liệu XML", ValueIn(kMimeTypes, xml + "comment@lang=vi"));
-    EXPECT_EQ(
-        "Atari 2600-rom",
-        ValueIn(kMimeTypes, "mime-info.mime-type@type=application/x-atari-2600-rom.comment@lang=sv"));
+    EXPECT_EQ("Atari 2600-rom",
+              ValueIn(kMimeTypes,
+                      "mime-info.mime-type@type=application/x-atari-2600-rom.comment@lang=sv"));
 }
 
 TEST(RealFiles, Keyboards)
@@ -58,7 +58,8 @@ TEST(RealFiles, Keyboards)
     const std::string languages =
         ValueIn(kKeyboards, "xkbConfigRegistry.layoutList.layout.configItem.languageList.iso639Id");
     EXPECT_EQ("eng\ndrs", languages.substr(0, 7));
-    EXPECT_EQ("grp", ValueIn(kKeyboards, "xkbConfigRegistry.optionList.group@allowMultipleSelection="
-                                       "true.configItem.name")
-                         .substr(0, 3));
+    EXPECT_EQ("grp",
+              ValueIn(kKeyboards, "xkbConfigRegistry.optionList.group@allowMultipleSelection="
+                                  "true.configItem.name")
+                  .substr(0, 3));
 }

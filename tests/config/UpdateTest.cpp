@@ -370,11 +370,13 @@ TEST_F(UpdateTest, WithoutADocumentOrAKeyIsABadArgument)
     EXPECT_EQ(Records({Trace("SetValue", "Key cfg.a"), Error("SetValue", kNoMemberDocument)}),
               log.Take());
     EXPECT_EQ(7, writer.SetValue("", "2"));
-    EXPECT_EQ(Records({Trace("SetValue", "Key "), Error("SetValue", kNoMemberDocument)}), log.Take());
+    EXPECT_EQ(Records({Trace("SetValue", "Key "), Error("SetValue", kNoMemberDocument)}),
+              log.Take());
     Load("<cfg/>");
     writer.SetDataPtr(m_document);
     EXPECT_EQ(7, writer.SetValue("", "2"));
-    EXPECT_EQ(Records({Trace("SetValue", "Key "), Error("SetValue", kNoMemberDocument)}), log.Take());
+    EXPECT_EQ(Records({Trace("SetValue", "Key "), Error("SetValue", kNoMemberDocument)}),
+              log.Take());
     writer.SetDataPtr(nullptr);
 }
 

@@ -10,9 +10,10 @@ using namespace kxtest;
 namespace
 {
 
-const char* const kDeclaredId = "<!DOCTYPE r [<!ENTITY e 'x'> <!ATTLIST b id ID #IMPLIED>]>"
-                         "<r><b id='kept'/><a><b id='plain'>one</b><c><d/><b id='i&e;'>two</b></c>"
-                         "<b id='after'>three</b></a></r>";
+const char* const kDeclaredId =
+    "<!DOCTYPE r [<!ENTITY e 'x'> <!ATTLIST b id ID #IMPLIED>]>"
+    "<r><b id='kept'/><a><b id='plain'>one</b><c><d/><b id='i&e;'>two</b></c>"
+    "<b id='after'>three</b></a></r>";
 /** Failing this many requests in turn is more than any of the operations asks for. */
 const std::size_t kRequests = 20;
 
@@ -276,7 +277,7 @@ TEST_F(IdTest, NoOrderOfCallsLeavesAFreedAttributeInTheTable)
     // Without an entity the DTD can be removed.
     for (const char* const xml :
          {kDeclaredId, "<!DOCTYPE r [<!ATTLIST b id ID #IMPLIED>]><r><b id='kept'/>"
-                "<a><b id='plain'>one</b><b id='i'>two</b></a></r>"})
+                       "<a><b id='plain'>one</b><b id='i'>two</b></a></r>"})
     {
         ExpectSoundIdsInAnyOrder(xml, calls);
     }

@@ -18,16 +18,16 @@ namespace
 {
 
 const char* const kEveryKind = "<!DOCTYPE a [\n"
-                         "<!--in the DTD-->\n"
-                         "<!ELEMENT a ANY>\n"
-                         "<!ATTLIST a id ID #IMPLIED d CDATA \"dflt\">\n"
-                         "<!ENTITY e \"words\">\n"
-                         "<!ENTITY m \"<x>one</x>\">\n"
-                         "<!ENTITY % p \"\">\n"
-                         "]>\n"
-                         "<a id=\"i1\" q=\"v &e; w\" xmlns:p=\"urn:p\" "
-                         "p:r=\"s\"><b>text</b>piece<!--comment--><?pi data?>"
-                         "<![CDATA[cdata]]>&m;<c/></a>\n";
+                               "<!--in the DTD-->\n"
+                               "<!ELEMENT a ANY>\n"
+                               "<!ATTLIST a id ID #IMPLIED d CDATA \"dflt\">\n"
+                               "<!ENTITY e \"words\">\n"
+                               "<!ENTITY m \"<x>one</x>\">\n"
+                               "<!ENTITY % p \"\">\n"
+                               "]>\n"
+                               "<a id=\"i1\" q=\"v &e; w\" xmlns:p=\"urn:p\" "
+                               "p:r=\"s\"><b>text</b>piece<!--comment--><?pi data?>"
+                               "<![CDATA[cdata]]>&m;<c/></a>\n";
 
 /** How a kind of node reads. */
 struct Kind

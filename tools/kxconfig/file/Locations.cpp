@@ -168,6 +168,7 @@ uintptr_t MarkOf(const xmlNode* node)
 
 void SetMark(const xmlNode* node, uintptr_t mark)
 {
+    // NOLINTNEXTLINE(performance-no-int-to-ptr): the engine's field is a pointer, the mark is none.
     const_cast<xmlNode*>(node)->_private = reinterpret_cast<void*>(mark);
 }
 

@@ -185,7 +185,8 @@ private:
         {
             return -1; // no exception passes through the engine
         }
-        return static_cast<SavedTextComparison*>(self)->IsDone() ? -1 : size; // the rest is not needed
+        return static_cast<SavedTextComparison*>(self)->IsDone() ? -1
+                                                                 : size; // the rest is not needed
     }
 
     bool IsDone() const { return m_place && m_place->after.size() > kBytesBefore + kBytesAfter; }

@@ -21,6 +21,6 @@ struct Difference
  * What would be saved is compared while the engine produces it; neither it nor the file is held in
  * memory.
  */
-std::vector<Difference> WhatSavingChanges(CXMLReader& reader, const std::string& file);
+std::vector<Difference> WhatSavingChanges(CXMLReader& reader, const std::string& path);
 
 #endif

@@ -342,7 +342,8 @@ std::vector<std::string> Level::ConditionsOf(const xmlNode* element) const
     {
         if (IsFreeOf(".|&=@", name) && IsFreeOf(".|&\t\r\n", value))
         {
-            conditions.push_back("@" + name + "=" + value);
+            std::string& condition = conditions.emplace_back("@");
+            condition.append(name).append("=").append(value);
         }
     }
     return conditions;
