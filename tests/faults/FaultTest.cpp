@@ -6,6 +6,8 @@
 #include "CXMLWriter.h"
 #include "CXmlParser.h"
 
+#include "file/GuestWriter.h"
+
 #include "support/Engine.h"
 #include "support/Expect.h"
 #include "support/Files.h"
@@ -150,21 +152,6 @@ Answer ParseAgain(Objects& objects)
     return Of(status);
 }
 
-/** A writer on a document that a reader owns: whatever happens, it lets go of it. */
-class Borrower
-{
-public:
-    explicit Borrower(CXMLReader& reader) { m_writer.SetDataPtr(reader.GetDataPtr()); }
-    ~Borrower() { m_writer.SetDataPtr(nullptr); }
-    Borrower(const Borrower&) = delete;
-    Borrower& operator=(const Borrower&) = delete;
-
-    int SetValue() { return m_writer.SetValue(kKey, kValue); }
-
-private:
-    CXMLWriter m_writer;
-};
-
 Answer Query(Objects& objects)
 {
     // To name what is seen can need memory as well.
@@ -251,7 +238,7 @@ const Operation kStore[] = {
     {"WriterParseFile", [](Objects& o) { return Of(o.writer.ParseFile(o.file)); }, {{22}}},
     {"SetPath", [](Objects& o) { return Of(o.writer.SetPath(o.file)); }},
     {"SetDataPtr",
-     [](Objects& o) { return Of(Borrower(o.reader).SetValue()); },
+     [](Objects& o) { return Of(GuestWriter(o.reader).Get().SetValue(kKey, kValue)); },
      {{-2}},
      {kEmptied}},
     {"SetValue",

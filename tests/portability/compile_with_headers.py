@@ -4,7 +4,7 @@
 usage: compile_with_headers.py BUILD_FOLDER LIBXML2_INCLUDE_FOLDER [SOURCE_FOLDER...]
 
 Repeats the commands of the build, of all sources or of those in the given folders, and produces no object files. A
-source that several targets compile is compiled once.
+source that several targets compile is compiled once; sources that are compiled as one, so are here.
 """
 import concurrent.futures
 import json
@@ -38,7 +38,8 @@ def compiles(entry, headers):
 
 def selected(entry, folders):
     source = pathlib.Path(entry["file"])
-    return source.suffix == ".cpp" and (not folders or any(source.is_relative_to(folder) for folder in folders))
+    return source.suffix in (".cpp", ".cxx") and (
+        not folders or any(source.is_relative_to(folder) for folder in folders))
 
 
 def main(build, headers, *folders):

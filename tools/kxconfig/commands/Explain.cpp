@@ -1,6 +1,7 @@
 #include "commands/Explain.h"
 
 #include "commands/Narrator.h"
+#include "file/GuestWriter.h"
 #include "file/Load.h"
 #include "file/Nodes.h"
 #include "output/Quoting.h"

@@ -5,6 +5,7 @@
 #include "commands/SetNodes.h"
 #include "commands/ValueArgument.h"
 #include "file/Engine.h"
+#include "file/GuestWriter.h"
 #include "file/Load.h"
 #include "file/Nodes.h"
 #include "file/StoredText.h"

@@ -2,7 +2,6 @@
 #define KX_TOOLS_LOAD_H
 
 #include "CXMLReader.h"
-#include "CXMLWriter.h"
 #include "CXmlParser.h"
 
 #include <functional>
@@ -63,20 +62,5 @@ _xmlDoc* DocumentOf(CXMLReader& reader);
 
 /** @return the root element of the document that @p reader holds. */
 const _xmlNode* RootOf(CXMLReader& reader);
-
-/** A writer on the document of a reader, which keeps owning it. */
-class GuestWriter
-{
-public:
-    explicit GuestWriter(CXMLReader& reader) { m_writer.SetDataPtr(reader.GetDataPtr()); }
-    ~GuestWriter() { m_writer.SetDataPtr(nullptr); }
-    GuestWriter(const GuestWriter&) = delete;
-    GuestWriter& operator=(const GuestWriter&) = delete;
-
-    CXMLWriter& Get() { return m_writer; }
-
-private:
-    CXMLWriter m_writer;
-};
 
 #endif
