@@ -707,3 +707,30 @@ TEST_F(KxconfigCheck, LeavesTheFileAlone)
     EXPECT_EQ("<cfg><a i='1'/></cfg>", ReadFile(m_file));
     EXPECT_EQ(3, Tool({"check", m_folder.Path("missing.xml")}).status);
 }
+
+TEST_F(KxconfigCheck, LeavesOutASuspendedConditionThatIsIgnored)
+{
+    Write("<cfg>\n<net id='1'>a</net>\n<x>b</x>\n<net id='2'>c</net></cfg>");
+    const std::vector<std::string> keys = {"cfg.net@id=1"};
+    EXPECT_THAT(Check({}, keys).out, HasSubstr("[suspended-condition]"));
+    EXPECT_THAT(Check({"--ignore", "suspended-condition"}, keys).out,
+                testing::Not(HasSubstr("[suspended-condition]")));
+}
+
+TEST_F(KxconfigCheck, NamesTheEncodingOfAFileThatIsNoAscii)
+{
+    std::string wide;
+    for (const char c : std::string("<?xml version=\"1.0\"?><cfg/>\n"))
+    {
+        wide += {'\0', '\0', '\0', c};
+    }
+    m_file = m_folder.Write("cfg.xml", wide);
+    ExpectWarningsAndNotes({"1: saving changes every character: UTF-32 becomes UTF-8"});
+    const Outcome converted =
+        RunShell("printf '<?xml version=\"1.0\" encoding=\"IBM037\"?><cfg/>' | iconv -t IBM037");
+    m_file = m_folder.Write("cfg.xml", converted.out);
+    if (converted.status == 0 && Tool({"get", m_file, "cfg.a"}).status != 3) // the engine reads it
+    {
+        ExpectWarningsAndNotes({"1: saving changes every character: IBM037 becomes UTF-8"});
+    }
+}

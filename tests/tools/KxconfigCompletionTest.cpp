@@ -309,3 +309,69 @@ TEST_F(KxconfigCompletion, OffersAFewOfManyKeysWithoutCompletingTooMuch)
     EXPECT_EQ(500, std::count(nets.out.begin(), nets.out.end(), '\n'));
     EXPECT_EQ("cfg.b\n", Tool({"--complete", "get", file, "cfg.b"}).out);
 }
+
+/** What the program offers to any shell. */
+class KxconfigComplete : public ToolTest
+{
+protected:
+    /** @return the lines for the last of @p words. */
+    static std::string Complete(std::vector<std::string> words)
+    {
+        words.insert(words.begin(), "--complete");
+        return Tool(words, {"HOME=/nowhere"}).out;
+    }
+
+    const std::string m_plain = m_folder.Write(
+        "plain.xml", "<cfg><a i='1'>x</a><a i='&#127;'>y</a><a i='&#9;'>z</a></cfg>");
+};
+
+TEST_F(KxconfigComplete, OffersNothingForNoWord)
+{
+    EXPECT_EQ("", Complete({}));
+}
+
+TEST_F(KxconfigComplete, OffersTheWordsOfAnOption)
+{
+    EXPECT_EQ("auto\nalways\nnever\n", Complete({"get", "--color", ""}));
+    EXPECT_EQ("--color=auto\n--color=always\n", Complete({"--color=a"}));
+    EXPECT_EQ("error,warning\n", Complete({"--log-mask", "error,w"}));
+    EXPECT_EQ("several-values\n", Complete({"check", "--only", "sev"}));
+    EXPECT_EQ("", Complete({"--nothing=a"}));
+    EXPECT_EQ("\t\n", Complete({"set", "f.xml", "--output", ""}));
+    EXPECT_EQ("\t--output=\n", Complete({"set", "f.xml", "--output=x"}));
+}
+
+TEST_F(KxconfigComplete, GoesOnAfterTheValueOfAnOption)
+{
+    EXPECT_EQ("\t\n", Complete({"--color", "never", "get", ""}));
+    EXPECT_EQ("\t\n", Complete({"get", "--nothing", ""}));
+    EXPECT_EQ("\t\n", Complete({"get", "--json", ""}));
+}
+
+TEST_F(KxconfigComplete, OffersNoOptionsBehindTheSeparator)
+{
+    EXPECT_EQ("\t\n", Complete({"get", "--", "-"}));
+    EXPECT_EQ("", Complete({"get", "--", "-", "-"}));
+}
+
+TEST_F(KxconfigComplete, OffersKeysWithoutControlCharacters)
+{
+    EXPECT_EQ("cfg.a@i=1\ncfg.a\n", Complete({"get", m_plain, "cfg"}));
+    EXPECT_EQ("cfg.a@i=1\n", Complete({"get", m_plain, "cfg.b", "cfg.a@"}));
+    EXPECT_EQ("cfg.a@i=1\ncfg.a\n", Complete({"keys", m_plain, ""}));
+}
+
+TEST_F(KxconfigComplete, OffersNothingWhereNothingIsKnown)
+{
+    EXPECT_EQ("", Complete({"get", m_folder.Write("broken.xml", "<cfg>"), ""}));
+    EXPECT_EQ("", Complete({"get", m_folder.Path("missing.xml"), ""}));
+    EXPECT_EQ("", Complete({"get", "~/missing.xml", ""}));
+    EXPECT_EQ("", Complete({"remove", m_plain, "/cfg/a", ""}));
+    EXPECT_EQ("", Complete({"set", m_plain, "cfg.a", ""}));
+    EXPECT_EQ("\t\n", Complete({"diff", m_plain, ""}));
+}
+
+TEST_F(KxconfigComplete, AnUnknownCommandIsNone)
+{
+    EXPECT_EQ("get\t", Complete({"nothing", "ge"}).substr(0, 4));
+}

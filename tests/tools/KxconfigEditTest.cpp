@@ -146,3 +146,39 @@ TEST_F(KxconfigEdit, BackupOfAFileThatHasTheNameAlready)
     EXPECT_EQ(m_before, ReadFile(m_file + "~"));
     EXPECT_EQ(2, FilesInFolder());
 }
+
+TEST_F(KxconfigEdit, ADiffNeedsAFileThatCanBeReadAgain)
+{
+    const std::string pipe = m_folder.Path("pipe");
+    ASSERT_EQ(0, RunShell("mkfifo " + pipe).status);
+    const Outcome outcome =
+        RunShell("{ cat " + m_file + "; sleep 0.05; } >" + pipe + " & " + InShell(KX_CONFIG_TOOL) +
+                 " set " + pipe + " cfg.name crate --diff --output " + m_folder.Path("other.xml"));
+    EXPECT_EQ(4, outcome.status);
+    EXPECT_EQ("kxconfig: not saved: --diff needs a regular file, which " + pipe + " is not\n",
+              outcome.err);
+}
+
+TEST_F(KxconfigEdit, ADiffComparesNoUtf16)
+{
+    std::string wide = "\xFF\xFE";
+    for (const char c : std::string("<cfg><name>box</name></cfg>"))
+    {
+        wide += {c, '\0'};
+    }
+    const std::string file = m_folder.Write("wide.xml", wide);
+    EXPECT_EQ("kxconfig: not saved: --diff compares lines of text, and " + file +
+                  " is compressed or in UTF-16\n",
+              Tool({"set", "--diff", file, "cfg.name", "crate"}).err);
+    EXPECT_EQ(wide, ReadFile(file));
+}
+
+TEST_F(KxconfigEdit, ABackupsSuffixIsAPartOfAName)
+{
+    for (const std::string suffix : {"", "/", "a/b"})
+    {
+        EXPECT_EQ(2, Tool({"set", "--backup=" + suffix, m_file, "cfg.name", "crate"}).status)
+            << suffix;
+    }
+    EXPECT_EQ(m_before, ReadFile(m_file));
+}

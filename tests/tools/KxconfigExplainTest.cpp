@@ -348,3 +348,27 @@ TEST_F(KxconfigExplain, PrintsAtMostAHundredTimesTheFile)
     EXPECT_LT(Tool({"explain", "--set", file, key}).out.size(), 100 * xml.size());
     EXPECT_LT(Tool({"--json", "explain", file, key}).out.size(), 200 * xml.size());
 }
+
+TEST_F(KxconfigExplain, JsonHasTheRunsAndTheVerdictsOfTheText)
+{
+    const std::string file =
+        m_folder.Write("a.xml", "<cfg><a/><b/><c/><d/><x i='1'>v</x><x i='2'>w</x></cfg>");
+    const Outcome outcome = Tool({"--json", "explain", file, "cfg.x@i=1"});
+    EXPECT_THAT(outcome.out, HasSubstr("\"event\": \"more\",\n      \"count\": 3,\n"
+                                       "      \"what\": \"elements of other names\""));
+    EXPECT_THAT(outcome.out, HasSubstr("\"verdict\": \"accepted by name alone\""));
+    EXPECT_THAT(outcome.out, HasSubstr("\"verdict\": \"rejected\""));
+}
+
+TEST_F(KxconfigExplain, ColorsTheVerdictsIfItIsAskedTo)
+{
+    const Outcome outcome =
+        Tool({"--color", "always", "explain", m_file, "cfg.net@id=1.ip"}, {"TERM=dumb"});
+    EXPECT_THAT(outcome.out, HasSubstr(": \x1B[32maccepted\x1B[0m: id is \"1\"\n"));
+    EXPECT_THAT(outcome.out, HasSubstr(": \x1B[31mrejected\x1B[0m: id is \"2\", not \"1\"\n"));
+    EXPECT_THAT(outcome.out, HasSubstr(": \x1B[2mnot named \"net\""));
+    EXPECT_THAT(outcome.out, HasSubstr("; value \x1B[32m\"10.0.0.1\"\x1B[0m\n"));
+    EXPECT_EQ("\x1B[31mkxconfig:\x1B[0m nothing found: no element of " + m_file +
+                  " has a value under \"cfg.x\"\n",
+              Tool({"--color", "always", "get", m_file, "cfg.x"}).err);
+}

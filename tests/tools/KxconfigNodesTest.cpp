@@ -235,3 +235,46 @@ TEST_F(KxconfigNodes, TakeTheOptionsOfEverySave)
     EXPECT_EQ(nlohmann::json({{"location", "/cfg/a"}, {"before", nullptr}, {"after", "b"}}),
               answer["results"][0]);
 }
+
+TEST_F(KxconfigNodes, RemovesANodeAndTheLineBeforeItOnce)
+{
+    const Outcome outcome =
+        Tool({"remove", "--all", "--quiet", m_file, "/cfg/comment()|/cfg/text()[1]"});
+    EXPECT_EQ("", outcome.err);
+    EXPECT_EQ(0, outcome.status);
+    EXPECT_EQ(With("\n    <!-- keep -->", ""), ReadFile(m_file));
+}
+
+TEST_F(KxconfigNodes, AddsAnAttributeThatOnlyHasADefault)
+{
+    const std::string file =
+        m_folder.Write("dtd.xml", "<!DOCTYPE cfg [<!ATTLIST cfg a CDATA 'x'>]><cfg/>");
+    EXPECT_EQ(0, Tool({"add", "--attribute", file, "/cfg", "a", "y"}).status);
+    EXPECT_THAT(ReadFile(file), testing::HasSubstr("<cfg a=\"y\"/>"));
+}
+
+TEST_F(KxconfigNodes, NamesTheKindThatItCannotChange)
+{
+    const std::string file =
+        m_folder.Write("k.xml", "<a><?pi x?><!--c-->t<b><![CDATA[d]]></b></a>");
+    const std::vector<std::pair<std::string, std::string>> kinds = {
+        {"/a/text()", "a text"},
+        {"/a/b/text()", "a text"},
+        {"/a/comment()", "a comment"},
+        {"//processing-instruction()", "a processing instruction"},
+        {"/", "the document"}};
+    for (const auto& [expression, kind] : kinds)
+    {
+        ExpectComplaint(Tool({"set", "--node", file, expression, "x"}), 2,
+                        "\"" + expression + "\" selects " + kind +
+                            "; --node changes elements and attributes");
+        ExpectComplaint(Tool({"add", file, expression, "n", "x"}), 2,
+                        "\"" + expression + "\" selects " + kind + "; add needs an element");
+    }
+}
+
+TEST_F(KxconfigNodes, ReportsANodeThatTwoPairsSetOnce)
+{
+    const Outcome outcome = Tool({"set", "--node", m_file, "//net[2]/ip", "x", "//net[2]/ip", "y"});
+    EXPECT_EQ("/cfg/net[2]/ip: \"b\" -> \"y\"\n", outcome.out);
+}

@@ -4,6 +4,7 @@
 #include <nlohmann/json.hpp>
 
 #include <map>
+#include <system_error>
 
 using namespace kxtest;
 using testing::HasSubstr;
@@ -334,4 +335,47 @@ TEST_F(KxconfigSetPairs, ReportsTheDifferenceBetweenTheFiles)
         EXPECT_EQ(expected, texts(after)) << seed;
     }
     EXPECT_GT(changes, 60);
+}
+
+TEST_F(KxconfigSetPairs, WarnsOfAllElementsThatLoseTheirText)
+{
+    const Outcome outcome = Tool({"set", m_file, "cfg.net.ip", "", "cfg.name", ""});
+    EXPECT_EQ(0, outcome.status);
+    EXPECT_THAT(outcome.err,
+                HasSubstr("no later set reaches 2 elements, which have no plain text"));
+}
+
+TEST_F(KxconfigSetPairs, AnEmptyFileIsAnEmptyValue)
+{
+    const std::string empty = m_folder.Write("empty", "");
+    EXPECT_EQ("/cfg/name: \"box\" -> \"\"\n",
+              Tool({"set", m_file, "cfg.name", "--value-from", empty}).out);
+}
+
+TEST_F(KxconfigSetPairs, InputThatBreaksIsReported)
+{
+    struct Broken : std::streambuf
+    {
+        int underflow() override { throw std::system_error(EIO, std::generic_category()); }
+    };
+    Broken broken;
+    std::istream in(&broken);
+    std::ostringstream out;
+    std::ostringstream err;
+    EXPECT_EQ(3, ::Run({"set", m_file, "cfg.name", "--value-from", "-"}, in, out, err));
+    EXPECT_EQ("kxconfig: cannot read \"-\": Input/output error\n", err.str());
+    EXPECT_EQ(m_before, ReadFile(m_file));
+    in.clear();
+    err.str("");
+    EXPECT_EQ(3, ::Run({"get", "-", "cfg.name"}, in, out, err));
+    EXPECT_EQ("kxconfig: cannot read -: Input/output error\n", err.str());
+}
+
+TEST_F(KxconfigSetPairs, RefusesAnAmpersandWithoutASemicolon)
+{
+    for (const std::string value : {"a & b", "&lt", "&;", "& ;", "&#;", "&#x;", "&#xg;", "&#1a;"})
+    {
+        ExpectRefused({"set", m_file, "cfg.name", value}, 2,
+                      "the new text is not XML text: write & as &amp;");
+    }
 }

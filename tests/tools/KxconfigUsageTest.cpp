@@ -319,3 +319,13 @@ TEST_F(KxconfigUsage, ManPageHasTheSectionsOfAManPage)
         EXPECT_THAT(page, HasSubstr("\n\\fB" + variable + "\\fR\n"));
     }
 }
+
+TEST_F(KxconfigUsage, ACommandToTypeIsQuotedForTheShell)
+{
+    ExpectComplaint(Tool({"get", "it's.xml", "-k"}), 2,
+                    "\"-k\" is not an option; for an argument that starts with a dash, use --: "
+                    "kxconfig get 'it'\\''s.xml' -- -k (kxconfig --help shows the usage)");
+    ExpectComplaint(Tool({"get", "", "-k"}), 2,
+                    "\"-k\" is not an option; for an argument that starts with a dash, use --: "
+                    "kxconfig get '' -- -k (kxconfig --help shows the usage)");
+}

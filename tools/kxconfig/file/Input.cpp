@@ -51,6 +51,10 @@ std::string ReadSome(std::istream& stream)
 {
     std::string bytes(65536, '\0');
     stream.read(bytes.data(), static_cast<std::streamsize>(bytes.size()));
+    if (stream.bad())
+    {
+        Throw(EIO); // the stream keeps no reason
+    }
     bytes.resize(static_cast<size_t>(stream.gcount()));
     return bytes;
 }

@@ -24,7 +24,6 @@ bool IsKindWithLocation(const xmlNode* node)
     case XML_CDATA_SECTION_NODE:
     case XML_COMMENT_NODE:
     case XML_PI_NODE:
-    case XML_DOCUMENT_NODE:
         return true;
     default:
         return false;

@@ -132,15 +132,3 @@ void VisitKeys(const xmlNode* root, Levels& levels, const KeyVisitor& visit)
         KeyLister(root, levels, visit).ListBelow(root, true);
     }
 }
-
-std::vector<std::string> ListKeys(const xmlNode* root, Levels& levels)
-{
-    std::vector<std::string> keys;
-    VisitKeys(root, levels,
-              [&](const ListedKey& listed)
-              {
-                  keys.push_back(listed.key);
-                  return true;
-              });
-    return keys;
-}

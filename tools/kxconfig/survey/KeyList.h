@@ -40,7 +40,4 @@ using KeyVisitor = std::function<bool(const ListedKey&)>;
  */
 void VisitKeys(const xmlNode* root, Levels& levels, const KeyVisitor& visit);
 
-/** @return the same keys. */
-std::vector<std::string> ListKeys(const xmlNode* root, Levels& levels);
-
 #endif

@@ -35,7 +35,7 @@ public:
     KeyValues(const xmlNode* root, Levels& levels);
 
     /**
-     * @param key  one that ListKeys() listed.
+     * @param key  one that VisitKeys() visits.
      * @param most  the number of elements that are wanted.
      */
     Bearers BearersUnder(const std::string& key, size_t most = std::numeric_limits<size_t>::max());
