@@ -5,7 +5,7 @@
 #include "diag/Status.h"
 #include "engine/Edit.h"
 #include "engine/Kind.h"
-#include "engine/OldEngine.h"
+#include "engine/Query.h"
 #include "engine/Text.h"
 
 #include <libxml/parser.h>

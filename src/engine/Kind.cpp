@@ -12,12 +12,6 @@ bool OwnsWhatItHolds(const xmlNode* node)
     return HasContent(node) || node->type == XML_XINCLUDE_START || node->type == XML_XINCLUDE_END;
 }
 
-/** Whether @p node is a reference whose child is the declaration of its entity. */
-bool RefersToDeclaration(const xmlNode* node)
-{
-    return node->type == XML_ENTITY_REF_NODE && node->children != 0;
-}
-
 /** Whether @p node is in the tables of its DTD, too. */
 bool IsDeclaration(const xmlNode* node)
 {
@@ -47,6 +41,11 @@ bool HasChild(const xmlNode* node, bool (*isWanted)(const xmlNode*))
 }
 
 } // namespace
+
+bool RefersToDeclaration(const xmlNode* node)
+{
+    return node->type == XML_ENTITY_REF_NODE && node->children != 0;
+}
 
 bool HasContent(const xmlNode* node)
 {

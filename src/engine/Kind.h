@@ -72,6 +72,9 @@ inline xmlAttr* AttributesOf(const xmlNode* node)
     return node != 0 && HasElementFields(node) ? node->properties : 0;
 }
 
+/** @return whether @p node is a reference whose child is the declaration of its entity. */
+bool RefersToDeclaration(const xmlNode* node);
+
 /** @return whether a child linked under @p node, which may be null, is freed with it. */
 bool CanHoldChildren(const xmlNode* node);
 

@@ -1,7 +1,5 @@
 #include "OldEngine.h"
 
-#include "Walk.h"
-
 #include <libxml/entities.h>
 #include <libxml/parser.h>
 
@@ -15,18 +13,6 @@ namespace kx
 
 namespace
 {
-
-/** @return whether the engine is older than @p version, which is "20910" for 2.9.10. */
-bool IsBefore(const char* version)
-{
-    // The variable behind it is a macro up to 2.11, and a symbol of its own since.
-    return strcmp(*__xmlParserVersion(), version) < 0;
-}
-
-bool IsOld()
-{
-    return IsBefore("20910");
-}
 
 /** @return whether the engine turns the content of @p node into child nodes. */
 bool HoldsNodes(const xmlNode* node)
@@ -101,86 +87,17 @@ void SetPlainContent(xmlNode* node, const xmlChar* text)
     }
 }
 
-bool IsInsideAttribute(const xmlNode* node)
-{
-    if (node == 0 || node->type == XML_NAMESPACE_DECL)
-    {
-        return false;
-    }
-    const xmlNode* parent = node->parent;
-    while (parent != 0 && parent->type != XML_ATTRIBUTE_NODE)
-    {
-        parent = parent->parent;
-    }
-    return parent != 0;
-}
-
-/** @return whether any node of @p document refers to a declared entity. */
-bool HasReferences(xmlDoc* document)
-{
-    xmlNode* const top = reinterpret_cast<xmlNode*>(document);
-    xmlNode* node = top;
-    while (node != 0 && (node->type != XML_ENTITY_REF_NODE || node->children == 0))
-    {
-        node = NextWithin(top, node);
-    }
-    return node != 0;
-}
-
-/** @return whether the query's document, or that of its context, has references. */
-bool MeetsReferences(const xmlXPathContext* context)
-{
-    const xmlNode* const node = context->node;
-    return HasReferences(context->doc) ||
-           (node != 0 && node->type != XML_NAMESPACE_DECL && HasReferences(node->doc));
-}
-
-/** @return whether @p text starts with the axis @p name, or with @p name and "-or-self". */
-bool StartsWithAxis(const char* text, const char* name)
-{
-    if (strncmp(text, name, strlen(name)) != 0)
-    {
-        return false;
-    }
-    text += strlen(name);
-    text += strncmp(text, "-or-self", 8) == 0 ? 8 : 0;
-    text += strspn(text, " \t\r\n");
-    return strncmp(text, "::", 2) == 0;
-}
-
-/** @return the end of the literal that starts at @p text, else @p text. */
-const char* SkipLiteral(const char* text)
-{
-    const char* const end = *text == '\'' || *text == '"' ? strchr(text + 1, *text) : 0;
-    return end != 0 ? end : text;
-}
-
-/** @return whether @p expression has a step along the axis @p name. */
-bool UsesAxis(const char* expression, const char* name)
-{
-    const char* at = expression;
-    while (*at != 0 && !StartsWithAxis(at, name))
-    {
-        at = SkipLiteral(at) + 1;
-    }
-    return *at != 0;
-}
-
-bool UsesAncestors(const char* expression)
-{
-    return UsesAxis(expression, "ancestor");
-}
-
-bool UsesOrder(const char* expression)
-{
-    return UsesAxis(expression, "following") || UsesAxis(expression, "preceding");
-}
-
 } // namespace
+
+bool IsOldEngine()
+{
+    // The variable behind it is a macro up to 2.11, and a symbol of its own since.
+    return strcmp(*__xmlParserVersion(), "20910") < 0;
+}
 
 void SetContent(xmlNode* node, const xmlChar* text)
 {
-    const bool needsHelp = IsOld() && HoldsNodes(node);
+    const bool needsHelp = IsOldEngine() && HoldsNodes(node);
     if (needsHelp && Find(text, '&') == 0)
     {
         SetPlainContent(node, text);
@@ -195,7 +112,7 @@ void SetContent(xmlNode* node, const xmlChar* text)
 
 xmlNode* NewElement(xmlDoc* document, xmlNs* space, const xmlChar* name, const xmlChar* content)
 {
-    if (content == 0 || !IsOld())
+    if (content == 0 || !IsOldEngine())
     {
         return xmlNewDocNode(document, space, name, content);
     }
@@ -207,21 +124,12 @@ xmlNode* NewElement(xmlDoc* document, xmlNs* space, const xmlChar* name, const x
     return element;
 }
 
-bool QueryEnds(const xmlXPathContext* context, const char* expression)
-{
-    if (!IsOld())
-    {
-        return true;
-    }
-    if (IsInsideAttribute(context->node) && UsesAncestors(expression))
-    {
-        return false;
-    }
-    // From 2.9 on a query fails that selects too many nodes.
-    return !IsBefore("20900") || !UsesOrder(expression) || !MeetsReferences(context);
-}
-
 #else
+
+bool IsOldEngine()
+{
+    return false;
+}
 
 void SetContent(xmlNode* node, const xmlChar* text)
 {
@@ -231,11 +139,6 @@ void SetContent(xmlNode* node, const xmlChar* text)
 xmlNode* NewElement(xmlDoc* document, xmlNs* space, const xmlChar* name, const xmlChar* content)
 {
     return xmlNewDocNode(document, space, name, content);
-}
-
-bool QueryEnds(const xmlXPathContext* /*context*/, const char* /*expression*/)
-{
-    return true;
 }
 
 #endif

@@ -3,17 +3,19 @@
 
 /**
  * @file OldEngine.h
- * Calls that crash, do not return or answer differently with engines before 2.9.10.
+ * Calls that crash or answer differently with engines before 2.9.10.
  *
  * The version is checked at run time: a library compiled with newer headers may run with an older
  * engine. With a newer engine each function is the engine's call and nothing else.
  */
 
 #include <libxml/tree.h>
-#include <libxml/xpath.h>
 
 namespace kx
 {
+
+/** @return whether the engine is older than 2.9.10. */
+bool IsOldEngine();
 
 /**
  * Replaces the content of @p node by xmlNodeSetContent.
@@ -25,13 +27,6 @@ void SetContent(xmlNode* node, const xmlChar* text);
 
 /** Creates an element by xmlNewDocNode, with @p content as by SetContent; it may be null. */
 xmlNode* NewElement(xmlDoc* document, xmlNs* space, const xmlChar* name, const xmlChar* content);
-
-/**
- * @return whether the evaluation of @p expression ends. Older engines follow the ancestors of a
- *         node inside an attribute forever. Engines before 2.9 enter the declaration of an entity
- *         at a reference and follow the axes "following" and "preceding" from there.
- */
-bool QueryEnds(const xmlXPathContext* context, const char* expression);
 
 } // namespace kx
 

@@ -2,13 +2,11 @@
 // differently. Any engine up to 2.9 serves: the test program answers the question for the version.
 
 #include "CXMLWriter.h"
-#include "CXmlParser.h"
 #include "DomTest.h"
 
 #include <gmock/gmock.h>
 
 #include <libxml/entities.h>
-#include <libxml/xpath.h>
 
 #include <algorithm>
 #include <functional>
@@ -32,16 +30,6 @@ const char* const kTexts[] = {
     "",       "text",        "&plain;",   "&nothing;",   "x&outer;y&outer;", "&open;", "&far;",
     "&self;", "&two;x&one;", "&unknown;", "&lt;&amp;",   "&#65;&#",          "a&b",    "&",
     "&;x",    "a&plain",     "&&self;",   "a&#x;&self;", "&self;&plain;b&c",
-};
-
-/** Answers the library's question for the engine's version as long as it lives. */
-class Pretended
-{
-public:
-    explicit Pretended(const char* version) { AnswerVersion(version); }
-    ~Pretended() { AnswerVersion(nullptr); }
-    Pretended(const Pretended&) = delete;
-    Pretended& operator=(const Pretended&) = delete;
 };
 
 std::string Text(const xmlChar* text)
@@ -82,7 +70,7 @@ protected:
      */
     static std::string After(const char* version, const char* xpath, const Change& change)
     {
-        const Pretended pretended(version);
+        const PretendedVersion pretended(version);
         const EngineMemory memory;
         const xmlDocPtr document = ParseText(kXml);
         change(CXmlNode(NodeOf(document, xpath)));
@@ -101,7 +89,7 @@ protected:
     /** @return the most blocks that leak when one request fails while a child gets @p content. */
     static long MostLost(const char* version, const std::string& content)
     {
-        const Pretended pretended(version);
+        const PretendedVersion pretended(version);
         long most = 0;
         FailInTurn(
             [&](std::size_t n)
@@ -118,18 +106,6 @@ protected:
                 return failed;
             });
         return most;
-    }
-
-    /** @return whether a query of a document with the text @p xml succeeds. */
-    static bool Answers(const char* xml, const char* expression, const CXmlNode& context)
-    {
-        CXmlParser parser;
-        const TemporaryFolder folder;
-        EXPECT_EQ(0, parser.ParseXml(folder.Write("a.xml", xml)));
-        const xmlXPathObjectPtr result = parser.GetNodeSet(expression, context);
-        xmlXPathFreeObject(result);
-        TakeEngineErrors();
-        return result != nullptr;
     }
 
     /** Newer engines survive each of these texts; with an older one there is nothing to compare. */
@@ -169,7 +145,7 @@ TEST_F(OldEngineTest, EntityThatContainsItselfIsStored)
 
 TEST_F(OldEngineTest, EmptyTextLeavesNoChild)
 {
-    const Pretended pretended(kOld);
+    const PretendedVersion pretended(kOld);
     const xmlDocPtr document = Parse("<cfg><a b=\"old\">old</a></cfg>");
     const xmlNodePtr element = NodeOf(document, "/cfg/a");
     EXPECT_EQ(0, CXmlNode(element).SetContent(""));
@@ -181,7 +157,7 @@ TEST_F(OldEngineTest, EmptyTextLeavesNoChild)
 
 TEST_F(OldEngineTest, FragmentsHoldContentToo)
 {
-    const Pretended pretended(kOld);
+    const PretendedVersion pretended(kOld);
     const xmlNodePtr fragment = xmlNewDocFragment(m_document);
     EXPECT_EQ(0, CXmlNode(fragment).SetContent("text"));
     EXPECT_EQ("text=text ", DescribeAll(fragment->children));
@@ -190,7 +166,7 @@ TEST_F(OldEngineTest, FragmentsHoldContentToo)
 
 TEST_F(OldEngineTest, UpdateStoresAnEntityThatContainsItself)
 {
-    const Pretended pretended(kOld);
+    const PretendedVersion pretended(kOld);
     const xmlDocPtr document = Parse(kXml);
     CXMLWriter writer;
     writer.SetDataPtr(document);
@@ -207,88 +183,4 @@ TEST_F(OldEngineTest, NothingMoreIsLostWhenMemoryRunsOut)
     {
         EXPECT_EQ(MostLost(kNew, "x&outer;"), MostLost(kOld, "x&outer;"));
     }
-}
-
-TEST_F(OldEngineTest, QueryForAncestorsFromInsideAnAttributeFails)
-{
-    const Pretended pretended(kOld);
-    const xmlNodePtr attribute = NodeOf(m_document, "//net/@mode");
-    const CXmlNode inside(attribute->children);
-    for (const char* const expression : {"ancestor::*", "../ancestor-or-self::node()",
-                                         "//a[ancestor \t\r\n::b]", "concat('x', ancestor::*)"})
-    {
-        EXPECT_FALSE(Answers("<a/>", expression, inside)) << expression;
-    }
-    EXPECT_TRUE(Answers("<a/>", "..", inside));
-    EXPECT_TRUE(Answers("<a/>", "ancestor::*", CXmlNode(attribute)));
-    EXPECT_TRUE(Answers("<a/>", "//a/ancestor::*", CXmlNode()));
-
-    CXmlNode below = CXmlNode(attribute).AddChildNode("below", "");
-    EXPECT_EQ("below", below.Name());
-    EXPECT_FALSE(Answers("<a/>", "ancestor::*", below));
-}
-
-TEST_F(OldEngineTest, NameOfAnAxisInALiteralOrANameIsNoAxis)
-{
-    const Pretended pretended(kOld);
-    const CXmlNode inside(NodeOf(m_document, "//net/@mode")->children);
-    for (const char* const expression :
-         {"'ancestor::*'", "\"'ancestor::*\"", "concat('ancestor', \"::\")", "//ancestor",
-          "//a[.='ancestor::b']", "ancestor-or-self", "string('')", "following::*", "preceding::*"})
-    {
-        EXPECT_TRUE(Answers("<a/>", expression, inside)) << expression;
-    }
-    EXPECT_FALSE(Answers("<a/>", "concat('', 'it', ancestor::*)", inside));
-    EXPECT_FALSE(Answers("<a/>", "'", inside));
-}
-
-TEST_F(OldEngineTest, QueryPastReferencesFails)
-{
-    const Pretended pretended(kOld);
-    const char* const xml = "<!DOCTYPE a [<!ENTITY e 'text'>]><a><b/>&e;<c/></a>";
-    EXPECT_FALSE(Answers(xml, "//b/following::c", CXmlNode()));
-    EXPECT_FALSE(Answers(xml, "//c/preceding :: *", CXmlNode()));
-    EXPECT_TRUE(Answers(xml, "//b/following-sibling::*", CXmlNode()));
-    EXPECT_TRUE(Answers(xml, "//c/preceding-sibling::*", CXmlNode()));
-    EXPECT_TRUE(Answers(xml, "//c/ancestor::*", CXmlNode()));
-    EXPECT_TRUE(Answers(xml, "'following::*'", CXmlNode()));
-}
-
-TEST_F(OldEngineTest, QueryFromANodeOfADocumentWithReferencesFails)
-{
-    const Pretended pretended(kOld);
-    const xmlDocPtr other = Parse("<!DOCTYPE a [<!ENTITY e 'text'>]><a><b/>&e;<c/></a>");
-    EXPECT_FALSE(Answers("<a/>", "following::c", CXmlNode(NodeOf(other, "//b"))));
-    EXPECT_TRUE(Answers("<a/>", "following::c", CXmlNode(NodeOf(m_document, "//net"))));
-}
-
-TEST_F(OldEngineTest, UndeclaredEntityIsNoReferenceToFollow)
-{
-    const Pretended pretended(kOld);
-    const char* const xml = "<!DOCTYPE a SYSTEM 'a.dtd'><a><b/>&e;<c/></a>";
-    EXPECT_TRUE(Answers(xml, "//b/following::c", CXmlNode()));
-}
-
-TEST_F(OldEngineTest, QueryPastReferencesIsLeftToEnginesFrom29On)
-{
-    const Pretended pretended("20901");
-    const char* const xml = "<!DOCTYPE a [<!ENTITY e 'text'>]><a><b/>&e;<c/></a>";
-    EXPECT_TRUE(Answers(xml, "//c/following::*", CXmlNode()));
-}
-
-TEST_F(OldEngineTest, NamespaceIsAContextAsEver)
-{
-    const Pretended pretended(kOld);
-    CXmlParser parser;
-    const TemporaryFolder folder;
-    ASSERT_EQ(0, parser.ParseXml(folder.Write("a.xml", "<a xmlns:n='urn:n'/>")));
-    const xmlXPathObjectPtr spaces = parser.GetNodeSet("/a/namespace::n", CXmlNode());
-    CXmlNode space(xmlXPathNodeSetItem(spaces->nodesetval, 0));
-    for (const char* const expression : {"ancestor::*", "following::*"})
-    {
-        const xmlXPathObjectPtr result = parser.GetNodeSet(expression, space);
-        EXPECT_NE(nullptr, result) << expression;
-        xmlXPathFreeObject(result);
-    }
-    xmlXPathFreeObject(spaces);
 }

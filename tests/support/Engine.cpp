@@ -38,6 +38,8 @@ xmlXPathObjectPtr g_lastXPath = nullptr;
 bool g_refuseContext = false;
 bool g_refuseSibling = false;
 const char* g_version = nullptr;
+unsigned long g_stepLimit = 0;
+unsigned long g_loweredLimit = 0;
 
 void Show(const char* call)
 {
@@ -60,6 +62,22 @@ void CollectError(void*, const char* format, ...)
     va_end(arguments);
     g_engineErrors += text;
 }
+
+#if LIBXML_VERSION >= 20910
+void NoteStepLimit(xmlXPathContext& context)
+{
+    // The records of an older engine end before the limit.
+    g_stepLimit = kxtest::EngineVersion() >= 20910 ? context.opLimit : 0;
+    if (g_stepLimit != 0 && g_loweredLimit != 0)
+    {
+        context.opLimit = g_loweredLimit;
+    }
+}
+#else
+void NoteStepLimit(const xmlXPathContext&)
+{
+}
+#endif
 
 } // namespace
 
@@ -168,6 +186,7 @@ extern "C" xmlXPathObjectPtr xmlXPathEvalExpression(const xmlChar* text, xmlXPat
         g_xpathAnswer.reset();
         return Answer("xmlXPathEvalExpression", g_lastXPath, text, context);
     }
+    NoteStepLimit(*context);
     g_lastXPath = Forward<&xmlXPathEvalExpression>("xmlXPathEvalExpression", text, context);
     return g_lastXPath;
 }
@@ -266,6 +285,14 @@ void AnswerVersion(const char* version)
     g_version = version;
 }
 
+unsigned long LastStepLimit()
+{
+    return g_stepLimit;
+}
+void LowerStepLimits(unsigned long steps)
+{
+    g_loweredLimit = steps;
+}
 void AnswerNextFormatSave(int result)
 {
     g_formatSaveAnswer = result;

@@ -64,6 +64,22 @@ int EngineVersion();
  * it. */
 void AnswerVersion(const char* version);
 
+/** Makes the engine report a version to the library, as AnswerVersion does, while it lives. */
+class PretendedVersion
+{
+public:
+    explicit PretendedVersion(const char* version) { AnswerVersion(version); }
+    ~PretendedVersion() { AnswerVersion(nullptr); }
+    PretendedVersion(const PretendedVersion&) = delete;
+    PretendedVersion& operator=(const PretendedVersion&) = delete;
+};
+
+/** @return the steps to which the library limited the last evaluation of XPath; 0 for no limit. */
+unsigned long LastStepLimit();
+
+/** Lowers each limit that the library sets from now on, which takes seconds; 0 ends it. */
+void LowerStepLimits(unsigned long steps);
+
 /** Makes the next call of xmlSaveFormatFileEnc do nothing and answer @p result. */
 void AnswerNextFormatSave(int result);
 

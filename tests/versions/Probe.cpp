@@ -67,7 +67,7 @@ std::string InAProcess(const std::function<std::string()>& probe)
     const pid_t child = fork();
     if (child == 0)
     {
-        const rlimit seconds = {6, 6}; // of processor time: the longest answer needs less than one
+        const rlimit seconds = {2, 2}; // of processor time: the longest answer needs less than one
         const rlimit core = {0, 0};
         setrlimit(RLIMIT_CPU, &seconds);
         setrlimit(RLIMIT_CORE, &core);
@@ -238,12 +238,34 @@ std::string AncestorsInAnAttribute()
     return Query("ancestor::*", Root("<a b='text'/>")->properties->children);
 }
 
+/** @return the answer from the first child of a root whose second child refers to the entity e. */
+std::string QueryPastAReference(const char* expression, const char* declarations)
+{
+    const std::string type = std::string("<!DOCTYPE a [") + declarations + "]>";
+    return Query(expression, Root(type + "<a><b/>&e;<c/></a>")->children);
+}
+
+// The reference leads into the declaration, and the declaration's siblings to the root.
 std::string NodesBehindAReference()
 {
-    // The reference leads into the declaration, and the declaration's siblings to the root.
-    return Query("following::*", Root("<!DOCTYPE a [<!ENTITY e 'x'><!ELEMENT a ANY>]>"
-                                      "<a><b/>&e;</a>")
-                                     ->children);
+    return QueryPastAReference("following::*", "<!ENTITY e 'x'><!ELEMENT a ANY>");
+}
+
+std::string NothingBehindAReference()
+{
+    return QueryPastAReference("following::d", "<!ENTITY e 'x'><!ELEMENT a ANY>");
+}
+
+std::string NothingBeforeALaterEntity()
+{
+    return QueryPastAReference("../c/preceding::d", "<!ENTITY e 'x&f;'><!ENTITY f 'y'>");
+}
+
+std::string TextOfAnEntityInItself()
+{
+    xmlNode* const root = Root("<!DOCTYPE a [<!ENTITY e 'x&e;'>]><a/>");
+    xmlNodeSetContent(root, X("&e;"));
+    return Query("string(.)", root);
 }
 
 std::string NestedParentheses()
@@ -281,6 +303,9 @@ const Behavior kBehaviors[] = {
     {"`xmlNodeSetContent` of an attribute, short of memory", ContentShortOfMemory},
     {"`ancestor` inside an attribute", AncestorsInAnAttribute},
     {"`following` past a reference", NodesBehindAReference},
+    {"`following` past a reference, to no node", NothingBehindAReference},
+    {"`preceding` past a later entity, to no node", NothingBeforeALaterEntity},
+    {"`string()` of an entity that contains itself", TextOfAnEntityInItself},
     {"100,000 nested parentheses", NestedParentheses},
     {"`//comment()` of a comment in a DTD", CommentInADtd},
 };
