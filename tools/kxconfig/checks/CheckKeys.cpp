@@ -64,6 +64,10 @@ void CheckOrder(const Order& order, const xmlNode* parent, const std::string& se
 /** Checks the order on the levels of a key that leads to one element. */
 void CheckOrders(const ListedKey& listed, Findings& findings)
 {
+    if (!findings.Want(Kind::ConditionDependsOnOrder))
+    {
+        return; // no condition of such a key is suspended for another element
+    }
     for (const auto& [parent, level, segment, isNew] : listed.steps)
     {
         if (isNew && level != nullptr && !IsFreeOf("@", segment))
