@@ -178,10 +178,11 @@ include the load of the file. Ratios are the medians of {rounds} rounds, with th
 
 {targets}
 
-- "{bare}" is a program that loads the file with the library, calls `GetValue()` and ends. As in the client, the system
-  takes its memory back.
+- "{bare}" is a program that loads the file with the library, calls `GetValue()` once, prints the value and ends. As in
+  the client, the system takes its memory back.
 - `get` and `explain` use a key with conditions, in the middle of the file.
-- `set` and `xmlstarlet ed` change one element. An update that reaches many elements takes longer, and is not measured.
+- `set` and `xmlstarlet ed` change the same element, and no other. An update that reaches many elements takes longer,
+  and is not measured.
 - `find` and `xmllint` print all elements of one name.
 - `xmlstarlet el -v` builds no tree and prints no values.
 - `set` verifies that what it saves loads again.
