@@ -98,6 +98,19 @@ void* operator new[](std::size_t size, const std::nothrow_t&) noexcept
 {
     return g_new.Allocate(size);
 }
+// malloc() aligns for every type that is not overaligned. Memory resources ask like that for all.
+void* operator new(std::size_t size, std::align_val_t)
+{
+    return operator new(size);
+}
+void operator delete(void* memory, std::align_val_t) noexcept
+{
+    g_new.Release(memory);
+}
+void operator delete(void* memory, std::size_t, std::align_val_t) noexcept
+{
+    g_new.Release(memory);
+}
 void operator delete(void* memory) noexcept
 {
     g_new.Release(memory);

@@ -237,3 +237,18 @@ TEST_F(KxconfigHostileFile, ALongNameIsNotCopiedForEachAttribute)
     EXPECT_EQ(0, Tool({"keys", file}).status);
     EXPECT_LT(ours.Bytes(), std::size_t(20) << 20);
 }
+
+TEST_F(KxconfigHostileFile, TheTextOfAnEntityIsKeptOnceForAllAttributes)
+{
+    const std::size_t count = 1000;
+    const std::size_t length = 10000;
+    std::string xml = "<!DOCTYPE c [<!ENTITY e \"" + std::string(length, 'v') + "\">]><c>";
+    for (std::size_t i = 0; i != count; ++i)
+    {
+        xml += "<a" + std::to_string(i) + " x=\"&e;\"/>";
+    }
+    const std::string file = m_folder.Write("entity.xml", xml + "<b>x</b></c>");
+    const kxtest::NewCounter ours;
+    EXPECT_EQ("c.b\t\"x\"\n", Tool({"keys", file}).out);
+    EXPECT_LT(ours.Bytes(), count * length * 3 / 2); // each is expanded once, and not kept
+}

@@ -135,6 +135,22 @@ TEST_F(KxconfigUsage, TraceShowsTheLibrarysRecordsBesideTheResult)
     EXPECT_EQ(2, Tool({"--trace", "--log-mask", "error", "get", kGateway, "a.b"}).status);
 }
 
+TEST_F(KxconfigUsage, TraceShowsTheLibrarysLoadOfCommandsThatListKeys)
+{
+    for (const std::vector<std::string>& command :
+         std::vector<std::vector<std::string>>{{"keys", kGateway}, {"diff", kGateway, kGateway}})
+    {
+        const Outcome silent = ToolProcess(command);
+        std::vector<std::string> arguments = {"--trace"};
+        arguments.insert(arguments.end(), command.begin(), command.end());
+        const Outcome outcome = ToolProcess(arguments);
+        EXPECT_EQ("", silent.err);
+        EXPECT_EQ(silent.out, outcome.out);
+        EXPECT_THAT(outcome.err, HasSubstr(" trace CXMLReader:"));
+        EXPECT_THAT(outcome.err, HasSubstr(" trace ~CXMLReader:"));
+    }
+}
+
 TEST_F(KxconfigUsage, FlagsTakeNoValue)
 {
     for (const std::string flag :

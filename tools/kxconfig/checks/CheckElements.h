@@ -2,10 +2,10 @@
 #define KX_TOOLS_CHECKELEMENTS_H
 
 #include "checks/Findings.h"
-#include "survey/Levels.h"
+#include "file/KeyTree.h"
 
 /** Checks @p root and all elements below it for text that no lookup finds, names that no key can
  * contain, and attributes that no longer distinguish elements. */
-void CheckElements(const xmlNode* root, const Levels& levels, Findings& findings);
+void CheckElements(const KeyElement* root, Findings& findings);
 
 #endif

@@ -23,18 +23,34 @@ std::string Counted(size_t count)
     return std::to_string(count) + (count == 1 ? " element" : " elements");
 }
 
-void CheckMatches(const Bearers& found, const std::string& key, Kind kind, Findings& findings)
+using Nodes = std::vector<const xmlNode*>;
+using NodeOrder = OrderAmong<xmlNode>;
+
+const xmlNode* NodeOf(const KeyElement* element)
 {
-    if (found.count > 1 && findings.Want(kind))
+    return element == nullptr ? nullptr : element->node;
+}
+
+NodeOrder InNodes(const Order& order)
+{
+    return {NodeOf(order.other), NodeOf(order.rejected), NodeOf(order.taken),
+            NodeOf(order.suspender)};
+}
+
+/** @param found  the first ones of @p count elements. */
+void CheckMatches(size_t count, const Nodes& found, const std::string& key, Kind kind,
+                  Findings& findings)
+{
+    if (count > 1 && findings.Want(kind))
     {
-        findings.Add(found.first[1], kind,
-                     Quoted(key) + " matches " + Counted(found.count) + ", the first of them " +
-                         findings.Place(found.first[0]));
+        findings.Add(found[1], kind,
+                     Quoted(key) + " matches " + Counted(count) + ", the first of them " +
+                         findings.Place(found[0]));
     }
 }
 
 /** @param segment  has a condition, and is what the children of @p parent are compared with. */
-void CheckOrder(const Order& order, const xmlNode* parent, const std::string& segment,
+void CheckOrder(const NodeOrder& order, const xmlNode* parent, const std::string& segment,
                 Findings& findings)
 {
     const std::string name = Text(kx::Segment(kx::TextView(segment)).name);
@@ -70,9 +86,10 @@ void CheckOrders(const ListedKey& listed, Findings& findings)
     }
     for (const auto& [parent, level, segment, isNew] : listed.steps)
     {
-        if (isNew && level != nullptr && !IsFreeOf("@", segment))
+        if (isNew && level != nullptr && segment.condition != nullptr)
         {
-            CheckOrder(level->OrderFor(segment), parent, segment, findings);
+            const std::string text = segment.Text();
+            CheckOrder(InNodes(level->OrderFor(text)), parent->node, text, findings);
         }
     }
 }
@@ -84,18 +101,22 @@ void CheckListedKey(const ListedKey& listed, KeyValues& values, Levels& levels, 
         CheckOrders(listed, findings);
         return;
     }
-    CheckMatches(values.BearersUnder(listed.key, 2), listed.key, Kind::SeveralValues, findings);
+    const Bearers bearers = values.BearersUnder(listed.key, 2);
+    Nodes found;
+    std::transform(bearers.first.begin(), bearers.first.end(), std::back_inserter(found), NodeOf);
+    CheckMatches(bearers.count, found, listed.key, Kind::SeveralValues, findings);
     for (const auto& [parent, segment] : values.NewComparisons())
     {
-        CheckOrder(levels.Below(parent).OrderFor(segment), parent, segment, findings);
+        const Order order = levels.Below(parent).OrderFor(segment);
+        CheckOrder(InNodes(order), parent->node, segment, findings);
     }
 }
 
 // A given key can contain anything: what is reported of it comes from the library's walk.
 
-Order OrderOf(const TrailLevel& level)
+NodeOrder OrderOf(const TrailLevel& level)
 {
-    Order order;
+    NodeOrder order;
     const xmlNode* suspender = nullptr; // of the step that is looked at
     for (const TrailStep& step : level.steps)
     {
@@ -178,19 +199,19 @@ void AddNoValue(const Trail& trail, const xmlDoc* document, const std::string& k
 }
 
 /** @return those of @p elements that are not in @p others. */
-Elements Without(const Elements& others, const Elements& elements)
+Nodes Without(const Nodes& others, const Nodes& elements)
 {
     const std::unordered_set<const xmlNode*> excluded(others.begin(), others.end());
-    Elements rest;
+    Nodes rest;
     std::copy_if(elements.begin(), elements.end(), std::back_inserter(rest),
                  [&](const xmlNode* element) { return excluded.count(element) == 0; });
     return rest;
 }
 
-void CheckUpdate(const Elements& updated, const Elements& found, const std::string& key,
+void CheckUpdate(const Nodes& updated, const Nodes& found, const std::string& key,
                  Findings& findings)
 {
-    const auto add = [&](const Elements& elements, Kind kind, const std::string& what)
+    const auto add = [&](const Nodes& elements, Kind kind, const std::string& what)
     {
         if (!elements.empty())
         {
@@ -205,10 +226,10 @@ void CheckUpdate(const Elements& updated, const Elements& found, const std::stri
 }
 
 /** @return the elements that a lookup of @p key finds. */
-Elements CheckLookup(const xmlDoc* document, const std::string& key, Findings& findings)
+Nodes CheckLookup(const xmlDoc* document, const std::string& key, Findings& findings)
 {
     const Trail trail = RecordLookup(document, key);
-    Elements found;
+    Nodes found;
     for (const TrailStep* const step : trail.StepsWithText())
     {
         found.push_back(step->element);
@@ -217,7 +238,7 @@ Elements CheckLookup(const xmlDoc* document, const std::string& key, Findings& f
     {
         AddNoValue(trail, document, key, findings);
     }
-    CheckMatches({found.size(), found}, key, Kind::AmbiguousKey, findings);
+    CheckMatches(found.size(), found, key, Kind::AmbiguousKey, findings);
     if (trail.top != nullptr)
     {
         CheckOrders(*trail.top, findings);
@@ -233,15 +254,15 @@ std::vector<Reach> CheckGivenKeys(const xmlDoc* document, const std::vector<std:
     std::vector<Reach> reaches;
     for (const std::string& key : keys)
     {
-        const Elements found = CheckLookup(document, key, findings);
-        const Elements updated = ElementsOfUpdate(document, key);
+        const Nodes found = CheckLookup(document, key, findings);
+        const Nodes updated = ElementsOfUpdate(document, key);
         CheckUpdate(updated, found, key, findings);
         reaches.push_back({key, found.size(), updated.size()});
     }
     return reaches;
 }
 
-void CheckListedKeys(const xmlNode* root, Levels& levels, Findings& findings)
+void CheckListedKeys(const KeyElement* root, Levels& levels, Findings& findings)
 {
     KeyValues values(root, levels);
     VisitKeys(root, levels,

@@ -21,6 +21,6 @@ std::vector<Reach> CheckGivenKeys(const xmlDoc* document, const std::vector<std:
                                   Findings& findings);
 
 /** Checks lookups of all keys that can be listed, which are too many to walk for each. */
-void CheckListedKeys(const xmlNode* root, Levels& levels, Findings& findings);
+void CheckListedKeys(const KeyElement* root, Levels& levels, Findings& findings);
 
 #endif

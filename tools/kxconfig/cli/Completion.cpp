@@ -117,11 +117,11 @@ std::string InHome(const std::string& file)
 }
 
 /** @return the keys that start with @p start, as far as they are found in time. */
-std::vector<std::string> KeysIn(xmlDoc* document, const std::string& start)
+std::vector<std::string> KeysIn(const KeyElement* root, const std::string& start)
 {
     std::vector<std::string> keys;
-    Levels levels(document);
-    VisitKeys(xmlDocGetRootElement(document), levels,
+    Levels levels;
+    VisitKeys(root, levels,
               [&](const ListedKey& listed)
               {
                   if (StartsWith(listed.key, start) && !HasControlCharacters(listed.key))
@@ -145,7 +145,7 @@ std::vector<std::string> KeysOf(const std::string& file, const std::string& star
     const TimeLimit limit;
     const EngineSettings engine;
     const KeyTree document = LoadKeyTree(file);
-    std::vector<std::string> keys = KeysIn(document.get(), start);
+    std::vector<std::string> keys = KeysIn(document.Root(), start);
     Shorten(keys);
     return keys;
 }

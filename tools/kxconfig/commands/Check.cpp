@@ -4,6 +4,7 @@
 #include "checks/CheckKeys.h"
 #include "checks/CheckSaving.h"
 #include "commands/KeyArgument.h"
+#include "file/KeyTree.h"
 #include "file/Load.h"
 #include "output/Quoting.h"
 #include "output/Report.h"
@@ -62,12 +63,16 @@ void CheckKeys(CXMLReader& reader, const CheckArguments& arguments, Findings& fi
     }
 }
 
+void CheckElementsAndKeys(const KeyTree& tree, Findings& findings)
+{
+    Levels levels;
+    CheckListedKeys(tree.Root(), levels, findings);
+    CheckElements(tree.Root(), findings);
+}
+
 void CheckFile(CXMLReader& reader, const CheckArguments& arguments, Findings& findings)
 {
-    const xmlNode* const root = RootOf(reader);
-    Levels levels(root->doc);
-    CheckListedKeys(root, levels, findings);
-    CheckElements(root, levels, findings);
+    CheckElementsAndKeys(KeyTree(DocumentOf(reader)), findings);
     const bool isStream = arguments.file == "-"; // its bytes are gone
     if (findings.Want(Kind::ChangedBySaving) && !isStream)
     {

@@ -21,8 +21,8 @@ public:
     KeyedValues(const std::string& path, std::istream* input)
     {
         const KeyTree document = LoadKeyTree(path, input);
-        const xmlNode* const root = xmlDocGetRootElement(document.get());
-        Levels levels(document.get());
+        const KeyElement* const root = document.Root();
+        Levels levels;
         KeyValues values(root, levels);
         VisitKeys(root, levels,
                   [&](const ListedKey& listed)

@@ -10,7 +10,6 @@
 #include <nlohmann/json.hpp>
 
 #include <algorithm>
-#include <cstring>
 
 namespace
 {
@@ -36,8 +35,10 @@ struct KeyAndValue
 
     std::string Line() const
     {
-        const std::string left = more == 0 ? "" : " ... " + std::to_string(more) + " more";
-        return key + '\t' + Quoted(value) + left;
+        std::string line;
+        line.reserve(key.size() + value.size() + 4); // with the tab, the quotes and the line's end
+        line.append(key).append(1, '\t').append(Quoted(value));
+        return more == 0 ? line : line + " ... " + std::to_string(more) + " more";
     }
 
     Json InJson() const
@@ -58,7 +59,7 @@ size_t NumberShown(const Bearers& bearers)
     size_t bytes = 0;
     for (; shown != bearers.first.size(); ++shown)
     {
-        bytes += std::strlen(ValueOf(bearers.first[shown]));
+        bytes += bearers.first[shown]->value.size();
         if (bytes > kMostBytes)
         {
             break;
@@ -69,7 +70,12 @@ size_t NumberShown(const Bearers& bearers)
 
 KeyAndValue Describe(const ListedKey& listed, KeyValues& values, bool all)
 {
-    Bearers bearers = all ? values.BearersUnder(listed) : values.BearersUnder(listed, kMostValues);
+    if (listed.onlyBearer != nullptr)
+    {
+        return {listed.key, std::string(listed.onlyBearer->value), 0};
+    }
+    Bearers bearers =
+        all ? values.BearersUnder(listed.key) : values.BearersUnder(listed.key, kMostValues);
     bearers.first.resize(all ? bearers.count : NumberShown(bearers));
     return {listed.key, JoinedValues(bearers.first), bearers.count - bearers.first.size()};
 }
@@ -109,8 +115,8 @@ void Add(const ListedKey& listed, KeyValues& values, const KeysArguments& argume
 ExitStatus Keys(const KeysArguments& arguments, Report& report)
 {
     const KeyTree document = LoadKeyTree(arguments.file, arguments.input);
-    const xmlNode* const root = xmlDocGetRootElement(document.get());
-    Levels levels(document.get());
+    const KeyElement* const root = document.Root();
+    Levels levels;
     KeyValues values(root, levels);
     bool isFound = false;
     VisitKeys(root, levels,

@@ -1,73 +1,39 @@
 #include "file/KeyTree.h"
 
-#include "engine/Node.h"
-
-#include <libxml/SAX2.h>
-#include <libxml/parser.h>
-#include <libxml/parserInternals.h>
-
-#include <utility>
+#include "file/KeyTreeBuilder.h"
+#include "file/Nodes.h"
 
 namespace
 {
 
-struct ContextDeleter
+/** A record whose children are being added. */
+struct OpenRecord
 {
-    void operator()(xmlParserCtxt* context) const { xmlFreeParserCtxt(context); }
+    KeyElement* record;
+    KeyElement* lastChild;
+    const xmlNode* next; ///< child of the engine's element
 };
-
-void RemoveAllButElements(const xmlNode* parent)
-{
-    for (xmlNode* node = parent->children; node != nullptr;)
-    {
-        xmlNode* const next = node->next;
-        if (node->type != XML_ELEMENT_NODE)
-        {
-            xmlUnlinkNode(node);
-            xmlFreeNode(node);
-        }
-        node = next;
-    }
-}
-
-/** The handler of the end of an element. */
-void EndElement(void* context, const xmlChar* name, const xmlChar* prefix, const xmlChar* space)
-{
-    const xmlNode* const element = static_cast<xmlParserCtxt*>(context)->node;
-    xmlSAX2EndElementNs(context, name, prefix, space);
-    if (element != nullptr && kx::OnlyTextChild(element) == nullptr)
-    {
-        RemoveAllButElements(element);
-    }
-}
-
-/** @return the document; null if it is not well-formed. */
-KeyTree Parse(const std::string& path)
-{
-    const std::unique_ptr<xmlParserCtxt, ContextDeleter> context(
-        xmlCreateFileParserCtxt(path.c_str()));
-    if (context == nullptr)
-    {
-        return nullptr;
-    }
-    xmlCtxtUseOptions(context.get(), XML_PARSE_COMPACT);
-    context->sax->endElementNs = EndElement;
-    xmlParseDocument(context.get());
-    KeyTree document(context->myDoc);
-    return context->wellFormed != 0 ? std::move(document) : nullptr;
-}
 
 } // namespace
 
-KeyTree LoadKeyTree(const std::string& path, std::istream* standardInput)
+KeyTree::KeyTree(const xmlDoc* document)
 {
-    KeyTree document;
-    LoadWith(
-        [&](const std::string& file)
+    KeyTreeBuilder builder(*this, KeyTreeBuilder::Texts::InDocument);
+    const xmlNode* const root = xmlDocGetRootElement(const_cast<xmlDoc*>(document));
+    std::vector<OpenRecord> open = {{builder.Add(root, nullptr, nullptr), nullptr, root->children}};
+    builder.SetValue(*open.back().record, root);
+    while (!open.empty())
+    {
+        const xmlNode* const element = kx::ElementFrom(const_cast<xmlNode*>(open.back().next));
+        if (element == nullptr)
         {
-            document = Parse(file);
-            return document != nullptr;
-        },
-        path, standardInput);
-    return document;
+            open.pop_back();
+            continue;
+        }
+        OpenRecord& parent = open.back();
+        parent.next = element->next;
+        parent.lastChild = builder.Add(element, parent.record, parent.lastChild);
+        builder.SetValue(*parent.lastChild, element);
+        open.push_back({parent.lastChild, nullptr, element->children});
+    }
 }

@@ -86,9 +86,19 @@ std::string Escaped(const std::string& bytes)
     return escaped;
 }
 
+/** @return whether nothing in @p text needs an escape, which is fast to find out. */
+bool IsPlainAscii(const std::string& text)
+{
+    return std::all_of(text.begin(), text.end(), [](char c) { return c >= 0x20 && c < 0x7F; });
+}
+
 /** @return @p text with what is neither plain nor one of the @p kept characters escaped. */
 std::string EscapedBut(const std::string& kept, const std::string& text)
 {
+    if (IsPlainAscii(text))
+    {
+        return text;
+    }
     std::string line;
     for (size_t i = 0; i != text.size();)
     {
@@ -122,13 +132,16 @@ std::string OnItsLines(const std::string& text)
 
 std::string Quoted(const std::string& text)
 {
-    std::string quoted = "\"";
+    std::string quoted;
+    quoted.reserve(text.size() + 2);
+    quoted += '"';
     for (const char c : text)
     {
         quoted += c == '"' || c == '\\' ? "\\" : "";
         quoted += c;
     }
-    return OnOneLine(quoted + '"');
+    quoted += '"';
+    return IsPlainAscii(quoted) ? quoted : OnOneLine(quoted);
 }
 
 std::string QuotedStart(const std::string& text)

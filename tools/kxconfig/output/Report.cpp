@@ -101,9 +101,10 @@ void Report::SetSubject(const std::string& verb, const std::string& file)
     m_file = file;
 }
 
-void Report::AddLine(const std::string& line)
+void Report::AddLine(std::string line)
 {
-    AddBytes(line + '\n');
+    line += '\n';
+    AddBytes(line);
 }
 
 void Report::AddBytes(const std::string& bytes)

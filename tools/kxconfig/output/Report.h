@@ -74,7 +74,7 @@ public:
     }
 
     /** For what exists in one form only: nothing happens if the other one was asked for. */
-    void AddLine(const std::string& line);
+    void AddLine(std::string line);
     void AddBytes(const std::string& bytes);
 
     /** Adds lines of a file, as they are; on a terminal with their control characters escaped. */

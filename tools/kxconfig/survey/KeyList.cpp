@@ -1,34 +1,30 @@
 #include "survey/KeyList.h"
 
-#include "file/Nodes.h"
+#include "survey/ByteSet.h"
 
+#include <algorithm>
 #include <array>
 #include <unordered_set>
-#include <utility>
 
 namespace
 {
 
+/** End a name in a key. */
+constexpr ByteSet kSeparators(".@");
+
 /** @return whether @p parent has few elements, and each of them its own name. */
-bool HasOnlyOwnNames(const xmlNode* parent)
+bool HasOnlyOwnNames(const KeyElement* parent)
 {
-    std::array<const xmlNode*, 8> elements{};
+    std::array<std::string_view, 8> names{};
     size_t count = 0;
-    for (const xmlNode* node = kx::ElementFrom(parent->children); node != nullptr;
-         node = kx::ElementFrom(node->next))
+    for (const KeyElement* element = parent->children; element != nullptr; element = element->next)
     {
-        for (size_t i = 0; i != count; ++i)
-        {
-            if (xmlStrEqual(elements[i]->name, node->name) != 0)
-            {
-                return false;
-            }
-        }
-        if (count == elements.size())
+        const auto end = names.begin() + count;
+        if (count == names.size() || std::find(names.begin(), end, element->name) != end)
         {
             return false;
         }
-        elements[count++] = node;
+        names[count++] = element->name;
     }
     return true;
 }
@@ -37,13 +33,13 @@ bool HasOnlyOwnNames(const xmlNode* parent)
 class KeyLister
 {
 public:
-    KeyLister(const xmlNode* root, Levels& levels, const KeyVisitor& visit)
-        : m_levels(levels), m_visit(visit), m_key(Text(root->name))
+    KeyLister(const KeyElement* root, Levels& levels, const KeyVisitor& visit)
+        : m_levels(levels), m_visit(visit), m_key(root->name)
     {
     }
 
     /** @param isOnly  whether the key so far leads to @p parent alone. */
-    void ListBelow(const xmlNode* parent, bool isOnly)
+    void ListBelow(const KeyElement* parent, bool isOnly)
     {
         if (HasOnlyOwnNames(parent))
         {
@@ -51,7 +47,7 @@ public:
         }
         else if (isOnly)
         {
-            const Level level = m_levels.Below(Elements{parent});
+            const Level level(Elements{parent});
             ListLevel(parent, &level, true);
         }
         else
@@ -61,36 +57,36 @@ public:
     }
 
 private:
-    void ListLevel(const xmlNode* parent, const Level* level, bool isOnly)
+    void ListLevel(const KeyElement* parent, const Level* level, bool isOnly)
     {
-        std::vector<std::string> segments;
+        std::vector<KeySegment> segments;
         if (level != nullptr)
         {
             segments = level->Segments();
         }
         size_t place = 0;
-        for (const xmlNode* node = kx::ElementFrom(parent->children); node != nullptr && !m_isEnded;
-             node = kx::ElementFrom(node->next), ++place)
+        for (const KeyElement* element = parent->children; element != nullptr && !m_isEnded;
+             element = element->next, ++place)
         {
-            if (IsFreeOf(".@", Text(node->name)))
+            if (!kSeparators.IsIn(element->name))
             {
-                std::string segment =
-                    level == nullptr ? Text(node->name) : std::move(segments[place]);
-                const bool isOnlyHere = level == nullptr || level->SelectsOnly(node, segment);
-                m_steps.push_back({parent, level, std::move(segment), true});
-                List(node, isOnly && isOnlyHere);
+                const KeySegment segment =
+                    level == nullptr ? KeySegment{element->name, nullptr} : segments[place];
+                const bool isOnlyHere = level == nullptr || level->SelectsOnly(element, segment);
+                m_steps.push_back({parent, level, segment, true});
+                List(element, isOnly && isOnlyHere);
                 m_steps.pop_back();
             }
         }
     }
 
     /** Lists what is at @p element and below it, which the last step leads to. */
-    void List(const xmlNode* element, bool isOnly)
+    void List(const KeyElement* element, bool isOnly)
     {
         const size_t length = m_key.size();
         m_key += '.';
-        m_key += m_steps.back().segment;
-        if (kx::OnlyTextChild(element) == nullptr)
+        m_steps.back().segment.AppendTo(m_key);
+        if (!element->HasValue())
         {
             ListBelow(element, isOnly);
         }
@@ -102,7 +98,7 @@ private:
         m_key.resize(length);
     }
 
-    void Visit(const xmlNode* onlyBearer)
+    void Visit(const KeyElement* onlyBearer)
     {
         m_isEnded = !m_visit({m_key, onlyBearer, m_steps});
         if (onlyBearer == nullptr)
@@ -125,9 +121,9 @@ private:
 
 } // namespace
 
-void VisitKeys(const xmlNode* root, Levels& levels, const KeyVisitor& visit)
+void VisitKeys(const KeyElement* root, Levels& levels, const KeyVisitor& visit)
 {
-    if (IsFreeOf(".", Text(root->name)))
+    if (!ByteSet(".").IsIn(root->name))
     {
         KeyLister(root, levels, visit).ListBelow(root, true);
     }

@@ -10,9 +10,9 @@
 /** A step on the way to an element: the level that it is on, and its segment there. */
 struct KeyStep
 {
-    const xmlNode* parent;
+    const KeyElement* parent;
     const Level* level; ///< null where all names differ, so that no segment has a condition
-    std::string segment;
+    KeySegment segment;
     bool isNew; ///< no key with an only bearer had it before
 };
 
@@ -23,7 +23,7 @@ struct ListedKey
 
     /** The element, if the key leads to it and to nothing else; null if that is not plain:
      * KeyValues finds out. */
-    const xmlNode* onlyBearer;
+    const KeyElement* onlyBearer;
 
     const std::vector<KeyStep>& steps; ///< from the root's children on; of an only bearer
 };
@@ -38,6 +38,6 @@ using KeyVisitor = std::function<bool(const ListedKey&)>;
  * @param levels  gets those levels below which a key can lead to several elements. The others are
  *                not kept.
  */
-void VisitKeys(const xmlNode* root, Levels& levels, const KeyVisitor& visit);
+void VisitKeys(const KeyElement* root, Levels& levels, const KeyVisitor& visit);
 
 #endif

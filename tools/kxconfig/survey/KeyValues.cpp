@@ -1,7 +1,5 @@
 #include "survey/KeyValues.h"
 
-#include "file/Nodes.h"
-
 #include "config/KeyPath.h"
 
 #include <algorithm>
@@ -18,46 +16,34 @@ std::vector<std::string> Segments(const std::string& key)
     for (bool hasRest = true; hasRest;)
     {
         const kx::KeySplit split(rest);
-        segments.push_back(Text(split.First()));
+        segments.emplace_back(split.First().data, split.First().size);
         rest = split.Rest();
         hasRest = split.HasRest();
     }
     return segments;
 }
 
-/** @return the element that follows @p element in document order below @p root, or null. */
-const xmlNode* NextElement(const xmlNode* element, const xmlNode* root)
+bool IsBefore(const KeyElement* one, const KeyElement* other)
 {
-    const xmlNode* next = kx::ElementFrom(element->children);
-    while (next == nullptr && element != root)
-    {
-        next = kx::ElementFrom(element->next);
-        element = element->parent;
-    }
-    return next;
+    return one->place < other->place;
 }
 
 } // namespace
 
-const char* ValueOf(const xmlNode* element)
-{
-    return kx::ContentOf(kx::OnlyTextChild(element));
-}
-
 std::string JoinedValues(const Elements& elements)
 {
     std::string joined;
-    for (const xmlNode* const element : elements)
+    for (const KeyElement* const element : elements)
     {
         joined += joined.empty() ? "" : "\n";
-        joined += ValueOf(element);
+        joined += element->value;
     }
     return joined;
 }
 
-KeyValues::KeyValues(const xmlNode* root, Levels& levels) : m_root(root), m_start(levels, {root})
+KeyValues::KeyValues(const KeyElement* root, Levels& levels) : m_start(levels, {root})
 {
-    m_path.push_back({Text(root->name), {&m_start}});
+    m_path.push_back({std::string(root->name), {&m_start}});
 }
 
 Bearers KeyValues::BearersUnder(const std::string& key, size_t most)
@@ -78,7 +64,7 @@ Bearers KeyValues::BearersUnder(const std::string& key, size_t most)
     }
     if (parts > 1)
     {
-        SortByPlace(bearers.first);
+        std::sort(bearers.first.begin(), bearers.first.end(), IsBefore);
         bearers.first.resize(std::min(bearers.first.size(), most));
     }
     return bearers;
@@ -108,26 +94,7 @@ void KeyValues::Follow(const std::vector<std::string>& segments)
 const std::vector<Comparison>& KeyValues::NewComparisons()
 {
     std::stable_sort(m_comparisons.begin(), m_comparisons.end(),
-                     [this](const Comparison& one, const Comparison& other)
-                     { return PlaceOf(one.parent) < PlaceOf(other.parent); });
+                     [](const Comparison& one, const Comparison& other)
+                     { return IsBefore(one.parent, other.parent); });
     return m_comparisons;
-}
-
-void KeyValues::SortByPlace(Elements& elements)
-{
-    std::sort(elements.begin(), elements.end(),
-              [this](const xmlNode* one, const xmlNode* other)
-              { return PlaceOf(one) < PlaceOf(other); });
-}
-
-size_t KeyValues::PlaceOf(const xmlNode* element)
-{
-    if (m_places.empty())
-    {
-        for (const xmlNode* node = m_root; node != nullptr; node = NextElement(node, m_root))
-        {
-            m_places.emplace(node, m_places.size());
-        }
-    }
-    return m_places.at(element);
 }

@@ -6,11 +6,7 @@
 
 #include <limits>
 #include <string>
-#include <unordered_map>
 #include <vector>
-
-/** @return the value of @p element, which has one. */
-const char* ValueOf(const xmlNode* element);
 
 /** @return the values of @p elements as a lookup joins them. */
 std::string JoinedValues(const Elements& elements);
@@ -32,7 +28,7 @@ class KeyValues
 {
 public:
     /** @param levels  must outlive the object, like the document. */
-    KeyValues(const xmlNode* root, Levels& levels);
+    KeyValues(const KeyElement* root, Levels& levels);
 
     /**
      * @param key  one that VisitKeys() visits.
@@ -61,14 +57,10 @@ private:
     };
 
     void Follow(const std::vector<std::string>& segments);
-    void SortByPlace(Elements& elements);
-    size_t PlaceOf(const xmlNode* element);
 
-    const xmlNode* const m_root;
     SelectedElements m_start;
     std::vector<Step> m_path; ///< starts with the root
     std::vector<Comparison> m_comparisons;
-    std::unordered_map<const xmlNode*, size_t> m_places; ///< in document order, once it is needed
 };
 
 #endif

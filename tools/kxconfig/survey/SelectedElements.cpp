@@ -1,7 +1,5 @@
 #include "survey/SelectedElements.h"
 
-#include "file/Nodes.h"
-
 #include "config/KeyPath.h"
 
 #include <utility>
@@ -27,9 +25,9 @@ Elements ParentsOf(const Siblings& siblings)
 
 SelectedElements::SelectedElements(Levels& levels, const Elements& elements) : m_levels(levels)
 {
-    for (const xmlNode* const element : elements)
+    for (const KeyElement* const element : elements)
     {
-        (kx::OnlyTextChild(element) != nullptr ? m_bearers : m_parents).push_back(element);
+        (element->HasValue() ? m_bearers : m_parents).push_back(element);
     }
 }
 
@@ -43,7 +41,7 @@ void SelectedElements::Select(const std::string& segment,
     }
     const Level& children = Children();
     const kx::Segment split((kx::TextView(segment)));
-    const std::string name = Text(split.name);
+    const std::string name(split.name.data, split.name.size);
     if (split.condition.IsEmpty())
     {
         Add({name, children.Named(name), true}, selections);
@@ -62,7 +60,7 @@ const Level& SelectedElements::Children()
     }
     if (m_children == nullptr)
     {
-        m_children = std::make_unique<const Level>(m_levels.Below(m_parents));
+        m_children = std::make_unique<const Level>(m_parents);
     }
     return *m_children;
 }
@@ -108,7 +106,7 @@ void SelectedElements::Compare(const std::string& name, const std::string& segme
     Elements fulfilling = ParentsOf(Children().Fulfilling(segment));
     for (const Elements* const parents : {&uncompared->second, &fulfilling})
     {
-        for (const xmlNode* const parent : *parents)
+        for (const KeyElement* const parent : *parents)
         {
             comparisons.push_back({parent, segment});
         }

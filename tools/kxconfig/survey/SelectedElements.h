@@ -13,7 +13,7 @@
  */
 struct Comparison
 {
-    const xmlNode* parent;
+    const KeyElement* parent;
     std::string segment;
 };
 
