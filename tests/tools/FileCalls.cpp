@@ -126,6 +126,11 @@ extern "C" ssize_t fgetxattr(int file, const char* name, void* value, size_t siz
     return Call<Function>("fgetxattr", file, name, value, size);
 }
 
+extern "C" int fremovexattr(int file, const char* name) noexcept
+{
+    return Call<int (*)(int, const char*)>("fremovexattr", file, name);
+}
+
 extern "C" int fsetxattr(int file, const char* name, const void* value, size_t size,
                          int flags) noexcept
 {

@@ -409,8 +409,12 @@ TEST_F(FileFault, AnAclThatCannotBeKeptGivesTheGroupNoMoreThanBefore)
     {
         GTEST_SKIP() << "needs a file system with ACLs";
     }
-    const FailingCall refused("fsetxattr", EPERM);
-    EXPECT_THAT(Save(m_file), HasSubstr("it would lose its permissions, its ACL"));
+    setxattr(m_file.c_str(), "user.note", "text", 4, 0);
+    {
+        const FailingCall refused("fsetxattr", EPERM);
+        EXPECT_THAT(Save(m_file), HasSubstr("it would lose its permissions, its ACL"));
+    }
+    const FailingCall refused("fsetxattr", EPERM, 1); // the other attribute is kept
     Destination::Options options;
     options.dropAttributes = true;
     EXPECT_EQ("", Save(m_file, options));
@@ -470,6 +474,10 @@ TEST_F(FileFault, APipeThatCannotBeReadIsTheReason)
     ASSERT_EQ(0, mkfifo(path.c_str(), 0600));
     const Descriptor writer(open(path.c_str(), O_RDWR | O_CLOEXEC));
     WriteAll(writer.Get(), "text");
+    {
+        const FailingCall missing("memfd_create", ENOSYS);
+        EXPECT_EQ(ENOSYS, ErrorOf([&] { Input input(path); }));
+    }
     const BeforeCall broken("read", [](int number) { return number == 1 ? EINTR : EIO; });
     EXPECT_EQ(EIO, ErrorOf([&] { Input input(path); }));
 }
@@ -506,4 +514,61 @@ TEST_F(FileFault, OnlyANumberNamesADescriptor)
     {
         EXPECT_EQ(std::nullopt, DescriptorNamedBy(name)) << name;
     }
+}
+
+TEST_F(FileFault, AnAttributeThatVanishesWhileItIsReadIsNamed)
+{
+    if (setxattr(m_file.c_str(), "user.note", "text", 4, 0) != 0)
+    {
+        GTEST_SKIP() << "needs a file system with extended attributes";
+    }
+    {
+        const FailingCall vanished("fgetxattr", ENODATA, 2);
+        EXPECT_THAT(Save(m_file), HasSubstr("it would lose the attribute user.note"));
+    }
+    {
+        const FailingCall grown("flistxattr", ERANGE, 2);
+        EXPECT_EQ("", Save(m_file));
+    }
+    char value[4];
+    EXPECT_EQ(4, getxattr(m_file.c_str(), "user.note", value, sizeof value));
+}
+
+TEST_F(FileFault, AnAclThatCannotBeTakenAwayIsAPermission)
+{
+    const Descriptor old(open(m_file.c_str(), O_RDWR | O_CLOEXEC));
+    const Descriptor copy(open(m_folder.Write("copy", "").c_str(), O_RDWR | O_CLOEXEC));
+    if (fsetxattr(copy.Get(), g_acl, g_sharedAcl.data(), g_sharedAcl.size(), 0) != 0)
+    {
+        GTEST_SKIP() << "needs a file system with ACLs";
+    }
+    ASSERT_EQ(0, fchmod(old.Get(), 0660));
+    const FailingCall refused("fremovexattr", EPERM);
+    const Attributes attributes(old.Get());
+    attributes.ApplyTo(copy.Get());
+    EXPECT_THAT(attributes.MissingFrom(Attributes(copy.Get())), ElementsAre("its permissions"));
+}
+
+TEST_F(FileFault, TheOldAclTakesThePlaceOfAnInheritedOne)
+{
+    const Descriptor old(open(m_file.c_str(), O_RDWR | O_CLOEXEC));
+    const Descriptor copy(open(m_folder.Write("copy", "").c_str(), O_RDWR | O_CLOEXEC));
+    std::string inherited = g_sharedAcl;
+    inherited[14] = 4; // the other user may only read
+    if (fsetxattr(old.Get(), g_acl, g_sharedAcl.data(), g_sharedAcl.size(), 0) != 0 ||
+        fsetxattr(copy.Get(), g_acl, inherited.data(), inherited.size(), 0) != 0)
+    {
+        GTEST_SKIP() << "needs a file system with ACLs";
+    }
+    const Attributes attributes(old.Get());
+    attributes.ApplyTo(copy.Get());
+    EXPECT_THAT(attributes.MissingFrom(Attributes(copy.Get())), ElementsAre());
+}
+
+TEST_F(FileFault, WithoutLocksANewFileIsMadeAllTheSame)
+{
+    const NoUnnamedFiles named;
+    const FailingCall missing("flock", ENOLCK);
+    EXPECT_EQ("", Save(m_file));
+    EXPECT_EQ("new", ReadFile(m_file));
 }

@@ -734,3 +734,42 @@ TEST_F(KxconfigCheck, NamesTheEncodingOfAFileThatIsNoAscii)
         ExpectWarningsAndNotes({"1: saving changes every character: IBM037 becomes UTF-8"});
     }
 }
+
+TEST_F(KxconfigCheck, AReferenceBeforeADifferenceIsNotTheDifference)
+{
+    Write("<cfg>&lt;<b></b></cfg>");
+    EXPECT_THAT(Check({"--notes"}).out,
+                HasSubstr(":2: note: saving changes the notation of an empty element: "
+                          "\"></b></cfg>\" becomes \"/></cfg>\" "));
+}
+
+TEST_F(KxconfigCheck, ReportsBlanksBeforeTheRoot)
+{
+    m_file = m_folder.Write("cfg.xml", "\n<cfg/>\n");
+    EXPECT_THAT(Check({"--notes"}).out,
+                HasSubstr(":1: note: saving changes white space outside the root element: "));
+}
+
+TEST_F(KxconfigCheck, NamesUtf16WithItsFirstByteLast)
+{
+    std::string wide = "\xFE\xFF";
+    for (const char c : std::string("<cfg/>\n"))
+    {
+        wide += {'\0', c};
+    }
+    m_file = m_folder.Write("cfg.xml", wide);
+    ExpectWarningsAndNotes({"1: saving changes every character: UTF-16 becomes UTF-8"});
+}
+
+TEST_F(KxconfigCheck, CutsALongTextOfNoCharacters)
+{
+    m_file = m_folder.Write("cfg.xml", "<?xml version=\"1.0\" encoding=\"ISO-8859-1\"?>\n<cfg>" +
+                                           std::string(50, '\xA0') + "</cfg>\n");
+    std::string shown;
+    for (int i = 0; i != 40; ++i)
+    {
+        shown += "\\xa0";
+    }
+    EXPECT_THAT(Check({"--notes"}).out,
+                HasSubstr("the encoding of a character: \"" + shown + "\"... becomes "));
+}

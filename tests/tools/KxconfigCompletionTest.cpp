@@ -352,6 +352,7 @@ TEST_F(KxconfigComplete, OffersNoOptionsBehindTheSeparator)
 {
     EXPECT_EQ("\t\n", Complete({"get", "--", "-"}));
     EXPECT_EQ("", Complete({"get", "--", "-", "-"}));
+    EXPECT_EQ("", Complete({"get", "-", ""})); // standard input is not read
 }
 
 TEST_F(KxconfigComplete, OffersKeysWithoutControlCharacters)

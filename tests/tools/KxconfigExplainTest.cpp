@@ -372,3 +372,9 @@ TEST_F(KxconfigExplain, ColorsTheVerdictsIfItIsAskedTo)
                   " has a value under \"cfg.x\"\n",
               Tool({"--color", "always", "get", m_file, "cfg.x"}).err);
 }
+
+TEST_F(KxconfigExplain, ANameWithANulIsOfNoAttribute)
+{
+    const std::string key = std::string("cfg.net@i") + '\0' + "d=1.ip";
+    EXPECT_THAT(Tool({"explain", m_file, key}).out, HasSubstr("rejected: i\\x00d is absent"));
+}

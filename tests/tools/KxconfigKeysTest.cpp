@@ -284,3 +284,22 @@ TEST_F(KxconfigKeys, SaysThatThereIsNone)
     EXPECT_EQ(1, Tool({"keys", dotted}).status);
     EXPECT_EQ(3, Tool({"keys", m_folder.Path("missing.xml")}).status);
 }
+
+TEST_F(KxconfigKeys, ListsManyElementsOfDifferentNames)
+{
+    std::string xml;
+    std::string lines;
+    for (const char name : std::string("abcdefghij"))
+    {
+        xml += std::string("<") + name + ">1</" + name + ">";
+        lines += std::string("cfg.") + name + "\t\"1\"\n";
+    }
+    EXPECT_EQ(lines, Tool({"keys", m_folder.Write("many.xml", "<cfg>" + xml + "</cfg>")}).out);
+}
+
+TEST_F(KxconfigKeys, AnAttributeWithADotInItsNameDistinguishesNoElements)
+{
+    const std::string file =
+        m_folder.Write("dot.xml", "<cfg><a x.y='1'>p</a><a x.y='2'>q</a></cfg>");
+    EXPECT_EQ("cfg.a\t\"p\\nq\"\n", Tool({"keys", file}).out);
+}

@@ -278,3 +278,44 @@ TEST_F(KxconfigNodes, ReportsANodeThatTwoPairsSetOnce)
     const Outcome outcome = Tool({"set", "--node", m_file, "//net[2]/ip", "x", "//net[2]/ip", "y"});
     EXPECT_EQ("/cfg/net[2]/ip: \"b\" -> \"y\"\n", outcome.out);
 }
+
+TEST_F(KxconfigNodes, SettingTheSameTextChangesNothing)
+{
+    EXPECT_EQ("nothing changed: the text is already the same\n",
+              Tool({"set", "--node", m_file, "//net[2]/ip", "b"}).out);
+    EXPECT_EQ(m_before, ReadFile(m_file));
+}
+
+TEST_F(KxconfigNodes, OnlyALineOfItsOwnIsRemovedWithANode)
+{
+    const std::string before =
+        m_before.substr(0, m_before.find('\n') + 1) + "<cfg><a/> <b/>x<c/>y\n<d/></cfg>\n";
+    const auto expect = [&](const std::string& node, const std::string& tag)
+    {
+        WriteFile(m_file, before);
+        EXPECT_EQ(0, Tool({"remove", m_file, node}).status);
+        std::string after = before;
+        EXPECT_EQ(after.erase(after.find(tag), tag.size()), ReadFile(m_file));
+    };
+    expect("/cfg/a", "<a/>");
+    expect("/cfg/b", "<b/>");
+    expect("/cfg/c", "<c/>");
+    expect("/cfg/d", "<d/>");
+}
+
+TEST_F(KxconfigNodes, AnElementIsAddedOnALineOnlyWhereTheOneBeforeIsOnOne)
+{
+    const std::string start = m_before.substr(0, m_before.find('\n') + 1);
+    const auto expect = [&](const std::string& before, const std::vector<std::string>& options,
+                            const std::string& after)
+    {
+        WriteFile(m_file, start + before);
+        std::vector<std::string> add = {"add", m_file};
+        add.insert(add.end(), options.begin(), options.end());
+        EXPECT_EQ(0, Tool(add).status);
+        EXPECT_EQ(start + after, ReadFile(m_file));
+    };
+    expect("<cfg><a/></cfg>\n", {"/cfg/a", "b", "--after"}, "<cfg><a/><b/></cfg>\n");
+    expect("<cfg>\n <!--c-->\n</cfg>\n", {"/cfg", "b"}, "<cfg>\n <!--c-->\n<b/></cfg>\n");
+    expect("<cfg>\n <a/>\n</cfg>\n", {"/cfg", "b"}, "<cfg>\n <a/>\n <b/>\n</cfg>\n");
+}

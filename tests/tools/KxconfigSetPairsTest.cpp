@@ -379,3 +379,11 @@ TEST_F(KxconfigSetPairs, RefusesAnAmpersandWithoutASemicolon)
                       "the new text is not XML text: write & as &amp;");
     }
 }
+
+TEST_F(KxconfigSetPairs, TakesAnEntityThatAnotherFileMayDeclare)
+{
+    const std::string file =
+        m_folder.Write("external.xml", "<!DOCTYPE cfg SYSTEM \"x.dtd\"><cfg><a>1</a></cfg>");
+    EXPECT_EQ(0, Tool({"set", file, "cfg.a", "&e;"}).status);
+    EXPECT_THAT(ReadFile(file), HasSubstr("<a>&e;</a>"));
+}

@@ -345,3 +345,32 @@ TEST_F(KxconfigUsage, ACommandToTypeIsQuotedForTheShell)
                     "\"-k\" is not an option; for an argument that starts with a dash, use --: "
                     "kxconfig get '' -- -k (kxconfig --help shows the usage)");
 }
+
+TEST_F(KxconfigUsage, HelpIsAsWideAsTheTerminal)
+{
+    if (!HasTerminals())
+    {
+        GTEST_SKIP() << "needs a terminal, and this machine gives out none";
+    }
+    std::istringstream lines(ScriptOnTerminal(
+        "stty cols 60; unset COLUMNS; " + InShell(KX_CONFIG_TOOL) + " get --help", {}));
+    size_t longest = 0;
+    for (std::string line; std::getline(lines, line);)
+    {
+        longest = std::max(longest, line.find_last_not_of("\r") + 1);
+    }
+    EXPECT_GT(longest, 50u);
+    EXPECT_LE(longest, 60u);
+}
+
+TEST_F(KxconfigUsage, AnUnknownTerminalHasNoColors)
+{
+    if (!HasTerminals())
+    {
+        GTEST_SKIP() << "needs a terminal, and this machine gives out none";
+    }
+    const std::string explain = InShell(KX_CONFIG_TOOL) + " explain " + m_plain + " cfg.net.ip";
+    EXPECT_THAT(ScriptOnTerminal("unset TERM NO_COLOR; " + explain, {}), Not(HasSubstr("\x1B")));
+    EXPECT_THAT(ScriptOnTerminal("unset NO_COLOR; TERM=xterm " + explain, {}),
+                HasSubstr("\x1B[32maccepted"));
+}

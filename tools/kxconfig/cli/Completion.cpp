@@ -326,7 +326,7 @@ private:
         {
             return arguments[m_arguments.size()]->get_name(true);
         }
-        const bool hasMore = !arguments.empty() && arguments.back()->get_items_expected_max() > 1;
+        const bool hasMore = arguments.back()->get_items_expected_max() > 1;
         return hasMore ? arguments.back()->get_name(true) : "";
     }
 

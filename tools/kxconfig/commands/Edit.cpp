@@ -19,9 +19,10 @@ Destination DestinationOf(const std::string& file, const SaveArguments& argument
                        std::chrono::seconds(arguments.waitSeconds));
 }
 
+/** The size at the end of a compressed file has a NUL, too, unless it is of 16 MiB and more. */
 bool IsText(const std::string& bytes)
 {
-    return bytes.find('\0') == std::string::npos && bytes.compare(0, 2, "\x1F\x8B") != 0;
+    return bytes.find('\0') == std::string::npos;
 }
 
 std::string NodeCount(size_t count)

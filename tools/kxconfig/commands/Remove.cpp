@@ -70,12 +70,11 @@ void RemoveNode(CXmlParser& parser, xmlNode* node, const std::string& expression
 void RemoveNodes(CXmlParser& parser, const std::vector<xmlNode*>& nodes,
                  const std::string& expression)
 {
-    const NodeSet selected(nodes.begin(), nodes.end());
     for (xmlNode* const node : nodes)
     {
         RequireRemovable(node, expression);
-        xmlNode* const indentation = LineBefore(node);
-        if (indentation != nullptr && selected.count(indentation) == 0)
+        // One that is selected itself comes before the node, and is removed already.
+        if (xmlNode* const indentation = LineBefore(node))
         {
             RemoveNode(parser, indentation, expression);
         }

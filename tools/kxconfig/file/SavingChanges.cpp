@@ -64,8 +64,7 @@ std::string KindOfDifference(const Place& place)
     {
         return "the notation of a character";
     }
-    if (before.compare(position, 2, "\"/") == 0 || after.compare(position, 2, "/>") == 0 ||
-        before.compare(position, 2, "/>") == 0)
+    if (after.compare(position, 2, "/>") == 0 || before.compare(position, 2, "/>") == 0)
     {
         return "the notation of an empty element";
     }
