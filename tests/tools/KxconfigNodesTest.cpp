@@ -194,6 +194,17 @@ TEST_F(KxconfigNodes, RemovesAttributesAndComments)
                  "    <!-- keep -->\n", "");
 }
 
+TEST_F(KxconfigNodes, LocationsThatFindPrintsSelectTheSameNodes)
+{
+    const std::string file = m_folder.Write("blanks.xml", "<cfg> <a/>one<a/>\n<a/>two</cfg>\n");
+    EXPECT_EQ("/cfg/text()[1] text \" \"\n"
+              "/cfg/text()[2] text \"one\"\n"
+              "/cfg/text()[3] text \"\\n\"\n"
+              "/cfg/text()[4] text \"two\"\n",
+              Tool({"find", file, "//text()"}).out);
+    EXPECT_EQ("/cfg/text()[2]: removed \"one\"\n", Tool({"remove", file, "/cfg/text()[2]"}).out);
+}
+
 TEST_F(KxconfigNodes, RemovesAllOnceAndWhatIsBelowWithIt)
 {
     EXPECT_EQ(4, Tool({"remove", m_file, "//net"}).status);

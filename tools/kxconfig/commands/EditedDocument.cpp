@@ -36,8 +36,6 @@ void RequireCount(size_t count, bool all, const std::string& expression, const s
 
 EditedDocument::EditedDocument(const std::string& file) : m_file(file)
 {
-    // Constructing a parser made the engine drop blanks, which are the form of the file.
-    xmlKeepBlanksDefault(1);
     LoadDocument(file, m_parser);
 }
 

@@ -111,6 +111,9 @@ LoadedReader LoadFile(const std::string& path, std::istream* standardInput)
 
 void LoadDocument(const std::string& path, CXmlParser& document, std::istream* standardInput)
 {
+    // Constructing the parser made the engine drop blanks. They are the form of a file that is saved,
+    // and count in the locations of other texts.
+    xmlKeepBlanksDefault(1);
     LoadWith([&](const std::string& file) { return document.ParseXml(file) == 0; }, path,
              standardInput);
 }

@@ -53,7 +53,7 @@ LoadedReader LoadFile(const std::string& path, std::istream* standardInput = nul
 void LoadWith(const std::function<bool(const std::string&)>& load, const std::string& path,
               std::istream* standardInput);
 
-/** Loads a file in the same way into a document of the toolkit. */
+/** Loads a file in the same way, with its blanks, into a document of the toolkit. */
 void LoadDocument(const std::string& path, CXmlParser& document,
                   std::istream* standardInput = nullptr);
 
