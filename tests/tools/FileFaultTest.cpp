@@ -4,9 +4,9 @@
 #include "FileCalls.h"
 #include "SharedAcl.h"
 
-#include "file/Attributes.h"
 #include "file/Debris.h"
 #include "file/Destination.h"
+#include "file/FileAttributes.h"
 #include "file/Input.h"
 #include "file/Replacement.h"
 #include "support/Files.h"

@@ -506,7 +506,7 @@ TEST_F(KxconfigCheck, ListsThreeOfTheAttributesThatRepeat)
     ExpectWarnings({"5: /cfg/a[3] has the same i=\"1\" j=\"2\" k=\"3\" ... as /cfg/a[1] (line 3)"});
 }
 
-TEST_F(KxconfigCheck, ReportsWhatSavingChangesFirst)
+TEST_F(KxconfigCheck, ReportsDifferencesAfterSavingFirst)
 {
     const auto expect = [this](const std::string& bytes, const std::vector<std::string>& warnings)
     {

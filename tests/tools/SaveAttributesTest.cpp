@@ -1,5 +1,5 @@
 #include "SharedAcl.h"
-#include "file/Attributes.h"
+#include "file/FileAttributes.h"
 
 #include "file/Descriptor.h"
 #include "support/Files.h"

@@ -1,10 +1,10 @@
 #include "checks/CheckSaving.h"
 
-#include "file/SavingChanges.h"
+#include "file/SaveDifferences.h"
 
 void CheckSaving(CXMLReader& reader, const std::string& file, Findings& findings)
 {
-    for (const Difference& difference : WhatSavingChanges(reader, file))
+    for (const Difference& difference : DifferencesAfterSaving(reader, file))
     {
         findings.Add(difference.line, Kind::ChangedBySaving, "saving changes " + difference.what);
     }

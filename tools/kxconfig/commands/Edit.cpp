@@ -1,7 +1,7 @@
 #include "commands/Edit.h"
 
-#include "file/Reload.h"
-#include "file/RoundTrip.h"
+#include "file/LoadsAgain.h"
+#include "file/SavedBytes.h"
 #include "output/UnifiedDiff.h"
 
 #include <nlohmann/json.hpp>

@@ -1,8 +1,8 @@
 #include "file/Destination.h"
 
-#include "file/Attributes.h"
 #include "file/Backup.h"
 #include "file/Debris.h"
+#include "file/FileAttributes.h"
 #include "file/Replacement.h"
 
 #include <ostream>

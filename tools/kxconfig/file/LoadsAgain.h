@@ -1,5 +1,5 @@
-#ifndef KX_TOOLS_RELOAD_H
-#define KX_TOOLS_RELOAD_H
+#ifndef KX_TOOLS_LOADSAGAIN_H
+#define KX_TOOLS_LOADSAGAIN_H
 
 #include <string>
 

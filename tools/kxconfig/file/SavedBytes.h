@@ -1,5 +1,5 @@
-#ifndef KX_TOOLS_ROUNDTRIP_H
-#define KX_TOOLS_ROUNDTRIP_H
+#ifndef KX_TOOLS_SAVEDBYTES_H
+#define KX_TOOLS_SAVEDBYTES_H
 
 #include <libxml/tree.h>
 

@@ -1,5 +1,5 @@
-#ifndef KX_TOOLS_SAVINGCHANGES_H
-#define KX_TOOLS_SAVINGCHANGES_H
+#ifndef KX_TOOLS_SAVEDIFFERENCES_H
+#define KX_TOOLS_SAVEDIFFERENCES_H
 
 #include "CXMLReader.h"
 
@@ -21,6 +21,6 @@ struct Difference
  * What would be saved is compared while the engine produces it; neither it nor the file is held in
  * memory.
  */
-std::vector<Difference> WhatSavingChanges(CXMLReader& reader, const std::string& path);
+std::vector<Difference> DifferencesAfterSaving(CXMLReader& reader, const std::string& path);
 
 #endif

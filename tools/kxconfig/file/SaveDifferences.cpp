@@ -1,4 +1,4 @@
-#include "file/SavingChanges.h"
+#include "file/SaveDifferences.h"
 
 #include "file/Load.h"
 #include "file/Nodes.h"
@@ -303,7 +303,7 @@ std::vector<Difference> Compare(std::istream& file, xmlDoc* document)
 
 } // namespace
 
-std::vector<Difference> WhatSavingChanges(CXMLReader& reader, const std::string& path)
+std::vector<Difference> DifferencesAfterSaving(CXMLReader& reader, const std::string& path)
 {
     std::error_code error;
     std::ifstream file(path, std::ios::binary);

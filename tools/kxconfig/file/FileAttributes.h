@@ -1,5 +1,5 @@
-#ifndef KX_TOOLS_ATTRIBUTES_H
-#define KX_TOOLS_ATTRIBUTES_H
+#ifndef KX_TOOLS_FILEATTRIBUTES_H
+#define KX_TOOLS_FILEATTRIBUTES_H
 
 #include <map>
 #include <string>

@@ -1,4 +1,4 @@
-#include "file/RoundTrip.h"
+#include "file/SavedBytes.h"
 
 #include "file/Engine.h"
 

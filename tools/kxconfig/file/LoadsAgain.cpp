@@ -1,4 +1,4 @@
-#include "file/Reload.h"
+#include "file/LoadsAgain.h"
 
 #include "file/Engine.h"
 #include "output/Failure.h"

@@ -1,4 +1,4 @@
-#include "file/Attributes.h"
+#include "file/FileAttributes.h"
 
 #include "file/Descriptor.h"
 
