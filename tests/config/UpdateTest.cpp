@@ -6,6 +6,7 @@
 #include "support/Files.h"
 #include "support/Log.h"
 #include "support/Memory.h"
+#include "support/ParsedDocument.h"
 
 #include <gtest/gtest.h>
 
@@ -36,18 +37,9 @@ std::ostream& operator<<(std::ostream& out, const Result& result)
     return out << result.status << ' ' << result.document;
 }
 
-class UpdateTest : public testing::Test
+class UpdateTest : public ParsedDocument
 {
 protected:
-    ~UpdateTest() override { xmlFreeDoc(m_document); }
-
-    void Load(const std::string& xml)
-    {
-        xmlFreeDoc(m_document);
-        m_document = ParseText(xml);
-        ASSERT_NE(nullptr, m_document) << xml;
-    }
-
     /** Updates the document in place through a writer that is detached again. */
     int Set(const std::string& key, const std::string& value)
     {
@@ -73,8 +65,6 @@ protected:
     }
 
     xmlNodePtr Root() const { return xmlDocGetRootElement(m_document); }
-
-    xmlDocPtr m_document = nullptr;
 };
 
 const std::string kPair = "<cfg><p n=\"1\"><v>a</v></p><p n=\"2\"><v>b</v></p></cfg>";

@@ -47,7 +47,7 @@ class WriteFaultTest : public testing::Test
 {
 protected:
     /** Calls @p save with room for ever more bytes, until the file fits. */
-    void FailInTurn(const std::function<int()>& save, std::size_t step)
+    void SaveWithEverMoreRoom(const std::function<int()>& save, std::size_t step)
     {
         ASSERT_EQ(0, save());
         const std::string whole = ReadFile(m_file);
@@ -94,26 +94,26 @@ TEST_F(WriteFaultTest, WriterAfterEachByte)
 {
     CXMLWriter writer(m_small);
     writer.SetPath(m_file);
-    FailInTurn([&] { return writer.SaveData(); }, 1);
+    SaveWithEverMoreRoom([&] { return writer.SaveData(); }, 1);
 }
 
 TEST_F(WriteFaultTest, WriterWithinEachBlock)
 {
     CXMLWriter writer(m_large);
     writer.SetPath(m_file);
-    FailInTurn([&] { return writer.SaveData(); }, 1000);
+    SaveWithEverMoreRoom([&] { return writer.SaveData(); }, 1000);
 }
 
 TEST_F(WriteFaultTest, DocumentAfterEachByte)
 {
     CXmlParser parser;
     ASSERT_EQ(0, parser.ParseXml(m_small));
-    FailInTurn([&] { return parser.SaveXml(m_file); }, 1);
+    SaveWithEverMoreRoom([&] { return parser.SaveXml(m_file); }, 1);
 }
 
 TEST_F(WriteFaultTest, DocumentWithinEachBlock)
 {
     CXmlParser parser;
     ASSERT_EQ(0, parser.ParseXml(m_large));
-    FailInTurn([&] { return parser.SaveXml(m_file); }, 1000);
+    SaveWithEverMoreRoom([&] { return parser.SaveXml(m_file); }, 1000);
 }

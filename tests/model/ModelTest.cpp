@@ -6,6 +6,7 @@
 #include "model/Shrink.h"
 
 #include "support/Engine.h"
+#include "support/ParsedDocument.h"
 
 #include <gtest/gtest.h>
 
@@ -15,18 +16,9 @@ using namespace kxtest;
 namespace
 {
 
-class ModelTest : public testing::Test
+class ModelTest : public ParsedDocument
 {
 protected:
-    ~ModelTest() override { xmlFreeDoc(m_document); }
-
-    void Load(const std::string& xml)
-    {
-        xmlFreeDoc(m_document);
-        m_document = ParseText(xml);
-        ASSERT_NE(nullptr, m_document) << xml;
-    }
-
     /** @return the text of both forms and the status. */
     std::string Found(const std::string& xml, const std::string& key)
     {
@@ -45,8 +37,6 @@ protected:
         const std::string text = Serialized(m_document);
         return std::to_string(status) + text.substr(text.find('\n'), text.rfind('\n') - 38);
     }
-
-    xmlDocPtr m_document = nullptr;
 };
 
 const std::string kName = "<name>box</name>";

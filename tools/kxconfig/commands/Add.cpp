@@ -127,6 +127,6 @@ ExitStatus Add(const AddArguments& arguments, Report& report)
     const std::vector<xmlNode*> places = document.Select(arguments.expression, arguments.all);
     RequirePlaces(places, arguments);
     const std::vector<xmlNode*> added = AddNodes(places, arguments);
-    edit.RequireTexts(document.Get(), arguments.content);
+    edit.RequireLoadable(document.Get(), arguments.content);
     return edit.Finish(document.Get(), Additions(added));
 }

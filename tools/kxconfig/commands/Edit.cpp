@@ -53,7 +53,7 @@ void Edit::Warn(const std::string& warning)
     }
 }
 
-void Edit::RequireTexts(xmlDoc* document, const std::string& value) const
+void Edit::RequireLoadable(xmlDoc* document, const std::string& value) const
 {
     if (value.find('&') != std::string::npos)
     {
@@ -64,10 +64,10 @@ void Edit::RequireTexts(xmlDoc* document, const std::string& value) const
 ExitStatus Edit::Finish(xmlDoc* document, const std::vector<Change>& changes)
 {
     RequireExpected(changes.size());
-    const bool isSaved = !changes.empty() || SavesElsewhere();
-    const std::string bytes = isSaved ? SavedBytes(document) : "";
-    const std::string diff = isSaved && m_arguments.diff ? Diff(bytes) : "";
-    const ExitStatus status = isSaved ? Save(bytes) : ExitStatus::Done;
+    const bool mustSave = !changes.empty() || SavesElsewhere();
+    const std::string bytes = mustSave ? SavedBytes(document) : "";
+    const std::string diff = mustSave && m_arguments.diff ? Diff(bytes) : "";
+    const ExitStatus status = mustSave ? Save(bytes) : ExitStatus::Done;
     if (!m_arguments.quiet)
     {
         Print(changes);

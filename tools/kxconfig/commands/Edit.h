@@ -42,12 +42,13 @@ public:
     void Warn(const std::string& warning);
 
     /**
-     * Requires that the texts of @p document can be compared, after @p value became one of them. Of
-     * an entity that contains itself, or multiplies, they cannot: the file would not load.
+     * Requires that @p document loads again, after @p value became one of its texts: references in
+     * it can make an entity contain itself, or multiply.
      */
-    void RequireTexts(xmlDoc* document, const std::string& value) const;
+    void RequireLoadable(xmlDoc* document, const std::string& value) const;
 
-    /** Saves @p document, if @p changes says that it was changed, and prints the changes. */
+    /** Saves @p document, if there are @p changes or it is saved to another file, and prints them.
+     */
     ExitStatus Finish(xmlDoc* document, const std::vector<Change>& changes);
 
 private:

@@ -98,7 +98,7 @@ private:
         return StartsAtRoot(DocumentOf(m_reader), key)
                    ? "nothing found: no element of " + m_arguments.file + " has a value under " +
                          Quoted(key)
-                   : "nothing found: " + CompareWithRoot(key, m_arguments.file, m_reader);
+                   : "nothing found: " + OtherRootMessage(key, m_arguments.file, m_reader);
     }
 
     const GetArguments& m_arguments;

@@ -18,7 +18,7 @@ void RequireWellFormedKey(const std::string& key)
     }
 }
 
-std::string CompareWithRoot(const std::string& key, const std::string& file, CXMLReader& reader)
+std::string OtherRootMessage(const std::string& key, const std::string& file, CXMLReader& reader)
 {
     const kx::TextView first = kx::KeySplit(kx::TextView(key)).First();
     return "the key starts with " + Quoted(Text(first)) + ", but the root element of " + file +
@@ -31,6 +31,6 @@ void RequireKey(const std::string& key, const std::string& file, CXMLReader& rea
     if (!StartsAtRoot(DocumentOf(reader), key))
     {
         throw Failure(ExitStatus::NothingFound,
-                      "nothing found: " + CompareWithRoot(key, file, reader));
+                      "nothing found: " + OtherRootMessage(key, file, reader));
     }
 }

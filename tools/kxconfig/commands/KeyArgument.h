@@ -8,12 +8,13 @@ class CXMLReader;
 /** Throws a Failure unless @p key names the root element and at least one more. */
 void RequireWellFormedKey(const std::string& key);
 
-/** @return that @p key starts with another name than the root of @p reader, which is @p file. */
-std::string CompareWithRoot(const std::string& key, const std::string& file, CXMLReader& reader);
+/** @return the message that @p key starts with another name than the root of @p reader, which is
+ * @p file. */
+std::string OtherRootMessage(const std::string& key, const std::string& file, CXMLReader& reader);
 
 /**
- * The same, and requires that @p key starts with the name of the root of @p reader: to the library
- * itself another name is success.
+ * Requires that @p key is well-formed and starts with the name of the root of @p reader: to the
+ * library itself another name is success.
  *
  * @param file  the name of the document, for the message.
  */

@@ -22,7 +22,7 @@
 namespace
 {
 
-std::vector<KeyValue> PairsOf(const SetArguments& arguments)
+std::vector<Assignment> AssignmentsOf(const SetArguments& arguments)
 {
     std::vector<std::string> words = {arguments.key};
     words.insert(words.end(), arguments.values.begin(), arguments.values.end());
@@ -30,16 +30,16 @@ std::vector<KeyValue> PairsOf(const SetArguments& arguments)
     {
         words.push_back(ReadValue(arguments.valueFile, *arguments.input));
     }
-    std::vector<KeyValue> pairs;
+    std::vector<Assignment> assignments;
     for (size_t i = 0; i != words.size(); i += 2)
     {
-        pairs.push_back({words[i], words[i + 1]});
+        assignments.push_back({words[i], words[i + 1]});
     }
-    return pairs;
+    return assignments;
 }
 
 /** Requires a value for each key. */
-void RequirePairs(const SetArguments& arguments)
+void RequireValues(const SetArguments& arguments)
 {
     const bool hasFile = !arguments.valueFile.empty();
     if (hasFile && !arguments.values.empty())
@@ -55,21 +55,21 @@ void RequirePairs(const SetArguments& arguments)
     }
 }
 
-void Update(CXMLWriter& writer, const KeyValue& pair, const std::string& file)
+void Update(CXMLWriter& writer, const Assignment& assignment, const std::string& file)
 {
     const FirstEngineError error;
-    const int status = writer.SetValue(pair.key, pair.value);
+    const int status = writer.SetValue(assignment.key, assignment.value);
     error.RequireMemory();
     if (status == kx::StatusNotFound)
     {
         throw Failure(ExitStatus::NothingFound, "nothing found: no element of " + file +
                                                     " has text that can be replaced under " +
-                                                    Quoted(pair.key));
+                                                    Quoted(assignment.key));
     }
     if (status != kx::StatusOk)
     {
         throw Failure(ExitStatus::BadUsage,
-                      "malformed key " + Quoted(pair.key) + ": it ends in \".\"");
+                      "malformed key " + Quoted(assignment.key) + ": it ends in \".\"");
     }
 }
 
@@ -133,28 +133,22 @@ public:
     {
     }
 
-    void Apply(const KeyValue& pair)
+    void Apply(const Assignment& assignment)
     {
-        RequireKey(pair.key, m_arguments.file, m_reader);
-        RequireXmlText(pair.value);
-        RequireDeclaredEntities(pair.value, DocumentOf(m_reader));
+        xmlDoc* const document = DocumentOf(m_reader);
+        RequireKey(assignment.key, m_arguments.file, m_reader);
+        RequireXmlText(assignment.value);
+        RequireDeclaredEntities(assignment.value, document);
         m_changes.BeginUpdate();
-        const std::vector<const xmlNode*> found = ElementsOfLookup(DocumentOf(m_reader), pair.key);
+        const std::vector<const xmlNode*> found = ElementsOfLookup(document, assignment.key);
         if (m_arguments.create && found.empty())
         {
-            CreateElements(DocumentOf(m_reader), pair.key, pair.value, m_changes);
-            m_edit.RequireTexts(DocumentOf(m_reader), pair.value);
-            return;
+            CreateElements(document, assignment.key, assignment.value, m_changes);
+            m_edit.RequireLoadable(document, assignment.value);
         }
-        const auto texts = TextsOf(ElementsOfUpdate(DocumentOf(m_reader), pair.key));
-        Update(m_writer.Get(), pair, m_arguments.file);
-        RequireStored(texts, pair.value);
-        m_edit.RequireTexts(DocumentOf(m_reader), pair.value);
-        const std::vector<ElementText> changed = Changed(texts);
-        m_edit.Warn(ReachWarning(pair.key, changed, found));
-        for (const ElementText& text : changed)
+        else
         {
-            m_changes.NoteChanged(text.element, text.text);
+            ReplaceTexts(assignment, found);
         }
     }
 
@@ -173,6 +167,22 @@ public:
     }
 
 private:
+    /** @param found  the elements that a lookup finds. */
+    void ReplaceTexts(const Assignment& assignment, const std::vector<const xmlNode*>& found)
+    {
+        xmlDoc* const document = DocumentOf(m_reader);
+        const auto texts = TextsOf(ElementsOfUpdate(document, assignment.key));
+        Update(m_writer.Get(), assignment, m_arguments.file);
+        RequireStored(texts, assignment.value);
+        m_edit.RequireLoadable(document, assignment.value);
+        const std::vector<ElementText> changed = Changed(texts);
+        m_edit.Warn(ReachWarning(assignment.key, changed, found));
+        for (const ElementText& text : changed)
+        {
+            m_changes.NoteChanged(text.element, text.text);
+        }
+    }
+
     CXMLReader& m_reader;
     GuestWriter m_writer;
     const SetArguments& m_arguments;
@@ -184,18 +194,19 @@ private:
 
 ExitStatus Set(const SetArguments& arguments, Report& report)
 {
-    RequirePairs(arguments);
-    const std::vector<KeyValue> pairs = PairsOf(arguments); // before the lock: input can be slow
+    RequireValues(arguments);
+    const std::vector<Assignment> assignments =
+        AssignmentsOf(arguments); // before the lock: input can be slow
     Edit edit(arguments.file, arguments.saving, report);
     if (arguments.byNode)
     {
-        return SetNodes(pairs, arguments, edit);
+        return SetNodes(assignments, arguments.file, arguments.all, edit);
     }
     const LoadedReader reader = LoadFile(arguments.file);
     Updates updates(*reader, arguments, edit);
-    for (const KeyValue& pair : pairs)
+    for (const Assignment& assignment : assignments)
     {
-        updates.Apply(pair);
+        updates.Apply(assignment);
     }
     return updates.Finish();
 }

@@ -64,21 +64,22 @@ void SetContent(xmlNode* node, const std::string& value)
 
 } // namespace
 
-ExitStatus SetNodes(const std::vector<KeyValue>& pairs, const SetArguments& arguments, Edit& edit)
+ExitStatus SetNodes(const std::vector<Assignment>& assignments, const std::string& file, bool all,
+                    Edit& edit)
 {
-    EditedDocument document(arguments.file);
+    EditedDocument document(file);
     std::vector<NodeText> texts;
-    for (const KeyValue& pair : pairs)
+    for (const Assignment& assignment : assignments)
     {
-        RequireXmlText(pair.value);
-        RequireDeclaredEntities(pair.value, document.Get());
-        for (xmlNode* const node : document.Select(pair.key, arguments.all))
+        RequireXmlText(assignment.value);
+        RequireDeclaredEntities(assignment.value, document.Get());
+        for (xmlNode* const node : document.Select(assignment.key, all))
         {
-            RequireReplaceable(node, pair.key);
+            RequireReplaceable(node, assignment.key);
             texts.push_back({node, ContentOf(node)});
-            SetContent(node, pair.value);
+            SetContent(node, assignment.value);
         }
-        edit.RequireTexts(document.Get(), pair.value);
+        edit.RequireLoadable(document.Get(), assignment.value);
     }
     return edit.Finish(document.Get(), ChangesOf(texts));
 }

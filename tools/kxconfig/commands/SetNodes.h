@@ -1,19 +1,19 @@
 #ifndef KX_TOOLS_SETNODES_H
 #define KX_TOOLS_SETNODES_H
 
-#include "commands/Set.h"
+#include "commands/Assignment.h"
+#include "commands/Edit.h"
+#include "output/ExitStatus.h"
 
 #include <string>
 #include <vector>
 
-/** A key path or an XPath expression, and the new text under it. */
-struct KeyValue
-{
-    std::string key;
-    std::string value;
-};
-
-/** The part of kxconfig set after the lock, for expressions in place of keys. */
-ExitStatus SetNodes(const std::vector<KeyValue>& pairs, const SetArguments& arguments, Edit& edit);
+/**
+ * The part of kxconfig set after the lock, for expressions in place of keys.
+ *
+ * @param all  whether an expression may select more than one node.
+ */
+ExitStatus SetNodes(const std::vector<Assignment>& assignments, const std::string& file, bool all,
+                    Edit& edit);
 
 #endif

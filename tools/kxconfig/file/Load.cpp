@@ -38,7 +38,8 @@ void RequireParsed(bool isParsed, const Input& input, const std::string& path,
     {
         return;
     }
-    // Some lacks of memory look like an error of the file, which the same file then has no more.
+    // Running out of memory can look like an error of the file: if the file parses now, it was
+    // that.
     if (IsWellFormed(input.Path()))
     {
         throw std::bad_alloc();
@@ -70,7 +71,7 @@ void KeepLoaded()
     g_keptCount = 0;
 }
 
-bool IsKept(void* loaded)
+bool Keep(void* loaded)
 {
     if (g_keptCount == g_kept.size() || g_LumLogParams.xmlConfigParserMask != 0)
     {
@@ -111,8 +112,8 @@ LoadedReader LoadFile(const std::string& path, std::istream* standardInput)
 
 void LoadDocument(const std::string& path, CXmlParser& document, std::istream* standardInput)
 {
-    // Constructing the parser made the engine drop blanks. They are the form of a file that is saved,
-    // and count in the locations of other texts.
+    // Constructing the parser made the engine drop blanks. They are the form of a file that is
+    // saved, and count in the locations of other texts.
     xmlKeepBlanksDefault(1);
     LoadWith([&](const std::string& file) { return document.ParseXml(file) == 0; }, path,
              standardInput);

@@ -17,15 +17,15 @@ struct _xmlDoc;
  */
 void KeepLoaded();
 
-/** @return whether @p loaded is kept. */
-bool IsKept(void* loaded);
+/** Keeps @p loaded where a leak checker finds it, if it is to be kept. @return whether it is. */
+bool Keep(void* loaded);
 
 struct LoadedDeleter
 {
     template <class Loaded>
     void operator()(Loaded* loaded) const
     {
-        if (!IsKept(loaded))
+        if (!Keep(loaded))
         {
             delete loaded;
         }

@@ -1,9 +1,9 @@
 #include "output/Progress.h"
 
+#include "output/Terminal.h"
+
 #include <algorithm>
 #include <cerrno>
-#include <cstdlib>
-#include <cstring>
 
 #include <sys/time.h>
 #include <unistd.h>
@@ -62,10 +62,8 @@ void Every(time_t seconds)
 
 Progress::Progress()
 {
-    const char* const terminal = std::getenv("TERM");
-    const bool isDumb = terminal == nullptr || std::strcmp(terminal, "dumb") == 0;
     sigaction(SIGALRM, nullptr, &m_former);
-    m_handles = !isDumb && m_former.sa_handler == SIG_DFL;
+    m_handles = !IsDumbTerminal() && m_former.sa_handler == SIG_DFL;
     g_isActive = m_handles;
     if (m_handles)
     {

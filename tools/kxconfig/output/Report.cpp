@@ -31,9 +31,7 @@ bool ShowsColors(const std::ostream& stream, ColorChoice choice)
     {
         return choice == ColorChoice::Always;
     }
-    const char* const terminal = std::getenv("TERM");
-    const bool isDumb = terminal == nullptr || std::strcmp(terminal, "dumb") == 0;
-    return IsTerminal(stream) && !isDumb && !IsSet("NO_COLOR");
+    return IsTerminal(stream) && !IsDumbTerminal() && !IsSet("NO_COLOR");
 }
 
 const char* StartOf(Color color)

@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <cstdlib>
+#include <cstring>
 #include <iostream>
 
 #include <sys/ioctl.h>
@@ -34,6 +35,12 @@ bool IsTerminal(const std::ostream& stream)
 {
     return (stream.rdbuf() == std::cout.rdbuf() && isatty(STDOUT_FILENO) == 1) ||
            (stream.rdbuf() == std::cerr.rdbuf() && isatty(STDERR_FILENO) == 1);
+}
+
+bool IsDumbTerminal()
+{
+    const char* const terminal = std::getenv("TERM");
+    return terminal == nullptr || std::strcmp(terminal, "dumb") == 0;
 }
 
 size_t OutputWidth()
