@@ -26,7 +26,8 @@ std::string DescribeTerm(const xmlNode* element, const TestedTerm& term)
         return "a term without an attribute name is never true";
     }
     const std::optional<std::string> actual = ActualValue(element, term);
-    std::string text = OnOneLine(Text(term.attribute)) + " is " + (actual ? Quoted(*actual) : "absent");
+    std::string text =
+        OnOneLine(Text(term.attribute)) + " is " + (actual ? Quoted(*actual) : "absent");
     text += term.holds ? "" : ", not " + Quoted(Text(term.expected));
     if (term.endsWithOr && term.expected.find('&') != std::string_view::npos)
     {

@@ -8,7 +8,6 @@
 
 #include <atomic>
 #include <cstdlib>
-#include <cstring>
 #include <exception>
 #include <new>
 #include <ostream>
