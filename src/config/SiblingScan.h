@@ -23,7 +23,7 @@ public:
           m_condition(segment.condition),
           m_next(parent->children),
           m_element(0),
-          m_isNamed(true),
+          m_isNamed(true), // so that nothing suspends the condition for the first element
           m_isSuspended(false)
     {
     }

@@ -38,10 +38,12 @@ public:
      */
     bool Next()
     {
-        xmlNode* next = m_element == 0 ? First() : IsRejected() ? AfterRejection() : FirstBelow();
+        xmlNode* next = m_element == 0 ? First()
+                        : IsRejected() ? SiblingAfterRejection()
+                                       : BelowOrSibling();
         while (next == 0 && m_element != 0 && !m_levels.IsTop())
         {
-            next = AfterLevel();
+            next = SiblingOfParent();
         }
         if (next == 0)
         {
@@ -101,45 +103,45 @@ private:
      * a key is lost instead, and an empty name wanted: clients rely on the siblings staying as they
      * are.
      */
-    xmlNode* AfterRejection()
+    xmlNode* SiblingAfterRejection()
     {
         m_wanted = m_levels.Current().IsLast() ? &m_nothing : &m_levels.Current().first;
         return ElementFrom(m_element->next);
     }
 
     /** @return the first element of the level below, or the next of this one if there is none. */
-    xmlNode* FirstBelow()
+    xmlNode* BelowOrSibling()
     {
         if (EndsHere())
         {
             m_status = StatusMissing;
-            return After();
+            return SiblingByRest();
         }
         m_status = StatusOk;
         LogKey(m_levels.Current().rest);
         xmlNode* const child = ElementFrom(m_element->children);
         if (child == 0)
         {
-            return After();
+            return SiblingByRest();
         }
         m_levels.Descend();
         m_wanted = &m_levels.Current().first;
         return child;
     }
 
-    /** @return the element after the one whose level is left. */
-    xmlNode* AfterLevel()
+    /** Leaves the level. @return the element after the one whose level it was. */
+    xmlNode* SiblingOfParent()
     {
         m_element = m_element->parent;
         m_levels.Ascend();
-        return After();
+        return SiblingByRest();
     }
 
     /**
      * Only the first element child is compared with the segment itself, the siblings after it with
      * the rest of the key. Clients rely on what an update reaches by that.
      */
-    xmlNode* After()
+    xmlNode* SiblingByRest()
     {
         m_wanted = &m_levels.Current().later;
         return ElementFrom(m_element->next);
