@@ -300,7 +300,7 @@ TEST_F(KxconfigNodes, SettingTheSameTextChangesNothing)
 TEST_F(KxconfigNodes, OnlyALineOfItsOwnIsRemovedWithANode)
 {
     const std::string before =
-        m_before.substr(0, m_before.find('\n') + 1) + "<cfg><a/> <b/>x<c/>y\n<d/></cfg>\n";
+        m_before.substr(0, m_before.find('\n') + 1) + "<cfg><a/> <b/>x<c/>y\n<d/>\n<e/>z</cfg>\n";
     const auto expect = [&](const std::string& node, const std::string& tag)
     {
         WriteFile(m_file, before);
@@ -312,6 +312,7 @@ TEST_F(KxconfigNodes, OnlyALineOfItsOwnIsRemovedWithANode)
     expect("/cfg/b", "<b/>");
     expect("/cfg/c", "<c/>");
     expect("/cfg/d", "<d/>");
+    expect("/cfg/e", "<e/>");
 }
 
 TEST_F(KxconfigNodes, AnElementIsAddedOnALineOnlyWhereTheOneBeforeIsOnOne)
