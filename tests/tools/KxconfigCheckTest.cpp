@@ -773,3 +773,14 @@ TEST_F(KxconfigCheck, CutsALongTextOfNoCharacters)
     EXPECT_THAT(Check({"--notes"}).out,
                 HasSubstr("the encoding of a character: \"" + shown + "\"... becomes "));
 }
+
+TEST_F(KxconfigCheck, NamesTheFirstOfTheElementsThatRepeatOthers)
+{
+    const std::string rest = "<a i='3'>v</a><a i='4'>v</a></cfg>";
+    Write("<cfg>\n<a i='2'>v</a>\n<a i='2'>v</a>\n<a i='1'>v</a>\n<a i='1'>v</a>" + rest);
+    ExpectWarnings({"4: /cfg/a[2] has the same i=\"2\" as /cfg/a[1] (line 3); 1 more of that name "
+                    "repeat others"});
+    Write("<cfg>\n<a i='1'>v</a>\n<a i='1'>v</a>\n<a i='2'>v</a>\n<a i='2'>v</a>" + rest);
+    ExpectWarnings({"4: /cfg/a[2] has the same i=\"1\" as /cfg/a[1] (line 3); 1 more of that name "
+                    "repeat others"});
+}

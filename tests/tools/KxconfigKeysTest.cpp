@@ -303,3 +303,16 @@ TEST_F(KxconfigKeys, AnAttributeWithADotInItsNameDistinguishesNoElements)
         m_folder.Write("dot.xml", "<cfg><a x.y='1'>p</a><a x.y='2'>q</a></cfg>");
     EXPECT_EQ("cfg.a\t\"p\\nq\"\n", Tool({"keys", file}).out);
 }
+
+TEST_F(KxconfigKeys, EscapesADelete)
+{
+    EXPECT_EQ("cfg.a\t\"x\\x7fy\"\n",
+              Tool({"keys", m_folder.Write("del.xml", "<cfg><a>x&#127;y</a></cfg>")}).out);
+}
+
+TEST_F(KxconfigKeys, LeavesOutTheElementsOfAnEntity)
+{
+    const std::string file = m_folder.Write(
+        "entity.xml", "<!DOCTYPE cfg [<!ENTITY e '<x>1</x>'>]><cfg><a>&e;</a><b>2</b></cfg>");
+    EXPECT_EQ("cfg.b\t\"2\"\n", Tool({"keys", file}).out);
+}
