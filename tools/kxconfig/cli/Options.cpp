@@ -11,7 +11,7 @@
 namespace
 {
 
-const int g_longestWait = 1000000; // seconds
+const int kLongestWait = 1000000; // seconds
 
 /** To the engine "-" is standard input or output; a user who writes it here means something else.
  */
@@ -114,7 +114,7 @@ void AddSaving(CLI::App& command, SaveArguments& arguments)
         .add_option("--wait", arguments.waitSeconds,
                     "wait this long while another process has the file locked; default: 10")
         ->type_name("SECONDS")
-        ->check(CLI::Validator(CLI::Range(0, g_longestWait)).description(""));
+        ->check(CLI::Validator(CLI::Range(0, kLongestWait)).description(""));
     command.add_flag("--drop-attributes", arguments.dropAttributes,
                      "save even if the owner, the ACL or the like would be lost");
     command

@@ -51,7 +51,7 @@ void RequireCharacter(const std::string& digits, int base)
     const auto [stop, error] = std::from_chars(digits.data(), end, code, base);
     if (stop != end || error == std::errc::invalid_argument)
     {
-        RefuseValue(g_bareAmpersand);
+        RefuseValue(kBareAmpersand);
     }
     // The engine drops &#0; and stores less of the value than was given.
     if (error != std::errc() || !xmlIsCharQ(code))
@@ -70,7 +70,7 @@ void RequireReference(const std::string& text)
     }
     else if (text.empty() || text.find_first_of("&< \t\r\n") != std::string::npos)
     {
-        RefuseValue(g_bareAmpersand);
+        RefuseValue(kBareAmpersand);
     }
 }
 
@@ -83,7 +83,7 @@ void ForEachReference(const std::string& value, Check check)
         const size_t end = value.find(';', at);
         if (end == std::string::npos)
         {
-            RefuseValue(g_bareAmpersand);
+            RefuseValue(kBareAmpersand);
         }
         check(value.substr(at + 1, end - at - 1));
         at = value.find('&', end);
@@ -113,7 +113,7 @@ bool HasNoncharacters(const std::string& value)
 
 } // namespace
 
-const char* const g_bareAmpersand = "write & as &amp;";
+const char* const kBareAmpersand = "write & as &amp;";
 
 void RefuseValue(const std::string& why)
 {

@@ -23,6 +23,6 @@ void RequireDeclaredEntities(const std::string& value, const _xmlDoc* document);
 std::string ReadValue(const std::string& file, std::istream& input);
 
 /** The reason for the most common mistake in a value. */
-extern const char* const g_bareAmpersand;
+extern const char* const kBareAmpersand;
 
 #endif

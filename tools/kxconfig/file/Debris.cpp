@@ -10,17 +10,17 @@
 namespace
 {
 
-const std::string g_start = ".kxconfig-";
-const std::string g_end = ".tmp";
-const char* const g_digits = "0123456789abcdef";
-const size_t g_digitCount = 16;
+const std::string kNameStart = ".kxconfig-";
+const std::string kNameEnd = ".tmp";
+const char* const kDigits = "0123456789abcdef";
+const size_t kDigitCount = 16;
 
 bool IsNameOfReplacement(const std::string& name)
 {
-    const size_t size = g_start.size() + g_digitCount + g_end.size();
-    return name.size() == size && name.compare(0, g_start.size(), g_start) == 0 &&
-           name.find_first_not_of(g_digits, g_start.size()) == size - g_end.size() &&
-           name.compare(size - g_end.size(), g_end.size(), g_end) == 0;
+    const size_t size = kNameStart.size() + kDigitCount + kNameEnd.size();
+    return name.size() == size && name.compare(0, kNameStart.size(), kNameStart) == 0 &&
+           name.find_first_not_of(kDigits, kNameStart.size()) == size - kNameEnd.size() &&
+           name.compare(size - kNameEnd.size(), kNameEnd.size(), kNameEnd) == 0;
 }
 
 bool IsRegular(int folder, const char* name)
@@ -58,12 +58,12 @@ std::string NameOfReplacement()
 {
     std::random_device random;
     std::uniform_int_distribution<size_t> digit(0, 15);
-    std::string name = g_start;
-    for (size_t i = 0; i != g_digitCount; ++i)
+    std::string name = kNameStart;
+    for (size_t i = 0; i != kDigitCount; ++i)
     {
-        name += g_digits[digit(random)];
+        name += kDigits[digit(random)];
     }
-    return name + g_end;
+    return name + kNameEnd;
 }
 
 void RemoveDebris(const Place& place)

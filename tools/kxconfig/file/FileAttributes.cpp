@@ -11,7 +11,7 @@
 namespace
 {
 
-const char* const g_acl = "system.posix_acl_access";
+const char* const kAcl = "system.posix_acl_access";
 
 /** Whether an attribute is a checksum of the content or of the inode: copied, it would be wrong. */
 bool IsChecksum(const std::string& name)
@@ -65,7 +65,7 @@ std::optional<std::string> ValueOf(int file, const std::string& name)
 
 std::string InWords(const std::string& name)
 {
-    return name == g_acl ? "its ACL" : "the attribute " + name;
+    return name == kAcl ? "its ACL" : "the attribute " + name;
 }
 
 unsigned TwoBytes(const std::string& bytes, size_t position)
@@ -122,17 +122,17 @@ bool Attributes::GiveExtended(int file) const
 {
     for (const std::string& name : NamesOf(file))
     {
-        if (m_extended.count(name) == 0 || name == g_acl)
+        if (m_extended.count(name) == 0 || name == kAcl)
         {
             fremovexattr(file, name.c_str()); // the ACL is one that the folder gives to new files
         }
     }
-    bool hasAcl = m_extended.count(g_acl) == 0;
+    bool hasAcl = m_extended.count(kAcl) == 0;
     for (const auto& [name, value] : m_extended)
     {
         const bool done =
             !IsChecksum(name) && fsetxattr(file, name.c_str(), value.data(), value.size(), 0) == 0;
-        hasAcl = hasAcl || (done && name == g_acl);
+        hasAcl = hasAcl || (done && name == kAcl);
     }
     return hasAcl;
 }
@@ -142,7 +142,7 @@ mode_t Attributes::ModeWithoutAcl() const
 {
     const unsigned groupTag = 4;
     const mode_t most = (m_status.st_mode & 070U) >> 3;
-    const mode_t group = RightsIn(m_extended.at(g_acl), groupTag) & most;
+    const mode_t group = RightsIn(m_extended.at(kAcl), groupTag) & most;
     return (m_status.st_mode & 0707U) | group << 3;
 }
 
@@ -176,7 +176,7 @@ std::vector<std::string> Attributes::MissingFrom(const Attributes& other) const
     };
     add(other.m_status.st_uid != m_status.st_uid, "its owner");
     add(other.m_status.st_gid != m_status.st_gid, "its group");
-    const bool hasNewAcl = other.m_extended.count(g_acl) > m_extended.count(g_acl);
+    const bool hasNewAcl = other.m_extended.count(kAcl) > m_extended.count(kAcl);
     const bool differs = other.m_status.st_mode != m_status.st_mode || hasNewAcl;
     add(missing.empty() && differs, "its permissions");
     for (const auto& [name, value] : m_extended)

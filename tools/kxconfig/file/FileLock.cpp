@@ -12,7 +12,7 @@ namespace
 using Clock = std::chrono::steady_clock;
 
 // Two updates of a small file fit between two looks.
-const std::chrono::milliseconds g_betweenLooks(5);
+const std::chrono::milliseconds kBetweenLooks(5);
 
 /** @return the result of the attempt to lock @p file at once. */
 FileLock::State Lock(int file)
@@ -33,7 +33,7 @@ FileLock::FileLock(const Place& place, std::chrono::milliseconds wait)
     Try(place);
     while (m_state == State::Busy && Clock::now() < end)
     {
-        std::this_thread::sleep_for(std::min<Clock::duration>(g_betweenLooks, end - Clock::now()));
+        std::this_thread::sleep_for(std::min<Clock::duration>(kBetweenLooks, end - Clock::now()));
         Try(place);
     }
 }

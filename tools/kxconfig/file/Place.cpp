@@ -10,7 +10,7 @@ namespace fs = std::filesystem;
 namespace
 {
 
-const int g_mostLinks = 40; // as many as the kernel follows
+const int kMostLinks = 40; // as many as the kernel follows
 
 /** @return the path at the end of the symbolic links that @p path leads to. */
 fs::path FollowLinks(fs::path path)
@@ -18,7 +18,7 @@ fs::path FollowLinks(fs::path path)
     std::error_code error;
     for (int links = 0; fs::is_symlink(fs::symlink_status(path, error)); ++links)
     {
-        if (links == g_mostLinks)
+        if (links == kMostLinks)
         {
             throw std::system_error(ELOOP, std::generic_category());
         }
@@ -83,7 +83,7 @@ std::optional<int> DescriptorNamedBy(const std::string& path)
     const fs::path own = "/proc/" + std::to_string(getpid()) + "/fd";
     std::error_code error;
     fs::path name = path;
-    for (int links = 0; links != g_mostLinks; ++links)
+    for (int links = 0; links != kMostLinks; ++links)
     {
         if (fs::canonical(name.parent_path().empty() ? "." : name.parent_path(), error) == own)
         {

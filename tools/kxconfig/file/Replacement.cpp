@@ -8,14 +8,14 @@
 namespace
 {
 
-const int g_mostAttempts = 8;
+const int kMostAttempts = 8;
 
 } // namespace
 
 Replacement::Replacement(const Place& place, mode_t mode) : m_place(place)
 {
     bool isMade = MakeUnnamed(mode);
-    for (int attempt = 0; !isMade && attempt != g_mostAttempts; ++attempt)
+    for (int attempt = 0; !isMade && attempt != kMostAttempts; ++attempt)
     {
         isMade = MakeNamed(mode);
     }

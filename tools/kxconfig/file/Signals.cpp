@@ -8,21 +8,21 @@
 namespace
 {
 
-const int g_signals[] = {SIGINT, SIGTERM, SIGHUP, SIGQUIT, SIGXCPU, SIGXFSZ};
-const int g_count = sizeof g_signals / sizeof *g_signals;
+const int kSignals[] = {SIGINT, SIGTERM, SIGHUP, SIGQUIT, SIGXCPU, SIGXFSZ};
+const int kSignalCount = sizeof kSignals / sizeof *kSignals;
 
 // A signal handler reads them: set before it is installed, and left alone while it is.
 int g_folder;
 char g_name[256];
-struct sigaction g_before[g_count];
+struct sigaction g_before[kSignalCount];
 
 extern "C" void RemoveAndPassOn(int signal)
 {
     const int error = errno;
     unlinkat(g_folder, g_name, 0);
-    for (int i = 0; i != g_count; ++i)
+    for (int i = 0; i != kSignalCount; ++i)
     {
-        if (g_signals[i] == signal)
+        if (kSignals[i] == signal)
         {
             sigaction(signal, &g_before[i], nullptr);
         }
@@ -37,7 +37,7 @@ SignalDelay::SignalDelay()
 {
     sigset_t delayed;
     sigemptyset(&delayed);
-    for (const int signal : g_signals)
+    for (const int signal : kSignals)
     {
         sigaddset(&delayed, signal);
     }
@@ -55,20 +55,20 @@ RemovalOnSignal::RemovalOnSignal(int folder, const std::string& name)
     g_name[name.copy(g_name, sizeof g_name - 1)] = '\0';
     struct sigaction removal = {};
     removal.sa_handler = RemoveAndPassOn;
-    for (int i = 0; i != g_count; ++i)
+    for (int i = 0; i != kSignalCount; ++i)
     {
-        sigaction(g_signals[i], nullptr, &g_before[i]);
+        sigaction(kSignals[i], nullptr, &g_before[i]);
         if (g_before[i].sa_handler != SIG_IGN)
         {
-            sigaction(g_signals[i], &removal, nullptr);
+            sigaction(kSignals[i], &removal, nullptr);
         }
     }
 }
 
 RemovalOnSignal::~RemovalOnSignal()
 {
-    for (int i = 0; i != g_count; ++i)
+    for (int i = 0; i != kSignalCount; ++i)
     {
-        sigaction(g_signals[i], &g_before[i], nullptr);
+        sigaction(kSignals[i], &g_before[i], nullptr);
     }
 }

@@ -13,13 +13,13 @@ namespace
 using Lines = std::vector<std::string_view>;
 using Numbers = std::vector<size_t>;
 
-const size_t g_context = 3;
+const size_t kContext = 3;
 
 /** More edits than these are not searched for one by one. */
-const std::ptrdiff_t g_mostEdits = 200;
+const std::ptrdiff_t kMostEdits = 200;
 
 /** How often a part without few edits is divided by lines that occur once in it. */
-const int g_mostDivisions = 16;
+const int kMostDivisions = 16;
 
 Lines Split(std::string_view text)
 {
@@ -120,7 +120,7 @@ private:
         const auto width = static_cast<std::ptrdiff_t>(part.beforeEnd - part.beforeBegin);
         const auto height = static_cast<std::ptrdiff_t>(part.afterEnd - part.afterBegin);
         std::vector<std::vector<std::ptrdiff_t>> reached;
-        for (std::ptrdiff_t edits = 0; edits <= g_mostEdits; ++edits)
+        for (std::ptrdiff_t edits = 0; edits <= kMostEdits; ++edits)
         {
             std::vector<std::ptrdiff_t> furthest(static_cast<size_t>(2 * edits + 1), -1);
             for (std::ptrdiff_t diagonal = -edits; diagonal <= edits; diagonal += 2)
@@ -216,7 +216,7 @@ private:
     bool Divide(const Part& part, int divisions)
     {
         const std::vector<Part> common =
-            divisions < g_mostDivisions ? CommonLines(part) : std::vector<Part>();
+            divisions < kMostDivisions ? CommonLines(part) : std::vector<Part>();
         Part between = part;
         for (const Part& line : common)
         {
@@ -324,9 +324,9 @@ using PartIterator = std::vector<Part>::const_iterator;
 void AppendHunk(std::string& diff, const Lines& before, const Lines& after, PartIterator first,
                 PartIterator last)
 {
-    const size_t leading = std::min(g_context, first->beforeBegin);
+    const size_t leading = std::min(kContext, first->beforeBegin);
     const Part& end = *std::prev(last);
-    const size_t trailing = std::min(g_context, before.size() - end.beforeEnd);
+    const size_t trailing = std::min(kContext, before.size() - end.beforeEnd);
     diff += "@@ -" + Range(first->beforeBegin - leading, end.beforeEnd + trailing) + " +" +
             Range(first->afterBegin - leading, end.afterEnd + trailing) + " @@\n";
     size_t line = first->beforeBegin - leading;
@@ -384,7 +384,7 @@ std::string UnifiedDiff(const NamedText& before, const NamedText& after)
     {
         auto last = std::next(first);
         while (last != parts.end() &&
-               last->beforeBegin - std::prev(last)->beforeEnd <= 2 * g_context)
+               last->beforeBegin - std::prev(last)->beforeEnd <= 2 * kContext)
         {
             ++last;
         }
