@@ -9,8 +9,8 @@ LCOV is what llvm-cov export writes. LIST has a reason as a comment, and after i
     file/Input.cpp: ThrowSystemError();
     file/Input.cpp: branch of: while (size < 0 && errno == EINTR);
 
-A place is a file of DIRECTORY and the first 80 characters of a line, so that it stays the same when lines move. Fails if a place is missing from
-the list, or is listed and covered.
+A place is a file of DIRECTORY and the first 80 characters of a line, so that it stays the same when lines move.
+Fails if a place is missing from the list, or is listed and covered.
 """
 import os
 import sys
