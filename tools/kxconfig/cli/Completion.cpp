@@ -1,5 +1,6 @@
 #include "cli/Completion.h"
 
+#include "cli/LogMaskChoice.h"
 #include "commands/Check.h"
 #include "file/Engine.h"
 #include "file/KeyTree.h"
@@ -21,6 +22,9 @@ namespace
 
 /** More keys than a person reads, or a shell quotes in an instant. */
 const size_t kMostKeys = 500;
+
+/** More bytes of keys would take a shell too long to quote. */
+const size_t kMostBytes = 50000;
 
 /** Then no more keys are listed; a load that takes longer ends the process soon after. */
 const suseconds_t kMostMicroseconds = 700000;
@@ -93,20 +97,35 @@ size_t CommonLength(const std::string& one, const std::string& other)
     return static_cast<size_t>(std::mismatch(one.begin(), end, other.begin()).first - one.begin());
 }
 
+/** @return how many of @p keys are offered: two of them in any case. */
+size_t NumberOffered(const std::vector<std::string>& keys)
+{
+    size_t bytes = 0;
+    const auto end = std::find_if(keys.begin(), keys.end(),
+                                  [&](const std::string& key)
+                                  {
+                                      bytes += key.size();
+                                      return bytes > kMostBytes;
+                                  });
+    return std::clamp<size_t>(static_cast<size_t>(end - keys.begin()), 2, kMostKeys);
+}
+
 /** Leaves the first of the keys, and the one that is least like them: a shell completes what all
  * words that it is offered have in common. */
 void Shorten(std::vector<std::string>& keys)
 {
-    if (keys.size() <= kMostKeys)
+    const size_t count = NumberOffered(keys);
+    if (keys.size() <= count)
     {
         return;
     }
-    std::iter_swap(
-        keys.begin() + kMostKeys - 1,
-        std::min_element(keys.begin() + kMostKeys - 1, keys.end(),
-                         [&](const std::string& one, const std::string& other)
-                         { return CommonLength(keys[0], one) < CommonLength(keys[0], other); }));
-    keys.resize(kMostKeys);
+    const auto last = keys.begin() + static_cast<std::ptrdiff_t>(count) - 1;
+    std::iter_swap(last, std::min_element(last, keys.end(),
+                                          [&](const std::string& one, const std::string& other) {
+                                              return CommonLength(keys[0], one) <
+                                                     CommonLength(keys[0], other);
+                                          }));
+    keys.resize(count);
 }
 
 /** @return the file that a user names so: no shell replaces "~" in a word that it completes. */
@@ -143,6 +162,7 @@ std::vector<std::string> KeysOf(const std::string& file, const std::string& star
         return {};
     }
     const TimeLimit limit;
+    const LogMaskChoice noRecords("none");
     const EngineSettings engine;
     const KeyTree document = LoadKeyTree(file);
     std::vector<std::string> keys = KeysIn(document.Root(), start);
