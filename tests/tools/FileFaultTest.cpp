@@ -142,7 +142,7 @@ TEST_P(SaveFault, AFileThatCannotBeRenamedVanishes)
 TEST_P(SaveFault, ReportsThatTheFolderWasNotSynced)
 {
     const FailingCall broken("fsync", EIO, 2);
-    EXPECT_EQ(m_file + " is saved, but might not survive a loss of power: Input/output error",
+    EXPECT_EQ(m_file + " is saved, but may not survive a power failure: Input/output error",
               Save(m_file));
     EXPECT_EQ("new", ReadFile(m_file));
 }

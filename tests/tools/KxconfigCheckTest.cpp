@@ -148,7 +148,8 @@ TEST_F(KxconfigCheck, ChecksTheKeysThatItIsGiven)
     ExpectWarningsAndNotes(
         {"3: /cfg/a[1] would be accepted for \"a@i=2\" if /cfg/z (line 5), which has "
          "another name, preceded it directly",
-         "4: an update of \"cfg.a@i=2\" leaves, of what a lookup finds, 1 element: /cfg/a[2] (line "
+         "4: an update of \"cfg.a@i=2\" does not change 1 element that a lookup finds: /cfg/a[2] "
+         "(line "
          "4)"},
         {"cfg.a@i=2"});
 }
@@ -242,19 +243,19 @@ TEST_F(KxconfigCheck, PrintsHowManyElementsALookupAndAnUpdateReach)
           "<name>box</name></cfg>");
     expect("cfg.name", "lookup 1, update 1", {});
     expect("cfg.net@i=1.ip", "lookup 1, update 2",
-           {"4: an update of \"cfg.net@i=1.ip\" changes, beyond what a lookup finds, 1 element: "
-            "/cfg/net[2]/ip (line 4)"});
+           {"4: an update of \"cfg.net@i=1.ip\" also changes 1 element that a lookup does not "
+            "find: /cfg/net[2]/ip (line 4)"});
     expect("cfg.ip", "lookup 0, update 2",
            {"2: \"cfg.ip\" has no value: it leads as far as /cfg; kxconfig explain shows the "
             "reason",
-            "3: an update of \"cfg.ip\" changes, beyond what a lookup finds, 2 elements, the first "
-            "of them /cfg/net[1]/ip (line 3)"});
+            "3: an update of \"cfg.ip\" also changes 2 elements that a lookup does not find, the "
+            "first of them /cfg/net[1]/ip (line 3)"});
     expect("other.name", "lookup 0, update 0",
            {"2: \"other.name\" has no value: it starts with \"other\", but the root element is "
             "\"cfg\""});
     Write("<cfg>\n<port n=\"1\">80</port>\n<port n=\"2\">53</port></cfg>");
     expect("cfg.port@n=2", "lookup 1, update 0",
-           {"4: an update of \"cfg.port@n=2\" leaves, of what a lookup finds, 1 element: "
+           {"4: an update of \"cfg.port@n=2\" does not change 1 element that a lookup finds: "
             "/cfg/port[2] (line 4)"});
     expect("cfg.port", "lookup 2, update 2",
            {"4: \"cfg.port\" matches 2 elements, the first of them /cfg/port[1] (line 3)"});
@@ -266,12 +267,13 @@ TEST_F(KxconfigCheck, ReportsTheReachOfAKeyInJson)
     const nlohmann::json answer = nlohmann::json::parse(Check({"--json"}, {"cfg.net@i=1.ip"}).out);
     EXPECT_EQ(nlohmann::json({{"key", "cfg.net@i=1.ip"}, {"lookup", 1}, {"update", 2}}),
               answer.at("results").at(0));
-    EXPECT_EQ(nlohmann::json({{"line", 4},
-                              {"kind", "wider update"},
-                              {"severity", "warning"},
-                              {"text", "an update of \"cfg.net@i=1.ip\" changes, beyond what a "
-                                       "lookup finds, 1 element: /cfg/net[2]/ip (line 4)"}}),
-              answer.at("results").at(1));
+    EXPECT_EQ(
+        nlohmann::json({{"line", 4},
+                        {"kind", "wider update"},
+                        {"severity", "warning"},
+                        {"text", "an update of \"cfg.net@i=1.ip\" also changes 1 "
+                                 "element that a lookup does not find: /cfg/net[2]/ip (line 4)"}}),
+        answer.at("results").at(1));
     EXPECT_EQ(2U, answer.at("results").size());
 }
 

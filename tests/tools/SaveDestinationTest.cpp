@@ -110,7 +110,7 @@ TEST_F(DestinationTest, SavesWithoutALockWhereThereIsNone)
 {
     const NoLocks none(ENOLCK);
     Destination destination(m_file, Role::LoadedFile, seconds(0));
-    EXPECT_EQ(m_file + " is not locked, its file system has no locks: No locks available",
+    EXPECT_EQ(m_file + " is not locked: its file system does not support locks: No locks available",
               destination.LockWarning());
     destination.Save("new", {});
     EXPECT_EQ("new", ReadFile(m_file));

@@ -211,18 +211,20 @@ Nodes Without(const Nodes& others, const Nodes& elements)
 void CheckUpdate(const Nodes& updated, const Nodes& found, const std::string& key,
                  Findings& findings)
 {
-    const auto add = [&](const Nodes& elements, Kind kind, const std::string& what)
+    const auto add =
+        [&](const Nodes& elements, Kind kind, const std::string& what, const std::string& which)
     {
         if (!elements.empty())
         {
             findings.Add(elements[0], kind,
-                         "an update of " + Quoted(key) + what + Counted(elements.size()) +
+                         "an update of " + Quoted(key) + what + Counted(elements.size()) + which +
                              (elements.size() == 1 ? ": " : ", the first of them ") +
                              findings.Place(elements[0]));
         }
     };
-    add(Without(found, updated), Kind::WiderUpdate, " changes, beyond what a lookup finds, ");
-    add(Without(updated, found), Kind::NarrowerUpdate, " leaves, of what a lookup finds, ");
+    add(Without(found, updated), Kind::WiderUpdate, " also changes ",
+        " that a lookup does not find");
+    add(Without(updated, found), Kind::NarrowerUpdate, " does not change ", " that a lookup finds");
 }
 
 /** @return the elements that a lookup of @p key finds. */

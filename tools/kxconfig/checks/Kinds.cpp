@@ -24,7 +24,7 @@ const KindMeaning kKinds[] = {
     {Kind::UnreachableElement, Severity::Warning, "unreachable element",
      "a name that no key can contain"},
     {Kind::RepeatedAttribute, Severity::Warning, "repeated attribute",
-     "elements with the same attributes among others that attributes distinguish"},
+     "elements with identical attributes, whose siblings differ by attributes"},
     {Kind::SeveralValues, Severity::Note, "several values",
      "a key of the file finds more than one element, as in a list"},
     {Kind::ConditionDependsOnOrder, Severity::Note, "condition depends on order",

@@ -12,6 +12,9 @@ namespace
 {
 
 const int kLongestWait = 1000000; // seconds
+const char* const kKeyHelp = "a key path: root.element@attribute=value.element";
+
+// The validators return "" for a valid value, as the interface of CLI::Validator requires.
 
 /** To the engine "-" is standard input or output; a user who writes it here means something else.
  */
@@ -20,8 +23,7 @@ std::string StandardStreamError(const std::string& file)
     return file == "-" ? "\"-\" is not a file name" : std::string();
 }
 
-/** An empty name would stand for the file that was loaded, and overwrite it. */
-std::string NewFileError(const std::string& file)
+std::string EmptyNameError(const std::string& file)
 {
     return file.empty() ? "\"\" is not a file name" : "";
 }
@@ -30,11 +32,6 @@ std::string ColorError(const std::string& when)
 {
     const bool isKnown = when == "auto" || when == "always" || when == "never";
     return isKnown ? "" : Quoted(when) + " is not auto, always or never";
-}
-
-std::string ValueFileError(const std::string& file)
-{
-    return file.empty() ? "\"\" is not a file name" : "";
 }
 
 std::string SuffixError(const std::string& suffix)
@@ -85,7 +82,7 @@ CLI::App* AddReader(CLI::App& app, const char* name, const char* description,
 
 void AddKey(CLI::App& command, std::string& key)
 {
-    command.add_option("KEY", key, "a key path: root.element@attribute=value.element")->required();
+    command.add_option("KEY", key, kKeyHelp)->required();
 }
 
 void AddGet(CLI::App& app, Request& request)
@@ -93,8 +90,7 @@ void AddGet(CLI::App& app, Request& request)
     GetArguments& arguments = request.get;
     CLI::App* const get =
         AddReader(app, "get", "print the value or values under key paths", Get, arguments, request);
-    get->add_option("KEY", arguments.keys, "a key path: root.element@attribute=value.element")
-        ->required();
+    get->add_option("KEY", arguments.keys, kKeyHelp)->required();
     get->add_option("--default", arguments.defaultValue, "the value of a key that has none")
         ->type_name("TEXT");
     get->add_flag("-z,--null", arguments.endWithNul, "end each value with NUL, not a line end");
@@ -109,7 +105,7 @@ void AddSaving(CLI::App& command, SaveArguments& arguments)
             "--output", arguments.output,
             "save to this file instead; -: to standard output, and report to standard error")
         ->type_name("FILE")
-        ->check(CLI::Validator(NewFileError, ""));
+        ->check(CLI::Validator(EmptyNameError, "")); // "" would overwrite the file that was loaded
     command
         .add_option("--wait", arguments.waitSeconds,
                     "wait this long while another process has the file locked; default: 10")
@@ -150,15 +146,16 @@ void AddSet(CLI::App& app, Request& request)
     set->add_option("--value-from", arguments.valueFile,
                     "read VALUE from this file, without the last line end; -: standard input")
         ->type_name("FILE")
-        ->check(CLI::Validator(ValueFileError, ""));
-    CLI::Option* const create =
-        set->add_flag("--create", arguments.create,
-                      "make the elements of a key without conditions that are not there");
+        ->check(CLI::Validator(EmptyNameError, ""));
+    CLI::Option* const create = set->add_flag(
+        "--create", arguments.create, "create missing elements; KEY must have no condition");
     CLI::Option* const node = set->add_flag(
         "--node", arguments.byNode,
         "KEY is an XPath expression: replace the text of the one element or attribute it selects");
     node->excludes(create); // by its name it would be looked up without regard to a lack of memory
-    set->add_flag("--all", arguments.all, "with --node: of all that it selects")->needs(node);
+    set->add_flag("--all", arguments.all,
+                  "with --node: change every node that the expression selects")
+        ->needs(node);
     AddSaving(*set, arguments.saving);
 }
 
@@ -204,7 +201,7 @@ void AddExplain(CLI::App& app, Request& request)
         "--set", request.explain.isUpdate, "explain what an update would reach; changes nothing");
     explain
         ->add_option("VALUE", request.explain.value,
-                     "with --set: ignored, since an update reaches the same with any")
+                     "with --set: ignored; every value reaches the same elements")
         ->needs(update);
 }
 

@@ -58,15 +58,16 @@ const Entry kEnvironment[] = {
 
 const Entry kFiles[] = {
     {".kxconfig-*.tmp",
-     "The new content of a file in the same directory, until it replaces the file. One that a "
-     "killed process left is removed by the next change in the directory."},
+     "The new content of a file in the same directory, until it replaces the file. "
+     "The next command that changes a file in the directory removes files left by a killed "
+     "process."},
 };
 
 const char* const kKeyPaths =
     "A key path names the root element and then one element for each level, joined by dots. A "
     "condition after @ selects elements by their attributes: terms name=value are joined by | (or) "
-    "and & (and) and combined from left to right. An element of another name on a level suspends "
-    "the condition for the next element that matches by name. An element has a value only if text "
+    "and & (and) and combined from left to right. An element of another name suspends the "
+    "condition for the next element of the right name. An element has a value only if text "
     "is its only child.";
 
 /** @return @p text escaped for man. */

@@ -14,7 +14,7 @@ struct ExplainArguments
     std::istream* input = nullptr; ///< what the file "-" stands for
     std::string key;
     bool isUpdate = false; ///< explain an update, not a lookup
-    std::string value;     ///< of the update: it reaches the same with any
+    std::string value;     ///< of the update: ignored; every value reaches the same elements
 };
 
 /**

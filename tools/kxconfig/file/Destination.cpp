@@ -99,17 +99,15 @@ Failure Destination::CannotSave(const std::string& reason) const
 std::string Destination::LockWarning() const
 {
     const bool isMissing = m_lock && m_lock->GetState() == FileLock::State::Unsupported;
-    return isMissing
-               ? m_path +
-                     " is not locked, its file system has no locks: " + m_lock->Error().message()
-               : "";
+    return isMissing ? m_path + " is not locked: its file system does not support locks: " +
+                           m_lock->Error().message()
+                     : "";
 }
 
 std::string Destination::SyncWarning() const
 {
     return m_syncError
-               ? m_path +
-                     " is saved, but might not survive a loss of power: " + m_syncError.message()
+               ? m_path + " is saved, but may not survive a power failure: " + m_syncError.message()
                : "";
 }
 

@@ -60,7 +60,7 @@ public:
     /** Saves @p bytes. @throws Failure if they are not saved, and all is as it was. */
     void Save(const std::string& bytes, const Options& options);
 
-    /** @return why the saved file might not survive a loss of power, as a message; or nothing. */
+    /** @return why the saved file may not survive a power failure, as a message; or nothing. */
     std::string SyncWarning() const;
 
 private:

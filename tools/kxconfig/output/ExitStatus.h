@@ -27,7 +27,8 @@ const ExitStatusMeaning kExitStatuses[] = {
     {ExitStatus::BadFile, "the file cannot be read, or is not well-formed XML"},
     {ExitStatus::NotSaved,
      "saving or printing failed, or memory ran out; a file that could not be saved is unchanged"},
-    {ExitStatus::NotReported, "saved, but not reported, or not certain to survive a loss of power"},
+    {ExitStatus::NotReported,
+     "saved, but the result could not be printed, or may not survive a power failure"},
 };
 
 #endif
