@@ -21,8 +21,7 @@
 /// - An element has a value only if its one and only child is a text node.
 /// - Every matching element of a level is visited, in document order, so that a key can find
 ///   several values. An element in the middle of a path contributes its own value as well.
-/// - An element of another name suspends the condition of its level for the next element of the
-///   right name, which is then accepted regardless of its attributes.
+/// - An element of another name suspends the condition for the next element of the right name.
 ///
 /// docs/handbook/key-paths.md explains these rules with examples. The log records of each operation
 /// are listed in docs/handbook/status-codes-and-messages.md.
@@ -90,8 +89,9 @@ public:
 
     /// Returns the document (an xmlDocPtr), or null if none is held.
     ///
-    /// The reader keeps ownership. The pointer is valid until the reader is destroyed; after
-    /// ParseFile() the document belongs to the caller. CXMLWriter::SetDataPtr() can adopt it.
+    /// The reader keeps ownership. The pointer is valid until the reader is destroyed. A later
+    /// ParseFile() passes ownership of the document to the caller. CXMLWriter::SetDataPtr() can
+    /// adopt the document.
     virtual void* GetDataPtr();
 
     /// The recursion of the one-argument GetValue(): looks up key, the rest of a key path, among

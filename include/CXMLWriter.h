@@ -64,8 +64,8 @@ public:
     /// - 0, with nothing changed, if key starts with another name than the root's,
     /// - 7 if there is no document, or key is empty or has no ".",
     /// - 22 if the document has no root element,
-    /// - 22 also if key ends in "." and the level that the walk entered last is the one after that
-    ///   ".", although elements were changed,
+    /// - 22 also if key ends in "." and the walk's last descent was past that ".", even if elements
+    ///   were changed,
     /// - -2 if nothing was changed.
     virtual int SetValue(const std::string& key, std::string value);
 

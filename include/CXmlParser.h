@@ -4,8 +4,8 @@
 /// @file CXmlParser.h
 /// A whole document: load, create, query, change and save it.
 ///
-/// docs/handbook/document-toolkit.md lists what clients do not expect. The log records of each
-/// operation are listed in docs/handbook/status-codes-and-messages.md.
+/// docs/handbook/document-toolkit.md lists unexpected behavior. The log records of each operation
+/// are listed in docs/handbook/status-codes-and-messages.md.
 
 #include "CXmlNode.h"
 
