@@ -233,13 +233,10 @@ bool HasLocation(const xmlNode* node)
 
 Locations::~Locations()
 {
+    // The positions stay: they are not read before their parent's children are counted again.
     for (const xmlNode* const parent : m_counted)
     {
         SetMark(parent, MarkOf(parent) & ~kIsCounted);
-        for (const xmlNode* node = parent->children; node != nullptr; node = node->next)
-        {
-            SetPosition(node, 0);
-        }
     }
 }
 

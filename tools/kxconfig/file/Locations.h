@@ -19,7 +19,7 @@ enum class Spelling
  * They are what xmlGetNodePath() gives, which counts the siblings of a node anew for each path; but
  * no two nodes have the same one, where a prefix is declared for only some of its bearers. Here the
  * children of a node are counted once. Their positions are kept in the field that the engine's
- * records have for applications (_private), until the object is destroyed.
+ * records have for applications (_private), and count until the object is destroyed.
  */
 class Locations
 {
