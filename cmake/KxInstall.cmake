@@ -36,7 +36,7 @@ install(FILES
     ${PROJECT_BINARY_DIR}/${PROJECT_NAME}ConfigVersion.cmake
     DESTINATION ${package_dir} COMPONENT development)
 
-# The file tells its prefix from its own place, so that it holds in any prefix and in a staged one.
+# The file derives the prefix from its own location, so that it is valid in any prefix and in a staged one.
 file(RELATIVE_PATH pc_to_prefix ${CMAKE_INSTALL_FULL_LIBDIR}/pkgconfig ${CMAKE_INSTALL_PREFIX})
 string(REGEX REPLACE "/$" "" pc_to_prefix "${pc_to_prefix}")
 file(RELATIVE_PATH pc_libdir ${CMAKE_INSTALL_PREFIX} ${CMAKE_INSTALL_FULL_LIBDIR})

@@ -15,8 +15,8 @@ namespace kxfuzz
 /**
  * A few handles, and which of them may still be used.
  *
- * The engine tells of each node that it frees; the handles on it become null handles. Declarations
- * are freed without a word, together with their DTD.
+ * The engine reports each node that it frees; the handles on it become null handles. Declarations
+ * are freed without a report, together with their DTD.
  */
 class Handles
 {

@@ -268,7 +268,7 @@ def partial_verdict(kept, figures, target):
 
 
 def note_text(results, note):
-    """What somebody else would reach in the place of the library."""
+    """The same figure for another implementation, for comparison with that of the library."""
     if note is None:
         return ""
     ratio = results.ratio(note.workload, note.implementation, note.reference)

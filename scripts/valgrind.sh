@@ -44,8 +44,8 @@ await_one() {
 running=0
 failed=0
 export KX_EVALUATIONS=4000
-for room in config dom faults model threads trust platform diag; do # the slow ones first
-    start 0 $build/tests/$room/${room}_tests
+for module in config dom faults model threads trust platform diag; do # the slow ones first
+    start 0 $build/tests/$module/${module}_tests
 done
 for target in keypath document loader; do
     start 0 $build/fuzz/replay_$target fuzz/corpus/$target

@@ -1,6 +1,6 @@
 # Run by cpack on the installed files before it packs them: adds what Debian's policy asks of a package and a plain
 # installation does without, a changelog in Debian's format and compressed man pages. The changelog's one entry is
-# generated, so that its address is one that nobody has.
+# generated, with an address that does not exist.
 set(version "${CPACK_PACKAGE_VERSION}")
 file(TIMESTAMP ${CPACK_KX_CHANGELOG} date "%a, %d %b %Y %H:%M:%S +0000" UTC)
 

@@ -1,8 +1,8 @@
 # QNX Neutrino 6.5.0 on ARMv7-A, little endian, by the SDK's own compiler: GCC 4.4.2 behind qcc.
 #
-# The environment says where the SDK is, as its own setup script does: QNX_HOST (the tools) and QNX_TARGET (headers
+# The environment variables of the SDK's setup script locate it: QNX_HOST (the tools) and QNX_TARGET (headers
 # and libraries). KX_QNX_CXX_RUNTIME selects the C++ run-time library: cpp (Dinkum, the SDK's default) or gpp (GNU).
-# All code of a process must use the same one. docs/development/building-for-qnx.md tells the rest.
+# All code of a process must use the same one. See docs/development/building-for-qnx.md.
 set(CMAKE_SYSTEM_NAME QNX)
 set(CMAKE_SYSTEM_VERSION 6.5.0)
 set(CMAKE_SYSTEM_PROCESSOR armv7le)

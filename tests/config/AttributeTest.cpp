@@ -222,7 +222,7 @@ TEST_F(AttributeTest, DefaultOfTheExternalSubset)
                             XML_ATTRIBUTE_NONE, Text("default"), nullptr);
         m_document->extSubset = external;
         external->doc = m_document;
-        ExpectAsTheEngine("a"); // without an internal subset, it is the engine's affair
+        ExpectAsTheEngine("a"); // without an internal subset, the engine decides
         if (hasInternal)
         {
             ExpectValue("default");

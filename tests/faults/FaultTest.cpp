@@ -180,8 +180,8 @@ Answer Clear(Objects& objects)
     return Of(objects.parser.GetRootNode());
 }
 
-// Text that the engine has no memory for is missing without a word, and an empty element is not
-// filled by a later update.
+// Text that the engine has no memory for is dropped without an error, and a later update does not
+// fill an empty element.
 const Answer kEmptied = {-2};
 
 // An exception that leaves FindAllNodes leaves the engine's result behind: object, set and table.
@@ -324,7 +324,7 @@ const Operation kToolkit[] = {
     {"CXmlAttr", [](Objects&) { return Of(CXmlAttr(kName, kValue).m_strValue); }},
 };
 
-// Short of memory the engine itself falls over them; the requests of operator new are tried.
+// The engine can crash when it runs out of memory in a query, so only operator new fails here.
 const Operation kQueries[] = {
     {"GetNodeSet", Query},
     {"FindNode", [](Objects& o) { return Of(o.parser.FindNode(kXPath, o.root)); }},

@@ -1,5 +1,5 @@
-// Saving fails after the n-th byte, for each n: the answer says so, the document is as it was, and
-// saving succeeds as soon as there is room.
+// Saving fails after the n-th byte, for each n: the status reports it, the document is unchanged,
+// and saving succeeds as soon as there is space.
 
 #include "CXMLWriter.h"
 #include "CXmlParser.h"
