@@ -2,7 +2,9 @@
 # Installs what is missing, builds and tests.
 # usage: test.sh [STAGE...]
 #
-#   fast     all tests; an outside project builds against the installed library
+#   fast     all tests but the longest; an outside project builds against the installed library
+#   long     the longest tests: a million random lookups and updates, all language versions, the build for QNX, a kill
+#            at every system call of a save
 #   style    layout and common mistakes: .editorconfig, clang-format, clang-tidy, shellcheck, pyflakes
 #   sanitize all tests under AddressSanitizer and UndefinedBehaviorSanitizer
 #   package  the Debian packages: installs them into a scratch root, uses and removes them
@@ -15,16 +17,17 @@
 #   proof    full coverage of lines and branches; Valgrind; ThreadSanitizer; a short run of each fuzz target
 #   speed    the instructions of key operations, compared with the accepted counts
 #   docs     the reference, without a warning of Doxygen; the recording of a new user's first steps
-#   host     fast and package; the default
+#   host     fast and package; the default: about three minutes
 #   all      all stages, engines and target only if KX_ENGINE_ARCHIVES is set; CI runs this
 . "$(dirname "$0")/common.sh"
 
-# run_preset NAME — configures, builds and tests with the preset; prints details only of failures.
+# run_preset NAME [OPTION...] — configures, builds and tests with the preset, with options of ctest. Prints details of
+# failures only.
 run_preset() {
     local log=build/$1.log
     build_preset "$1"
-    echo "== $1"
-    if ! ctest --preset "$1" >"$log" 2>&1; then
+    echo "== $*"
+    if ! ctest --preset "$@" >"$log" 2>&1; then
         grep -vE ' Passed |^ +Start ' "$log"
         exit 1
     fi
@@ -33,7 +36,12 @@ run_preset() {
 
 stage_fast() {
     need "${build_packages[@]}" "${test_packages[@]}"
-    run_preset dev
+    run_preset dev --label-exclude 'full|long'
+}
+
+stage_long() {
+    need "${build_packages[@]}" "${test_packages[@]}"
+    run_preset dev --label-regex 'full|long'
 }
 
 stage_style() {
@@ -114,6 +122,7 @@ stage_host() {
 
 stage_all() {
     stage_host
+    stage_long
     stage_style
     stage_sanitize
     stage_docs
@@ -132,8 +141,8 @@ stage_all() {
 for stage in "$@"; do
     declare -F "stage_$stage" >/dev/null ||
         {
-            echo "$0: no stage \"$stage\"; there are fast, style, sanitize, package, abi98, engine, engines, arm," \
-                "target, proof, speed, docs, host, all" >&2
+            echo "$0: no stage \"$stage\"; there are fast, long, style, sanitize, package, abi98, engine, engines," \
+                "arm, target, proof, speed, docs, host, all" >&2
             exit 2
         }
 done
