@@ -19,13 +19,14 @@ if ! LLVM_PROFILE_FILE=$PWD/$build/raw/%4m.profraw ctest --preset coverage >$log
 fi
 llvm-profdata merge -o $build/all.profdata $build/raw/*.profraw
 
+# llvm-cov warns of functions that differ between programs, as headers do by what they are compiled with.
 # The tests first: they step through the walks like kxconfig, and have parts of the headers that the library leaves out.
 library=$build/src/libKX_XMLConfigParser.so
 objects=("$build/tests/config/config_tests" -object "$library")
 llvm-cov show "${objects[@]}" -instr-profile $build/all.profdata -format=html -output-dir=$build/report \
-    -show-branches=count -ignore-filename-regex=/tests/ src include
+    -show-branches=count -ignore-filename-regex=/tests/ src include 2>/dev/null
 llvm-cov report "${objects[@]}" -instr-profile $build/all.profdata \
-    -show-branch-summary -show-region-summary=0 -ignore-filename-regex=/tests/ src include >$build/report.txt
+    -show-branch-summary -show-region-summary=0 -ignore-filename-regex=/tests/ src include >$build/report.txt 2>/dev/null
 if ! awk '$1 == "TOTAL" {
         printf "coverage: %d of %d lines, %d of %d branches\n", $5 - $6, $5, $8 - $9, $8
         complete = $6 == 0 && $9 == 0
@@ -57,7 +58,6 @@ client=("$build/tests/tools/tools_tests" -object "$build/tests/tools/tool_files_
     -object "$build/tests/tools/tool_faults_tests" -object "$build/tools/kxconfig")
 llvm-cov show "${client[@]}" -instr-profile $build/all.profdata -format=html -output-dir=$build/report/client \
     -show-branches=count tools 2>/dev/null
-# The headers of other programs differ by what they are compiled with, which llvm-cov warns of.
 llvm-cov export "${client[@]}" -instr-profile $build/all.profdata -format=lcov >$build/client.lcov 2>/dev/null
 if ! scripts/compare_uncovered.py $build/client.lcov tests/tools/uncovered.txt tools/kxconfig; then
     echo "see $build/report/client/index.html" >&2
