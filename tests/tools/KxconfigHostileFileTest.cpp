@@ -240,7 +240,8 @@ TEST_F(KxconfigHostileFile, ALongNameIsNotCopiedForEachAttribute)
 
 TEST_F(KxconfigHostileFile, TheTextOfAnEntityIsKeptOnceForAllAttributes)
 {
-    const std::size_t count = 1000;
+    // A million bytes is what engines from 2.11 on let the entities of a short document amount to.
+    const std::size_t count = 90;
     const std::size_t length = 10000;
     std::string xml = "<!DOCTYPE c [<!ENTITY e \"" + std::string(length, 'v') + "\">]><c>";
     for (std::size_t i = 0; i != count; ++i)
