@@ -1,6 +1,7 @@
 #!/usr/bin/env bash
 # Checks layout and common mistakes: .editorconfig, clang-format, clang-tidy, shellcheck and pyflakes, each without a
-# finding. clang-tidy reads the library, the platform's stand-in and the client, a dozen sources at a time.
+# finding. clang-tidy reads the library, the platform's stand-in and the client, a dozen sources at a time, as they are
+# compiled; that each source of the client includes what it needs is checked too.
 . "$(dirname "$0")/common.sh"
 
 need "${build_packages[@]}" "${test_packages[@]}" "${style_packages[@]}"
@@ -40,4 +41,7 @@ quietly build/style/configure.log \
     cmake --preset clang -B build/style -D CMAKE_DISABLE_PRECOMPILE_HEADERS=ON \
     -D CMAKE_UNITY_BUILD=ON -D CMAKE_UNITY_BUILD_BATCH_SIZE=12
 check clang-tidy run-clang-tidy -quiet -p build/style "^$PWD/build/style/(src|platform|tools)/"
+quietly build/style/alone.log cmake --preset dev -B build/style/alone -D KX_COMPILE_IN_BATCHES=OFF
+check includes tests/portability/compile_with_headers.py build/style/alone \
+    "$(pkg-config --variable=includedir libxml-2.0)/libxml2" tools
 exit $failed

@@ -5,13 +5,13 @@
 #   fast     all tests but the longest; an outside project builds against the installed library
 #   long     the longest tests: a million random lookups and updates, all language versions, the build for QNX, a kill
 #            at every system call of a save
-#   style    layout and common mistakes: .editorconfig, clang-format, clang-tidy, shellcheck, pyflakes
+#   style    layout and common mistakes: .editorconfig, clang-format, clang-tidy, missing includes, shellcheck, pyflakes
 #   sanitize all tests under AddressSanitizer and UndefinedBehaviorSanitizer
 #   package  the Debian packages: installs them into a scratch root, uses and removes them
 #   abi98    all tests with the target's kind of standard library (shared strings, a linear list::size)
 #   engine   all tests with the newest libxml2 that Debian has as a source package
 #   engines  the suites with each libxml2-VERSION.tar.xz in the folder KX_ENGINE_ARCHIVES
-#   arm      all tests for ARMv7-A, in both calling conventions, under qemu-arm; the library's size
+#   arm      all tests for ARMv7-A under qemu-arm, those of the library in both calling conventions; the library's size
 #   target   the library's suites as on the target: ARMv7-A, soft-float convention, shared strings, libxml2 2.7.8 from
 #            the folder KX_ENGINE_ARCHIVES
 #   proof    full coverage of lines and branches; Valgrind; ThreadSanitizer; a short run of each fuzz target
