@@ -26,7 +26,8 @@ objects=("$build/tests/config/config_tests" -object "$library")
 llvm-cov show "${objects[@]}" -instr-profile $build/all.profdata -format=html -output-dir=$build/report \
     -show-branches=count -ignore-filename-regex=/tests/ src include 2>/dev/null
 llvm-cov report "${objects[@]}" -instr-profile $build/all.profdata \
-    -show-branch-summary -show-region-summary=0 -ignore-filename-regex=/tests/ src include >$build/report.txt 2>/dev/null
+    -show-branch-summary -show-region-summary=0 -ignore-filename-regex=/tests/ src include \
+    >$build/report.txt 2>/dev/null
 if ! awk '$1 == "TOTAL" {
         printf "coverage: %d of %d lines, %d of %d branches\n", $5 - $6, $5, $8 - $9, $8
         complete = $6 == 0 && $9 == 0
