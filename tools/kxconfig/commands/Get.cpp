@@ -78,7 +78,7 @@ private:
         const Trail trail = RecordLookup(DocumentOf(m_reader), key);
         for (const TrailStep* const step : trail.StepsWithText())
         {
-            Add(key, *step->text, step->element);
+            Add(key, step->text, step->element);
         }
     }
 

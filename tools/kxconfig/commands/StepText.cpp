@@ -53,7 +53,7 @@ std::string DescribeTerms(const TrailStep& step)
 {
     std::string text;
     bool joinedByOr = false;
-    for (const TestedTerm& term : step.terms)
+    for (const TestedTerm& term : TermsOf(step))
     {
         text += text.empty() ? "" : joinedByOr ? "; or " : "; and ";
         text += DescribeTerm(step.element, term);
@@ -65,7 +65,7 @@ std::string DescribeTerms(const TrailStep& step)
 Json TermsInJson(const TrailStep& step)
 {
     Json terms = Json::array();
-    for (const TestedTerm& term : step.terms)
+    for (const TestedTerm& term : TermsOf(step))
     {
         const std::optional<std::string> actual = ActualValue(step.element, term);
         terms.push_back({{"attribute", Text(term.attribute)},

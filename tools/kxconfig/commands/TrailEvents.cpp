@@ -93,7 +93,7 @@ Json StepEvent::InJson() const
                    {"sought", SegmentInJson(step)},
                    {"verdict", VerdictInJson(step)},
                    {"terms", TermsInJson(step)},
-                   {"value", step.text ? Json(*step.text) : Json()}};
+                   {"value", step.text ? Json(step.text) : Json()}};
     if (step.verdict == Verdict::Accepted && !step.text)
     {
         result["reason"] = WhyNoValue(step.element);
@@ -136,7 +136,8 @@ std::string StepEvent::DescribeAcceptance() const
     }
     const std::string segment =
         narration.walk == Walk::Update ? " as " + DescribeSegment(step) : "";
-    return segment + (step.terms.empty() ? "" : ": " + DescribeTerms(step));
+    const std::string terms = DescribeTerms(step);
+    return segment + (terms.empty() ? "" : ": " + terms);
 }
 
 std::string StepEvent::DescribeSuspension() const
@@ -152,7 +153,7 @@ std::string StepEvent::DescribeValue() const
     const bool isUpdate = narration.walk == Walk::Update;
     if (step.text)
     {
-        const std::string text = narration.report.Paint(Color::Good, Quoted(*step.text));
+        const std::string text = narration.report.Paint(Color::Good, Quoted(step.text));
         return isUpdate ? "; its text " + text + " is replaced" : "; value " + text;
     }
     // In the middle of a path a value is not expected.

@@ -183,7 +183,11 @@ public:
     /** @return the position of @p node, which comes after those that were numbered before. */
     size_t Number(const xmlNode* node, const Alike& alike)
     {
-        Group& group = m_groups[alike];
+        if (m_last == m_groups.end() || m_last->first != alike) // most are like the one before
+        {
+            m_last = m_groups.try_emplace(alike).first;
+        }
+        Group& group = m_last->second;
         group.first = group.count == 0 ? node : group.first;
         return ++group.count;
     }
@@ -208,19 +212,23 @@ private:
     };
 
     std::map<Alike, Group> m_groups;
+    std::map<Alike, Group>::iterator m_last = m_groups.end();
 };
 
 void NumberChildren(const xmlNode* parent)
 {
     Numbering named;
+    Numbering others;   // texts between elements, too
     Numbering elements; // "*" stands for every one
     for (const xmlNode* node = parent->children; node != nullptr; node = node->next)
     {
         const bool isElement = node->type == XML_ELEMENT_NODE;
         const size_t place = isElement ? elements.Number(node, {}) : 0;
-        SetPosition(node, IsNameless(node) ? place : named.Number(node, AlikeOf(node)));
+        Numbering& alike = isElement ? named : others;
+        SetPosition(node, IsNameless(node) ? place : alike.Number(node, AlikeOf(node)));
     }
     named.RemoveFromSingleNodes();
+    others.RemoveFromSingleNodes();
     elements.RemoveFromSingleNodes();
 }
 

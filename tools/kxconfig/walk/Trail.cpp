@@ -24,22 +24,6 @@ TrailStep Compared(const xmlNode* element, const kx::Segment& segment, bool isNa
     return step;
 }
 
-/** The terms of the condition, up to the one that decided. */
-std::vector<TestedTerm> TestTerms(const xmlNode* element, const kx::Condition& condition)
-{
-    std::vector<TestedTerm> terms;
-    if (!condition.IsEmpty())
-    {
-        kx::ConditionTest test(condition, element);
-        do
-        {
-            terms.push_back({View(test.GetTerm().name), View(test.GetTerm().value),
-                             test.TermEndsWithOr(), test.TermHolds()});
-        } while (test.Next());
-    }
-    return terms;
-}
-
 void Accept(TrailStep& step)
 {
     step.verdict = Verdict::Accepted;
@@ -53,10 +37,6 @@ TrailStep StepOf(const kx::SiblingScan& scan, const kx::Segment& segment)
 {
     TrailStep step = Compared(scan.Element(), segment, scan.IsNamed());
     step.suspended = scan.IsNamed() && scan.IsSuspended() && !step.condition.empty();
-    if (scan.IsNamed() && !scan.IsSuspended())
-    {
-        step.terms = TestTerms(scan.Element(), segment.condition);
-    }
     if (scan.IsSelected())
     {
         Accept(step);
@@ -67,10 +47,6 @@ TrailStep StepOf(const kx::SiblingScan& scan, const kx::Segment& segment)
 TrailStep StepOf(const kx::UpdateWalk& walk)
 {
     TrailStep step = Compared(walk.Element(), walk.Wanted(), walk.IsNamed());
-    if (walk.IsNamed())
-    {
-        step.terms = TestTerms(walk.Element(), walk.Wanted().condition);
-    }
     if (walk.IsSelected())
     {
         Accept(step);
@@ -171,6 +147,23 @@ void AddStepsWithText(const TrailLevel& level, std::vector<const TrailStep*>& fo
 }
 
 } // namespace
+
+std::vector<TestedTerm> TermsOf(const TrailStep& step)
+{
+    std::vector<TestedTerm> terms;
+    const bool isInForce = step.verdict != Verdict::OtherName && !step.suspended;
+    const kx::Condition condition(kx::TextView(step.condition.data(), step.condition.size()));
+    if (isInForce && !condition.IsEmpty())
+    {
+        kx::ConditionTest test(condition, step.element);
+        do
+        {
+            terms.push_back({View(test.GetTerm().name), View(test.GetTerm().value),
+                             test.TermEndsWithOr(), test.TermHolds()});
+        } while (test.Next());
+    }
+    return terms;
+}
 
 std::vector<const TrailStep*> Trail::StepsWithText() const
 {

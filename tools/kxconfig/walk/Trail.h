@@ -3,8 +3,8 @@
 
 #include <libxml/tree.h>
 
+#include <deque>
 #include <memory>
-#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -36,22 +36,30 @@ struct TrailStep
     std::string_view name;      ///< what its name was compared with
     std::string_view condition; ///< of the segment that it was compared with
     Verdict verdict = Verdict::OtherName;
-    bool suspended = false; ///< accepted by its name alone, regardless of the condition
-    std::vector<TestedTerm> terms;
-    std::optional<std::string> text;   ///< the text that can be read or replaced
+    bool suspended = false;            ///< accepted by its name alone, regardless of the condition
+    const char* text = nullptr;        ///< that can be read or replaced; null if there is none
     bool keyEnds = false;              ///< the key ends in ".": nothing is wanted below
     std::unique_ptr<TrailLevel> below; ///< null if the walk did not go on below
 };
+
+/**
+ * @return the terms of the condition that the step tested, up to the one that decided; none if the
+ *         condition was not in force. They are tested again: few of many steps are described.
+ */
+std::vector<TestedTerm> TermsOf(const TrailStep& step);
 
 /** The children of one element. */
 struct TrailLevel
 {
     const xmlNode* parent;
     bool keyEnds = false;
-    std::vector<TrailStep> steps;
+    std::deque<TrailStep> steps; // many, which are never moved
 };
 
-/** The views in it are of the key that was walked, which must outlive it, as must the document. */
+/**
+ * The views in it are of the key that was walked, the texts are the document's: both must outlive
+ * it.
+ */
 struct Trail
 {
     std::unique_ptr<TrailLevel> top; ///< null if nothing was walked
