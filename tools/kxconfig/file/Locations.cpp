@@ -53,11 +53,19 @@ bool IsNameless(const xmlNode* node)
 }
 
 /** @return what selects the elements or attributes that are named like @p node. */
-std::string NameTest(const xmlNode* node, Spelling spelling)
+void AppendNameTest(std::string& text, const xmlNode* node, Spelling spelling)
 {
-    const std::string name = NameWithPrefix(node);
-    const bool isPlain = spelling == Spelling::Path || name.find(':') == std::string::npos;
-    return isPlain ? name : "*[name()='" + name + "']";
+    if (kx::NamespaceOf(node) != nullptr)
+    {
+        const std::string name = NameWithPrefix(node);
+        text += spelling == Spelling::Path ? name : "*[name()='" + name + "']";
+        return;
+    }
+    const std::string_view name = kx::FromEngine(node->name);
+    const bool isPlain = spelling == Spelling::Path || name.find(':') == std::string_view::npos;
+    text += isPlain ? "" : "*[name()='";
+    text += name;
+    text += isPlain ? "" : "']";
 }
 
 /** Appends a step without its position: nodes of one parent that share it are numbered. */
@@ -66,7 +74,8 @@ void AppendStep(std::string& text, const xmlNode* node, Spelling spelling)
     switch (node->type)
     {
     case XML_ATTRIBUTE_NODE:
-        text += "@" + NameTest(node, spelling);
+        text += '@';
+        AppendNameTest(text, node, spelling);
         break;
     case XML_TEXT_NODE:
     case XML_CDATA_SECTION_NODE:
@@ -79,7 +88,14 @@ void AppendStep(std::string& text, const xmlNode* node, Spelling spelling)
         text += "processing-instruction('" + Text(node->name) + "')";
         break;
     default:
-        text += IsNameless(node) ? "*" : NameTest(node, spelling);
+        if (IsNameless(node))
+        {
+            text += '*';
+        }
+        else
+        {
+            AppendNameTest(text, node, spelling);
+        }
     }
 }
 

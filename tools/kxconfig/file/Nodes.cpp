@@ -73,6 +73,12 @@ std::string LineOf(const xmlNode* node)
 
 std::string ContentOf(const xmlNode* node)
 {
+    // Most elements have one text, of which the engine need not make a copy first.
+    const xmlNode* const only = node->type == XML_ELEMENT_NODE ? kx::OnlyTextChild(node) : nullptr;
+    if (only != nullptr)
+    {
+        return kx::ContentOf(only);
+    }
     const FirstEngineError error;
     xmlChar* const content = xmlNodeGetContent(const_cast<xmlNode*>(node));
     const bool isMissing = content == nullptr && HasContent(node);
