@@ -6,7 +6,7 @@
 . "$(dirname "$0")/common.sh"
 
 targets=(keypath document loader client)
-seconds=${2:-20}
+seconds=${2:-10}
 if [ "${1:-all}" != all ]; then
     targets=("$1")
 fi
